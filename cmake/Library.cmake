@@ -1,0 +1,67 @@
+# SPDX-License-Identifier: Apache-2.0
+# The library itself: the objects, which white-box tests link too, and the shared object.
+find_package(Threads REQUIRED)
+
+add_library(ovrinresize_objects OBJECT
+  src/dispatch/band_schedule.cpp
+  src/dispatch/sleep.cpp
+  src/dispatch/wrappers.cpp
+  src/kernels/quarter_scalar.cpp
+  src/kernels/select.cpp
+  src/layout.cpp
+  src/pool/threadpool.cpp
+  src/quarter/sampler.cpp
+  src/quarter/scan.cpp
+  src/rgba/rgba8888.cpp
+  src/rgba/rgba_band.cpp)
+set_target_properties(ovrinresize_objects PROPERTIES
+  POSITION_INDEPENDENT_CODE ON
+  CXX_VISIBILITY_PRESET hidden
+  VISIBILITY_INLINES_HIDDEN ON)
+target_include_directories(ovrinresize_objects
+  PUBLIC ${PROJECT_SOURCE_DIR}/include
+  PRIVATE ${PROJECT_SOURCE_DIR}/src)
+# No C++ run-time library: no exceptions, no RTTI, no guarded statics. Floating point rounds where
+# the source says so: a contracted multiply-add would change bytes from one processor to the next.
+target_compile_options(ovrinresize_objects PRIVATE
+  -fno-exceptions -fno-rtti -fno-threadsafe-statics -ffp-contract=off)
+if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
+  # Otherwise atomics may call helpers of the compiler's run-time library.
+  target_compile_options(ovrinresize_objects PRIVATE -mno-outline-atomics)
+endif()
+target_link_libraries(ovrinresize_objects PRIVATE ovrinresize_warnings Threads::Threads)
+
+# The version script lists the functions that the public header declares, and nothing else.
+set(OVRINRESIZE_HEADER ${PROJECT_SOURCE_DIR}/include/ovrinresize.h)
+set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${OVRINRESIZE_HEADER})
+file(STRINGS ${OVRINRESIZE_HEADER} declarations REGEX "^OVRIN_API .*\\(")
+set(OVRINRESIZE_EXPORTS "")
+foreach(declaration IN LISTS declarations)
+  string(REGEX MATCH "([A-Za-z_0-9]+)\\(" ignored "${declaration}")
+  string(APPEND OVRINRESIZE_EXPORTS "        ${CMAKE_MATCH_1};\n")
+endforeach()
+configure_file(cmake/exports.map.in ${PROJECT_BINARY_DIR}/exports.map @ONLY)
+
+add_library(ovrinresize SHARED $<TARGET_OBJECTS:ovrinresize_objects>)
+add_library(ovrinresize::ovrinresize ALIAS ovrinresize)
+set_target_properties(ovrinresize PROPERTIES
+  LINKER_LANGUAGE CXX
+  VERSION ${PROJECT_VERSION}
+  SOVERSION ${PROJECT_VERSION_MAJOR}
+  LINK_DEPENDS ${PROJECT_BINARY_DIR}/exports.map
+  LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR})
+target_include_directories(ovrinresize INTERFACE
+  $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>
+  $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+# as-needed leaves out the C++ run-time library that the compiler driver would add. 16 KB pages:
+# current Android devices refuse smaller alignment.
+target_link_options(ovrinresize PRIVATE
+  -Wl,--as-needed
+  -Wl,-Bsymbolic-functions
+  -Wl,--version-script=${PROJECT_BINARY_DIR}/exports.map
+  -Wl,-z,relro,-z,now,-z,noexecstack
+  -Wl,-z,max-page-size=16384,-z,common-page-size=16384)
+if(NOT CMAKE_CXX_FLAGS MATCHES "-fsanitize")
+  target_link_options(ovrinresize PRIVATE -Wl,--no-undefined)
+endif()
+target_link_libraries(ovrinresize PRIVATE Threads::Threads m)

@@ -1,0 +1,91 @@
+// SPDX-License-Identifier: Apache-2.0
+#include <string.h>
+
+#include "dispatch/banded_run.h"
+#include "rgba/rgba_band.h"
+
+namespace ovrin {
+
+namespace {
+
+struct PackedBands : RgbaBands {
+    static void task(void* band) { _resize_rgba8888_tp(band); }
+
+    static void advance(Band& next, Band& previous) {
+        ovrin_resize_rgba8888_get_pos(next.src_w, next.src_h, next.dst_w, next.dst_h, &next);
+        end_where_next_begins(previous, next);
+    }
+};
+
+// A band record counts source bytes and destination words in 32 bits.
+bool fits_band_record(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h) {
+    return int64_t{src_w} * src_h <= INT32_MAX / kRgbaBytes && int64_t{dst_w} * dst_h <= INT32_MAX;
+}
+
+size_t picture_bytes(int32_t w, int32_t h) {
+    return w < 1 || h < 1 ? 0 : static_cast<size_t>(w) * static_cast<size_t>(h) * kRgbaBytes;
+}
+
+ovrin_rgba_band first_band(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
+                           int32_t dst_w, int32_t dst_h) {
+    ovrin_rgba_band band = {};
+    band.src_w = src_w;
+    band.src_h = src_h;
+    band.src_stride = src_w;
+    band.src_rows = src_h;
+    band.dst_w = dst_w;
+    band.dst_h = dst_h;
+    band.band_rows = band_height(src_h, dst_h);
+    band.src = src;
+    band.dst = dst;
+    return band;
+}
+
+bool resize_in_bands(const ovrin_rgba_band& first) {
+    const int32_t count = band_count(first.src_h, first.band_rows);
+    if (count < 2) return false;
+    BandedRun<PackedBands> bands(first, count);
+    if (!bands.ready()) return false;
+    memset(first.dst, 0, picture_bytes(first.dst_w, first.dst_h));
+    bands.run();
+    return true;
+}
+
+}  // namespace
+
+}  // namespace ovrin
+
+using namespace ovrin;
+
+void ovrin_resize_rgba8888_sg(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
+                              int32_t dst_w, int32_t dst_h) {
+    sample_plane({
+        src,
+        ptrdiff_t{src_w} * kRgbaBytes,
+        src_w,
+        src_h,
+        reinterpret_cast<uint8_t*>(dst),
+        ptrdiff_t{dst_w} * kRgbaBytes,
+        dst_w,
+        dst_h,
+        dst_w,
+        kRgbaBytes,
+    });
+}
+
+void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                   ovrin_rgba_band* band) {
+    advance_rgba_band(*band, src_h, dst_h, {src_w, dst_w, 0});
+}
+
+void _resize_rgba8888_tp(void* band) {
+    auto* record = static_cast<ovrin_rgba_band*>(band);
+    run_rgba_band(*record, {record->src_w, record->dst_w, 0});
+}
+
+void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
+                               int32_t dst_w, int32_t dst_h) {
+    const bool done = fits_band_record(src_w, src_h, dst_w, dst_h) &&
+                      resize_in_bands(first_band(src, dst, src_w, src_h, dst_w, dst_h));
+    if (!done) ovrin_resize_rgba8888_sg(src, dst, src_w, src_h, dst_w, dst_h);
+}
