@@ -36,8 +36,12 @@ struct QuarterKernels {
     void (*add_taps)(uint8_t* dst, const uint8_t* row, const int32_t* taps, int32_t count);
 };
 
+// dst[i] = row[taps[i]] for i in [0, count). Reads and writes nothing else.
+using CopyTaps4 = void(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count);
+
 struct Kernels {
     QuarterKernels quarter[4];  // for samples of 1, 2, 3 and 4 bytes
+    CopyTaps4* copy_taps4;
 };
 
 // The plain C++ kernels, which define what every other set must compute.

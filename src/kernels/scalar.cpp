@@ -51,9 +51,15 @@ constexpr QuarterKernels quarter_kernels() {
     return {store_pair<N>, add_pair<N>, add_taps<N>};
 }
 
+void copy_taps4(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count) {
+    for (int32_t i = 0; i < count; ++i) dst[i] = row[taps[i]];
+}
+
 }  // namespace
 
 constexpr Kernels scalar_kernels = {
-    {quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>()}};
+    {quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>()},
+    copy_taps4,
+};
 
 }  // namespace ovrin
