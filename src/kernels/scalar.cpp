@@ -5,50 +5,62 @@ namespace ovrin {
 
 namespace {
 
-uint8_t quarter(uint8_t sample) {
-    return static_cast<uint8_t>(sample >> 2);
+void begin(QuarterPlan& plan, const QuarterRowShape& shape) {
+    plan.sample_bytes = shape.sample_bytes;
+    plan.samples = 0;
+    plan.capacity = kPlanTaps;
+    plan.windows = 0;
 }
 
-uint8_t sum(int a, int b) {
-    return static_cast<uint8_t>(a + b);
+void append(QuarterPlan& plan, const Tap* taps, int32_t count) {
+    for (int32_t i = 0; i < count; ++i) plan.taps[plan.samples + i] = taps[i];
+    plan.samples += count;
 }
 
-// Byte i of the pair's target row, i counted over samples of N bytes.
+int quarter(uint8_t sample) {
+    return sample >> 2;
+}
+
+// Byte c of a sample of N bytes.
 template <int N>
-uint8_t pair_sum(const uint8_t* top, const uint8_t* bottom, int64_t left, int64_t right, int c) {
-    return sum(quarter(top[N * left + c]) + quarter(top[N * right + c]),
-               quarter(bottom[N * left + c]) + quarter(bottom[N * right + c]));
+int quarters(const uint8_t* row, const Tap& tap, int c) {
+    return quarter(row[int64_t{N} * tap.left + c]) + quarter(row[int64_t{N} * tap.right + c]);
 }
 
 template <int N>
-void store_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom,
-                const ColumnPlan& columns) {
-    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
+void store_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
+    for (int32_t i = 0; i < plan.samples; ++i, dst += N) {
+        const Tap tap = plan.taps[i];
         for (int c = 0; c < N; ++c) {
-            dst[c] = pair_sum<N>(top, bottom, columns.left[i], columns.right[i], c);
+            dst[c] = static_cast<uint8_t>(quarters<N>(top, tap, c) + quarters<N>(bottom, tap, c));
         }
     }
 }
 
 template <int N>
-void add_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const ColumnPlan& columns) {
-    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
+void add_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
+    for (int32_t i = 0; i < plan.samples; ++i, dst += N) {
+        const Tap tap = plan.taps[i];
         for (int c = 0; c < N; ++c) {
-            dst[c] = sum(dst[c], pair_sum<N>(top, bottom, columns.left[i], columns.right[i], c));
+            dst[c] = static_cast<uint8_t>(dst[c] + quarters<N>(top, tap, c) +
+                                          quarters<N>(bottom, tap, c));
         }
     }
 }
 
 template <int N>
-void add_taps(uint8_t* dst, const uint8_t* row, const int32_t* taps, int32_t count) {
-    for (int32_t i = 0; i < count; ++i, dst += N) {
-        for (int c = 0; c < N; ++c) dst[c] = sum(dst[c], quarter(row[N * int64_t{taps[i]} + c]));
+void add_row(uint8_t* dst, const uint8_t* row, const QuarterPlan& plan) {
+    for (int32_t i = 0; i < plan.samples; ++i, dst += N) {
+        const Tap tap = plan.taps[i];
+        for (int c = 0; c < N; ++c) {
+            dst[c] = static_cast<uint8_t>(dst[c] + quarters<N>(row, tap, c));
+        }
     }
 }
 
 template <int N>
 constexpr QuarterKernels quarter_kernels() {
-    return {store_pair<N>, add_pair<N>, add_taps<N>};
+    return {begin, append, store_pair<N>, add_pair<N>, add_row<N>};
 }
 
 void copy_taps4(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count) {

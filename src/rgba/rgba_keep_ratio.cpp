@@ -130,6 +130,7 @@ void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t 
         target->dst_width,
         target->dst_height,
         target->dst_width,
+        size.width,
         kRgbaBytes,
     });
 }

@@ -11,8 +11,8 @@ namespace ovrin {
 // Luma of a picture of width x height into the grid that starts at `base`.
 inline QuarterPlane luma_plane(const Yuv420Source& source, const Yuv420Layout& picture,
                                const Yuv420Layout& grid, uint8_t* base) {
-    return {source.luma, source.row_bytes, source.width,   source.height, base,
-            grid.width,  picture.width,    picture.height, picture.width, 1};
+    return {source.luma,   source.row_bytes, source.width,  source.height, base, grid.width,
+            picture.width, picture.height,   picture.width, source.width,  1};
 }
 
 // Interleaved chroma sets its ratio in bytes, not in pairs: its points fall between those that
@@ -29,6 +29,7 @@ inline QuarterPlane chroma_plane(const Yuv420Source& source, const Yuv420Layout&
             static_cast<int32_t>(grid.chroma_row()),
             grid.chroma_rows(),
             half_rounded_up(grid.width),
+            half_rounded_up(source.width),
             source.chroma.sample_bytes};
 }
 
