@@ -12,12 +12,13 @@ constexpr int32_t kStripColumns = 1024;
 
 // Where a strip of target samples takes its source samples within a row.
 struct ColumnPlan {
-    int32_t count;                  // target samples in the strip, at most kStripColumns
-    int32_t left[kStripColumns];    // source sample index at each target's quarter point
-    int32_t right[kStripColumns];   // ... at its three-quarter point; never less than left
+    int32_t count;                 // target samples in the strip, at most kStripColumns
+    int32_t left[kStripColumns];   // source sample index at each target's quarter point
+    int32_t right[kStripColumns];  // ... at its three-quarter point; never less than left
 };
 
-// For samples of N bytes (N = 1 to 4), for every target sample i in [0, count) and byte c in [0, N):
+// For samples of N bytes (N = 1 to 4), for every target sample i in [0, count) and byte c in [0,
+// N):
 //
 //   store_pair  dst[N*i + c]  = quarters(top, i, c) + quarters(bottom, i, c)
 //   add_pair    dst[N*i + c] += quarters(top, i, c) + quarters(bottom, i, c)

@@ -59,7 +59,8 @@ void add_row(const QuarterKernels& kernel, const RowTarget& target, const uint8_
 }
 
 // A target row whose two source rows both lie in the scan is done in one go. Bands also hold halves
-// of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies behind.
+// of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
+// behind.
 void scan_strip(const QuarterPlane& plane, RowScan scan, const QuarterKernels& kernel,
                 PairKernel pair, const ColumnPlan& columns) {
     const auto row = [&](const QuarterPoints& points) {
@@ -107,7 +108,8 @@ void scan_plane(const QuarterPlane& plane, RowScan scan, const QuarterKernels& k
 }
 
 void clear_plane(const QuarterPlane& plane) {
-    const size_t row_bytes = static_cast<size_t>(plane.samples) * static_cast<size_t>(plane.sample_bytes);
+    const size_t row_bytes =
+        static_cast<size_t>(plane.samples) * static_cast<size_t>(plane.sample_bytes);
     uint8_t* row = plane.dst;
     for (int32_t j = 0; j < plane.dst_rows; ++j, row += plane.dst_pitch) memset(row, 0, row_bytes);
 }
