@@ -6,14 +6,24 @@ add_library(ovrinresize_objects OBJECT
   src/dispatch/band_schedule.cpp
   src/dispatch/sleep.cpp
   src/dispatch/wrappers.cpp
-  src/kernels/quarter_scalar.cpp
+  src/kernels/scalar.cpp
   src/kernels/select.cpp
   src/layout.cpp
+  src/nv21/nv21.cpp
+  src/nv21/nv21_bands.cpp
   src/pool/threadpool.cpp
   src/quarter/sampler.cpp
   src/quarter/scan.cpp
+  src/rgba/nearest.cpp
+  src/rgba/rgb888.cpp
   src/rgba/rgba8888.cpp
-  src/rgba/rgba_band.cpp)
+  src/rgba/rgba_band.cpp
+  src/rgba/rgba_keep_ratio.cpp
+  src/yuv/planar.cpp
+  src/yuv/planar_bands.cpp
+  src/yuv420/bands.cpp
+  src/yuv420/place.cpp
+  src/yuv420/resize.cpp)
 set_target_properties(ovrinresize_objects PROPERTIES
   POSITION_INDEPENDENT_CODE ON
   CXX_VISIBILITY_PRESET hidden

@@ -32,6 +32,36 @@ extern "C" {
 #endif
 
 /*
+ * ---- Placing a picture in a larger canvas ------------------------------------------------------
+ */
+
+/*
+ * Where the keep-ratio functions and the bilinear engine find their source rows and put the scaled
+ * picture. The caller fills it. Only ovrin_resize_rgba8888_keep_ratio and the two functions behind
+ * it ever write it.
+ *
+ * dst_x and dst_y must not be negative.
+ */
+typedef struct ovrin_resize_target {
+    void *reserved_head;         /* the caller's; neither read nor written */
+    const uint8_t *src_vu_plane; /* source chroma pairs: bilinear engine, formats 18 and 19 */
+    const uint8_t *src_u_plane;  /* source U plane: bilinear engine, format 2 */
+    const uint8_t *src_v_plane;  /* source V plane: bilinear engine, format 2 */
+    int32_t src_width;           /* source size, pixels; rewritten when an RGBA picture is clipped */
+    int32_t src_height;
+    int32_t src_stride;        /* source row length: pixels (RGBA8888), bytes (planes) */
+    int32_t src_buffer_height; /* rows in the source buffer */
+    int32_t format;            /* format code of the bilinear engine */
+    void *dst;                 /* the canvas: 32-bit pixels or planes */
+    int32_t dst_width;         /* size of the scaled picture, pixels; rewritten when an RGBA */
+    int32_t dst_height;        /* picture is clipped */
+    int32_t canvas_width;      /* size of the canvas, pixels */
+    int32_t canvas_height;
+    int32_t dst_x; /* canvas position of the picture's top left pixel */
+    int32_t dst_y;
+} ovrin_resize_target;
+
+/*
  * ---- RGBA8888: four bytes per pixel, in any channel order ------------------------------------
  *
  * The quarter-point downscaler. A destination pixel is the sum of four source pixels, taken one
@@ -113,6 +143,265 @@ OVRIN_API void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32
  * destination row must not run at the same time.
  */
 OVRIN_API void _resize_rgba8888_tp(void *band);
+
+/*
+ * ---- RGBA8888 in a canvas ----------------------------------------------------------------------
+ */
+
+/*
+ * Fills the target's canvas with 0 and resizes src into the rectangle dst_width x dst_height at
+ * (dst_x, dst_y). src_w x src_h is the source size; its rows lie target->src_stride pixels apart.
+ *
+ * A rectangle that passes the canvas's right or lower edge is cut there, and the source is cut in
+ * proportion: dst_width becomes canvas_width - dst_x, and the source width becomes
+ * (int)(target->src_width * ((double)new_dst_width / old_dst_width)); both are written back into
+ * the target, likewise for heights. Keep target->src_width and src_height equal to the arguments:
+ * they are what is cut.
+ *
+ * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
+ * dst_y), or dst_height is 0. Threads as ovrin_resize_rgba8888, by src_h.
+ */
+OVRIN_API void ovrin_resize_rgba8888_keep_ratio(const uint8_t *src, int32_t src_w, int32_t src_h,
+                                                ovrin_resize_target *target);
+
+/* On the calling thread. A src_stride of 0 samples the first row for every destination row. */
+OVRIN_API void ovrin_resize_rgba_keep_ratio_sg(const uint8_t *src, int32_t src_w, int32_t src_h,
+                                               ovrin_resize_target *target);
+
+/*
+ * In bands. Returns at once when target is null. A src_stride of 0 or less counts as the source
+ * width here. Falls back to the calling thread as ovrin_resize_rgba8888_tps does.
+ */
+OVRIN_API void ovrin_resize_rgba_keep_ratio_tps(const uint8_t *src, int32_t src_w, int32_t src_h,
+                                                ovrin_resize_target *target);
+
+/*
+ * As ovrin_resize_rgba8888_get_pos, for a picture in a canvas: destination indices count canvas
+ * words from canvas row dst_y, without dst_x; source rows lie band->src_stride pixels apart.
+ * canvas_h is not used.
+ */
+OVRIN_API void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t src_w, int32_t src_h, int32_t dst_w,
+                                                        int32_t dst_h, int32_t canvas_w,
+                                                        int32_t canvas_h, ovrin_rgba_band *band);
+
+/* As _resize_rgba8888_tp, for a picture in a canvas: band->dst is the first word of row dst_y. */
+OVRIN_API void _resize_rgba8888_keep_ratio_tp(void *band);
+
+/*
+ * ---- RGB888 and nearest neighbour --------------------------------------------------------------
+ */
+
+/*
+ * As ovrin_resize_rgba8888_sg with three bytes per pixel, in any channel order; always on the
+ * calling thread.
+ */
+OVRIN_API void ovrin_resize_rgb888(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+                                   int32_t dst_w, int32_t dst_h);
+
+/*
+ * Copies one source pixel per destination pixel, on the calling thread. The step between samples is
+ * a whole number, the ratio rounded to the nearest (sx = (int)(src_w / dst_w + 0.5)); the first
+ * sample lies half a step in, rounded up. Samples beyond the source are dropped, not clamped: what
+ * is written to a row closes up to its left, and the rest of the destination keeps its contents.
+ *
+ * Returns without writing when a pointer is null or a size is 0 or less.
+ */
+OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t *src, uint32_t *dst, int32_t src_w,
+                                             int32_t src_h, int32_t dst_w, int32_t dst_h);
+
+/*
+ * ---- 4:2:0 pictures: planar YUV and NV21 -------------------------------------------------------
+ *
+ * A picture of w x h pixels has w * h bytes of luma, then its chroma at half the size in either
+ * direction, rounded up:
+ *
+ *     I420   a plane of U, then a plane of V, each (h + 1) >> 1 rows of (w + 1) >> 1 bytes
+ *     NV21   one plane of (h + 1) >> 1 rows of (w + 1) >> 1 pairs, V before U
+ *
+ * Both are resized as RGBA8888 is, byte by byte. Chroma is sampled for the destination size rounded
+ * up to multiples of 4 in each direction, and then cut to its own size: where the destination's
+ * width or height is not a multiple of 4, the chroma that is kept covers a little less of the
+ * source than the luma. Such sizes need a work buffer of 2 * width * height bytes, both rounded up;
+ * without memory for it nothing is written. A destination size of 0 or less writes nothing; a source
+ * size of 0 or less fills the destination with 0, chroma included.
+ *
+ * The keep-ratio forms paint the target's canvas black (luma 0, chroma 128) and place the picture,
+ * scaled to dst_width x dst_height, at (dst_x, dst_y). What does not fit into the canvas is cut off,
+ * not rescaled. Chroma goes to half the position rounded up, so with an odd dst_x or dst_y it lies
+ * one pixel further right or down than the luma; chroma that would pass the end of the canvas is
+ * dropped. Source luma rows lie target->src_stride bytes apart, chroma rows half as many samples,
+ * rounded up. The target is never written. Nothing is touched if canvas_width < dst_x,
+ * canvas_height < dst_y or dst_height is 0.
+ *
+ * Wrappers and drivers divide the work as for RGBA8888.
+ */
+
+/* I420 to I420, contiguous buffers. */
+OVRIN_API void ovrin_resize_yuv420(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+                                   int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_yuv420_sg(const uint8_t *src, uint8_t *dst, int32_t src_w,
+                                      int32_t src_h, int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_yuv420_tps(const uint8_t *src, uint8_t *dst, int32_t src_w,
+                                       int32_t src_h, int32_t dst_w, int32_t dst_h);
+
+/* Three source planes to a contiguous I420 buffer. */
+OVRIN_API void ovrin_resize_y_u_v(const uint8_t *src_y, const uint8_t *src_u, const uint8_t *src_v,
+                                  uint8_t *dst, int32_t src_w, int32_t src_h, int32_t dst_w,
+                                  int32_t dst_h);
+
+/* Three source planes into an I420 canvas. */
+OVRIN_API void ovrin_resize_y_u_v_keep_ratio(const uint8_t *src_y, const uint8_t *src_u,
+                                             const uint8_t *src_v, int32_t src_w, int32_t src_h,
+                                             const ovrin_resize_target *target);
+
+/*
+ * Both of these: a null target selects the contiguous destination; otherwise dst, dst_w and dst_h
+ * are ignored.
+ *
+ * The driver runs on the calling thread below 1024 source rows. With a target it takes a src_stride
+ * of 0 or less for src_w, and its second test compares canvas_height with dst_x, not dst_y: a
+ * picture that starts below the canvas gives a black canvas.
+ */
+OVRIN_API void ovrin_resize_y_u_v_sg(const uint8_t *src_y, const uint8_t *src_u,
+                                     const uint8_t *src_v, uint8_t *dst, int32_t src_w,
+                                     int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                     const ovrin_resize_target *target);
+OVRIN_API void ovrin_resize_y_u_v_tps(const uint8_t *src_y, const uint8_t *src_u,
+                                      const uint8_t *src_v, uint8_t *dst, int32_t src_w,
+                                      int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                      const ovrin_resize_target *target);
+
+/*
+ * One band of a planar picture. Points, bases and indices as in ovrin_rgba_band, once for luma and
+ * once for the two chroma planes together; indices count bytes from the start of the plane in the
+ * work buffer or destination. "Top" is the quarter point of a destination row, "left" that of a
+ * column.
+ */
+typedef struct ovrin_yuv_band {
+    int32_t y_start_row; /* luma rows before this band; 0: the points below are not set yet */
+    int32_t y_top_point;
+    int32_t y_bottom_point;
+    int32_t y_row_base;
+    int32_t y_top_left;
+    int32_t y_top_right;
+    int32_t y_bottom_left;
+    int32_t y_bottom_right;
+    int32_t uv_start_row; /* chroma rows before this band; 0: the points below are not set yet */
+    int32_t uv_top_point;
+    int32_t uv_bottom_point;
+    int32_t uv_row_base;
+    int32_t uv_top_left;
+    int32_t uv_top_right;
+    int32_t uv_bottom_left;
+    int32_t uv_bottom_right;
+    int32_t src_width; /* source size, pixels */
+    int32_t src_height;
+    int32_t src_row_bytes; /* from one source luma row to the next */
+    int32_t src_rows;      /* rows in the source buffer */
+    int32_t dst_width;     /* size of the scaled picture, pixels */
+    int32_t dst_height;
+    int32_t band_rows;     /* luma rows in a band */
+    int32_t src_y_offset;  /* bytes from the luma plane to the band's first row */
+    int32_t src_uv_offset; /* bytes from either chroma plane to the band's first row */
+    const uint8_t *src;    /* the whole source buffer, or its luma plane */
+    uint8_t *dst;          /* the destination buffer, or the canvas */
+    const uint8_t *src_u;  /* chroma planes of a source in three planes */
+    const uint8_t *src_v;
+    uint8_t *work;   /* work buffer shared by all bands; null when dst takes the samples itself */
+    int32_t y_rows;  /* luma rows that this band processes */
+    int32_t uv_rows; /* chroma rows that this band processes */
+    int32_t done;    /* 0 until the band's task has finished, then 1 (stored with release) */
+} ovrin_yuv_band;
+
+/*
+ * Moves a band record to the following band without touching pixels, and sets y_rows and uv_rows to
+ * the rows of the band just walked. A band has band_rows luma rows; its chroma is a quarter of that,
+ * rounded up, and then as many rows more as it takes to complete a destination row. Luma rows beyond
+ * the source give y_rows 0, chroma rows beyond it are cut off. src_width is not used.
+ */
+OVRIN_API void ovrin_resize_yuv420_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
+                                           int32_t dst_height, ovrin_yuv_band *band);
+
+/*
+ * Band tasks; band points to an ovrin_yuv_band. They add to what the work buffer or destination
+ * holds, then set done; where a work buffer is needed and missing they only set done. The first
+ * reads three planes and prefers the work buffer whenever there is one; the second reads one
+ * contiguous buffer.
+ */
+OVRIN_API void _resize_y_u_v_tp(void *band);
+OVRIN_API void _resize_yuv420_tp(void *band);
+
+/* NV21 to NV21, contiguous buffers. */
+OVRIN_API void ovrin_resize_nv21(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+                                 int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_nv21_sg(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+                                    int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_nv21_tps(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+                                     int32_t dst_w, int32_t dst_h);
+
+/* Luma and chroma plane apart, to a contiguous NV21 buffer. */
+OVRIN_API void ovrin_resize_y_nv21(const uint8_t *src_y, const uint8_t *src_vu, uint8_t *dst,
+                                   int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h);
+
+/* Luma and chroma plane apart, into an NV21 canvas. */
+OVRIN_API void ovrin_resize_y_nv21_keep_ratio(const uint8_t *src_y, const uint8_t *src_vu,
+                                              int32_t src_w, int32_t src_h,
+                                              const ovrin_resize_target *target);
+
+/* As ovrin_resize_y_u_v_sg and ovrin_resize_y_u_v_tps, for NV21. */
+OVRIN_API void ovrin_resize_y_nv_sg(const uint8_t *src_y, const uint8_t *src_vu, uint8_t *dst,
+                                    int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                    const ovrin_resize_target *target);
+OVRIN_API void ovrin_resize_y_nv_tps(const uint8_t *src_y, const uint8_t *src_vu, uint8_t *dst,
+                                     int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                     const ovrin_resize_target *target);
+
+/* One band of an NV21 picture; as ovrin_yuv_band, with one plane of chroma pairs. */
+typedef struct ovrin_nv21_band {
+    int32_t y_start_row;
+    int32_t y_top_point;
+    int32_t y_bottom_point;
+    int32_t y_row_base;
+    int32_t y_top_left;
+    int32_t y_top_right;
+    int32_t y_bottom_left;
+    int32_t y_bottom_right;
+    int32_t vu_start_row;
+    int32_t vu_top_point;
+    int32_t vu_bottom_point;
+    int32_t vu_row_base;
+    int32_t vu_top_left;
+    int32_t vu_top_right;
+    int32_t vu_bottom_left;
+    int32_t vu_bottom_right;
+    int32_t src_width;
+    int32_t src_height;
+    int32_t src_row_bytes;
+    int32_t src_rows;
+    int32_t dst_width;
+    int32_t dst_height;
+    int32_t band_rows;
+    int32_t src_y_offset;
+    int32_t src_vu_offset;
+    const uint8_t *src;
+    uint8_t *dst;
+    const uint8_t *src_vu; /* chroma plane of a source in two planes */
+    uint8_t *work;
+    int32_t y_rows;
+    int32_t vu_rows;
+    int32_t done;
+} ovrin_nv21_band;
+
+/*
+ * As ovrin_resize_yuv420_get_pos, except that a chroma band which does not end on a destination row
+ * takes all chroma rows that are left, and the bands after it get none.
+ */
+OVRIN_API void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
+                                         int32_t dst_height, ovrin_nv21_band *band);
+
+/* Band tasks; band points to an ovrin_nv21_band. As _resize_yuv420_tp and _resize_y_u_v_tp. */
+OVRIN_API void _resize_nv21_tp(void *band);
+OVRIN_API void _resize_y_nv21_tp(void *band);
 
 /*
  * ---- Thread pool -----------------------------------------------------------------------------

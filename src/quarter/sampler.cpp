@@ -42,27 +42,68 @@ struct RowScan {
     }
 };
 
-ColumnPlan plan_strip(QuarterPoints& left, QuarterPoints& right, int32_t count) {
-    ColumnPlan columns;
-    columns.count = count;
-    for (int32_t i = 0; i < count; ++i, left.next(), right.next()) {
-        columns.left[i] = static_cast<int32_t>(left.cell());
-        columns.right[i] = static_cast<int32_t>(right.cell());
+// The columns of a row from some target sample on.
+struct Columns {
+    QuarterPoints left;
+    QuarterPoints right;
+
+    Tap next() {
+        const Tap tap = {static_cast<int32_t>(left.cell()), static_cast<int32_t>(right.cell())};
+        left.next();
+        right.next();
+        return tap;
     }
-    return columns;
+};
+
+// One strip of the plane: its columns, planned, and where they start.
+struct Strip {
+    const QuarterKernels& kernel;
+    PairKernel pair;
+    const QuarterPlan& plan;
+    Columns columns;
+};
+
+constexpr int32_t kTapBlock = 256;
+
+// Plans as many of the columns as one strip takes.
+void plan_strip(const QuarterPlane& plane, int32_t samples_left, const QuarterKernels& kernel,
+                Columns& columns, QuarterPlan& plan) {
+    kernel.begin(plan, {plane.sample_bytes, plane.src_samples, plane.src_columns, plane.dst_columns,
+                        samples_left});
+    const int32_t samples = samples_left < plan.capacity ? samples_left : plan.capacity;
+    Tap taps[kTapBlock];
+    for (int32_t planned = 0; planned < samples;) {
+        const int32_t rest = samples - planned;
+        const int32_t count = rest < kTapBlock ? rest : kTapBlock;
+        for (int32_t i = 0; i < count; ++i) taps[i] = columns.next();
+        kernel.append(plan, taps, count);
+        planned += count;
+    }
 }
 
-void add_row(const QuarterKernels& kernel, const RowTarget& target, const uint8_t* row,
-             const ColumnPlan& columns) {
-    kernel.add_taps(target.left, row, columns.left, columns.count);
-    kernel.add_taps(target.right, row, columns.right, columns.count);
+void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const QuarterPlan& plan) {
+    for (int32_t i = 0; i < plan.samples; ++i, points.next()) {
+        const uint8_t* sample = row + points.cell() * plan.sample_bytes;
+        for (int32_t c = 0; c < plan.sample_bytes; ++c, ++dst) {
+            *dst = static_cast<uint8_t>(*dst + (sample[c] >> 2));
+        }
+    }
+}
+
+void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
+    if (target.left == target.right) {
+        strip.kernel.add_row(target.left, row, strip.plan);
+        return;
+    }
+    // Only a record that no walk has made sends the columns' samples to two places.
+    add_taps(target.left, row, strip.columns.left, strip.plan);
+    add_taps(target.right, row, strip.columns.right, strip.plan);
 }
 
 // A target row whose two source rows both lie in the scan is done in one go. Bands also hold halves
 // of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
 // behind.
-void scan_strip(const QuarterPlane& plane, RowScan scan, const QuarterKernels& kernel,
-                PairKernel pair, const ColumnPlan& columns) {
+void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     const auto row = [&](const QuarterPoints& points) {
         return plane.src + points.cell() * plane.src_pitch;
     };
@@ -73,11 +114,11 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const QuarterKernels& k
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            pair(scan.top_target.left, row(scan.top), row(scan.bottom), columns);
+            strip.pair(scan.top_target.left, row(scan.top), row(scan.bottom), strip.plan);
         } else if (take_top) {
-            add_row(kernel, scan.top_target, row(scan.top), columns);
+            add_row(strip, scan.top_target, row(scan.top));
         } else {
-            add_row(kernel, scan.bottom_target, row(scan.bottom), columns);
+            add_row(strip, scan.bottom_target, row(scan.bottom));
         }
         if (take_top) {
             scan.top.next();
@@ -92,18 +133,17 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const QuarterKernels& k
 
 void scan_plane(const QuarterPlane& plane, RowScan scan, const QuarterKernels& kernel,
                 PairKernel pair) {
-    QuarterPoints left(quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns);
-    QuarterPoints right(three_quarter_point(plane.src_columns), plane.src_columns,
-                        plane.dst_columns);
-    for (int32_t done = 0; done < plane.samples;) {
-        const int32_t rest = plane.samples - done;
-        const int32_t count = rest < kStripColumns ? rest : kStripColumns;
-        const ColumnPlan columns = plan_strip(left, right, count);
-        scan_strip(plane, scan, kernel, pair, columns);
-        const ptrdiff_t strip_bytes = ptrdiff_t{count} * plane.sample_bytes;
+    Columns columns = {
+        {quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns},
+        {three_quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns}};
+    QuarterPlan plan;
+    for (int32_t done = 0; done < plane.samples; done += plan.samples) {
+        const Columns first = columns;
+        plan_strip(plane, plane.samples - done, kernel, columns, plan);
+        scan_strip(plane, scan, {kernel, pair, plan, first});
+        const ptrdiff_t strip_bytes = ptrdiff_t{plan.samples} * plane.sample_bytes;
         scan.top_target.move(strip_bytes);
         scan.bottom_target.move(strip_bytes);
-        done += count;
     }
 }
 

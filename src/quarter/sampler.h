@@ -22,6 +22,7 @@ struct QuarterPlane {
     int32_t dst_columns;   // target extent of a row
     int32_t dst_rows;      // target extent of a column
     int32_t samples;       // target samples in a row
+    int32_t src_samples;   // source samples in a row
     int32_t sample_bytes;  // 1 to 4
 };
 

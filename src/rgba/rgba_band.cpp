@@ -46,6 +46,7 @@ void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
         band.dst_w,
         band.dst_h,
         band.dst_w,
+        band.src_w,
         kRgbaBytes,
     };
     add_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes);
