@@ -6,6 +6,7 @@
 #include <ovrinresize.h>
 
 #include <cstdint>
+#include <initializer_list>
 
 #include "reference/band_walkers.h"
 
