@@ -28,14 +28,14 @@ Sizes tall_sizes(Random& random) {
                          random.between(300, 1500), random.between(1500, 5000)})};
 }
 
-// A canvas which the picture fills, fits into or passes. It is at least as high as the picture lies
-// to the right, without which the drivers of planes would reject it.
-ovrin_resize_target around(Random& random, const Sizes& s) {
+// A canvas which the picture fills, fits into or passes. It is at least `low` rows high, and as high
+// as the picture lies to the right: the drivers of planes would reject anything else.
+ovrin_resize_target around(Random& random, const Sizes& s, int32_t low) {
     const int32_t x = random.between(0, 5);
     const int32_t y = random.between(0, 5);
     const int32_t w = x + s.dst_w + random.pick({0, 0, random.between(0, 9), -s.dst_w / 2});
-    const int32_t h = y + s.dst_h + random.pick({0, 0, random.between(0, 9), -s.dst_h / 2});
-    return letterbox(w, std::max({h, x, y}), s.dst_w, s.dst_h, x, y);
+    const int32_t h = y + s.dst_h + random.pick({0, 0, random.between(0, 9), -s.dst_h / 2, -y});
+    return letterbox(w, std::max({h, x, y, low}), s.dst_w, s.dst_h, x, y);
 }
 
 // What both ways made of one call, and what the definition makes of it.
@@ -66,7 +66,9 @@ void check_rgba(const Sizes& s, Random& random) {
 }
 
 void check_keep_ratio_rgba(const Sizes& s, Random& random) {
-    ovrin_resize_target target = around(random, s);
+    // As high as the picture, or it would be rejected; a row of it visible, or only the
+    // single-threaded function would clear the canvas.
+    ovrin_resize_target target = around(random, s, std::max(s.dst_h, 6));
     target.src_width = s.src_w;
     target.src_height = s.src_h;
     target.src_stride = random_stride(random, s.src_w);
@@ -114,7 +116,7 @@ void check_y_u_v(const Sizes& s, Random& random) {
 }
 
 void check_y_u_v_keep_ratio(const Sizes& s, Random& random) {
-    ovrin_resize_target target = around(random, s);
+    ovrin_resize_target target = around(random, s, 0);
     target.src_stride = random_stride(random, s.src_w);
     SCOPED_TRACE(describe(target, s.src_w, s.src_h));
     const PlanarPicture src(random, s.src_w, s.src_h, target.src_stride);
@@ -154,7 +156,7 @@ void check_y_nv21(const Sizes& s, Random& random) {
 // With rows wider than the picture, too: a band whose chroma runs to the end of the plane leaves
 // later bands none, so that they never read from the offset it gives them.
 void check_y_nv21_keep_ratio(const Sizes& s, Random& random) {
-    ovrin_resize_target target = around(random, s);
+    ovrin_resize_target target = around(random, s, 0);
     target.src_stride = random_stride(random, s.src_w);
     SCOPED_TRACE(describe(target, s.src_w, s.src_h));
     const SemiPlanarPicture src(random, s.src_w, s.src_h, target.src_stride);

@@ -344,7 +344,8 @@ TEST(QuarterFaults, WrappersMakeThreadsFrom1024Rows) {
 // takes the row length as well.
 TEST(QuarterFaults, WithoutThreadsTheSingleThreadedRulesHold) {
     const Source s(9, 1100);
-    const ovrin_resize_target below = letterbox(8, 8, 4, 4, 2, 9);
+    ovrin_resize_target below = letterbox(8, 8, 4, 4, 2, 9);
+    below.src_stride = 9;
     ovrin_resize_target no_stride = on_canvas(8, 332);
     no_stride.src_stride = 0;
     for (const auto& run : {run_y_u_v_on, run_y_nv_on}) {
