@@ -96,8 +96,8 @@ TEST(Extremes, NegativePositionsStayInTheCanvas) {
     Random random(140);
     SCOPED_TRACE(random.trace());
     for (const int32_t src_h : {8, 1100}) {
-        for (const int32_t x : {INT32_MIN, -100, -9, -8, -3, -1, 0, 3}) {
-            for (const int32_t y : {INT32_MIN, -100, -9, -8, -3, -1, 0, 3}) {
+        for (const int32_t x : {INT32_MIN, -9, -3, -1, 0, 3}) {
+            for (const int32_t y : {INT32_MIN, -9, -3, -1, 0, 3}) {
                 letterbox_all_ways(letterbox(8, 8, 5, 6, x, y), src_h, random);
                 letterbox_all_ways(letterbox(8, 8, 40, 8, x, y), src_h, random);
             }
