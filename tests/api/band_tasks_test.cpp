@@ -58,8 +58,8 @@ struct RgbaBand {
     RgbaBand(Random& random, const Sizes& s, int32_t band_rows, int32_t index, int32_t stride,
              int32_t x, int32_t skip, Flush flush)
         : src(random, int64_t{s.src_w} * 4, s.src_h, int64_t{stride} * 4, flush),
-          dst(small_words(random, static_cast<size_t>((s.dst_h - 1) * (x + s.dst_w + skip) + x +
-                                                      s.dst_w)),
+          dst(small_words(random,
+                          static_cast<size_t>((s.dst_h - 1) * (x + s.dst_w + skip) + x + s.dst_w)),
               flush),
           band(marked_record<ovrin_rgba_band>()) {
         band.start_row = band.row_acc = band.src_offset = 0;
@@ -123,10 +123,18 @@ void replay_walk(const Sizes& s, ovrin_nv21_band& band) {
     reference::nv21_get_pos(s.src_w, s.src_h, s.dst_w, s.dst_h, band);
 }
 
-int32_t& chroma_rows(ovrin_yuv_band& band) { return band.uv_rows; }
-int32_t& chroma_rows(ovrin_nv21_band& band) { return band.vu_rows; }
-int32_t& chroma_start(ovrin_yuv_band& band) { return band.uv_start_row; }
-int32_t& chroma_start(ovrin_nv21_band& band) { return band.vu_start_row; }
+int32_t& chroma_rows(ovrin_yuv_band& band) {
+    return band.uv_rows;
+}
+int32_t& chroma_rows(ovrin_nv21_band& band) {
+    return band.vu_rows;
+}
+int32_t& chroma_start(ovrin_yuv_band& band) {
+    return band.uv_start_row;
+}
+int32_t& chroma_start(ovrin_nv21_band& band) {
+    return band.vu_start_row;
+}
 
 // The record of a band, walked to by the replayed walkers, given the rows that a driver gives it:
 // the last band takes what is left. Pointers are null.
@@ -171,8 +179,8 @@ void run_task(Task* task, Band band, const GuardedBuffer<uint8_t>& target,
 void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t index, int32_t stride,
                   Flush flush) {
     SCOPED_TRACE(describe(s, flush));
-    SCOPED_TRACE(::testing::Message() << "band " << index << " of " << band_rows << " rows, stride "
-                                      << stride);
+    SCOPED_TRACE(::testing::Message()
+                 << "band " << index << " of " << band_rows << " rows, stride " << stride);
     GuardedBuffer<uint8_t> target(small_bytes(random, grid_bytes(s)), flush);
     const std::vector<uint8_t> before = target.copy();
     const auto aim = [&](auto& band) {
@@ -291,7 +299,8 @@ TEST(BandTasks, EverySmallBandOfEveryRemainder) {
     for (int32_t src_h = 1; src_h <= limit; ++src_h) {
         for (int32_t dst_h = 1; dst_h <= limit; ++dst_h) {
             for (int32_t rows = 1; rows <= src_h; ++rows) {
-                for (int32_t index = 0; index <= (src_h - 1) / rows && !HasFatalFailure(); ++index) {
+                for (int32_t index = 0; index <= (src_h - 1) / rows && !HasFatalFailure();
+                     ++index) {
                     check_planes(random, {5, src_h, 1 + (src_h + dst_h) % 8, dst_h}, rows, index, 6,
                                  Flush::kEnd);
                 }
@@ -313,8 +322,8 @@ TEST(BandTasks, AllBandsTogetherGiveTheWholePicture) {
         SCOPED_TRACE(::testing::Message() << "bands of " << rows << " rows");
         const auto i420 = random.bytes(bytes_of_i420(s.src_w, s.src_h));
         const auto nv21 = random.bytes(bytes_of_nv21(s.src_w, s.src_h));
-        const auto rgba = random.bytes(static_cast<size_t>(s.src_w) *
-                                       static_cast<size_t>(s.src_h) * 4);
+        const auto rgba =
+            random.bytes(static_cast<size_t>(s.src_w) * static_cast<size_t>(s.src_h) * 4);
         std::vector<uint8_t> i420_out(grid_bytes(s)), nv21_out(grid_bytes(s));
         std::vector<uint32_t> rgba_out(static_cast<size_t>(s.dst_w * s.dst_h));
         for (int32_t index = 0; index * rows < s.src_h; ++index) {
@@ -331,12 +340,12 @@ TEST(BandTasks, AllBandsTogetherGiveTheWholePicture) {
             made.band.dst = rgba_out.data();
             _resize_rgba8888_tp(&made.band);
         }
-        ASSERT_EQ(i420_out, reference::resize_yuv(
-                                reference::i420_source(i420.data(), s.src_w, s.src_h), s.dst_w,
-                                s.dst_h));
-        ASSERT_EQ(nv21_out, reference::resize_nv21(
-                                reference::nv21_source(nv21.data(), s.src_w, s.src_h), s.dst_w,
-                                s.dst_h));
+        ASSERT_EQ(i420_out,
+                  reference::resize_yuv(reference::i420_source(i420.data(), s.src_w, s.src_h),
+                                        s.dst_w, s.dst_h));
+        ASSERT_EQ(nv21_out,
+                  reference::resize_nv21(reference::nv21_source(nv21.data(), s.src_w, s.src_h),
+                                         s.dst_w, s.dst_h));
         const auto packed =
             reference::quarter_packed(rgba.data(), s.src_w, s.src_h, s.dst_w, s.dst_h, 4);
         ASSERT_TRUE(same_bytes(reinterpret_cast<const uint8_t*>(rgba_out.data()), packed.data(),
@@ -356,7 +365,7 @@ TEST(BandTasks, SamplesGoWhereTheIndicesSay) {
         band.src_u = src.view.u;
         band.src_v = src.view.v;
         band.uv_rows = 0;
-        for (int32_t ovrin_yuv_band::* to :
+        for (int32_t ovrin_yuv_band::*to :
              {&ovrin_yuv_band::y_top_left, &ovrin_yuv_band::y_top_right,
               &ovrin_yuv_band::y_bottom_left, &ovrin_yuv_band::y_bottom_right}) {
             band.*to += 3 * 16;

@@ -92,9 +92,7 @@ void chain_yuv(const Sizes& s, const ovrin_yuv_band& first) {
         [&](ovrin_yuv_band& band) {
             ovrin_resize_yuv420_get_pos(-77, s.src_h, s.dst_w, s.dst_h, &band);
         },
-        [&](ovrin_yuv_band& band) {
-            reference::yuv420_get_pos(s.src_h, s.dst_w, s.dst_h, band);
-        });
+        [&](ovrin_yuv_band& band) { reference::yuv420_get_pos(s.src_h, s.dst_w, s.dst_h, band); });
 }
 
 void chain_nv21(const Sizes& s, const ovrin_nv21_band& first) {
@@ -139,8 +137,7 @@ TEST(BandWalkers, ChainsOverRgbaInACanvas) {
     SCOPED_TRACE(random.trace());
     for (int i = 0; i < rounds(2000) && !HasFatalFailure(); ++i) {
         const Walked w = random_walked(random);
-        chain_keep_ratio(w.sizes, w.band_rows, w.stride,
-                         w.sizes.dst_w + random.between(0, 40));
+        chain_keep_ratio(w.sizes, w.band_rows, w.stride, w.sizes.dst_w + random.between(0, 40));
     }
 }
 
@@ -189,14 +186,14 @@ TEST(BandWalkers, IndicesAreTakenFromTheRecord) {
         const auto next = [&] { return together ? start : start += random.between(1, 9); };
         auto yuv = first_yuv(w.band_rows, w.stride);
         auto nv21 = first_nv21(w.band_rows, w.stride);
-        for (int32_t ovrin_yuv_band::* index :
+        for (int32_t ovrin_yuv_band::*index :
              {&ovrin_yuv_band::y_top_left, &ovrin_yuv_band::y_top_right,
               &ovrin_yuv_band::y_bottom_left, &ovrin_yuv_band::y_bottom_right,
               &ovrin_yuv_band::uv_top_left, &ovrin_yuv_band::uv_top_right,
               &ovrin_yuv_band::uv_bottom_left, &ovrin_yuv_band::uv_bottom_right}) {
             yuv.*index = next();
         }
-        for (int32_t ovrin_nv21_band::* index :
+        for (int32_t ovrin_nv21_band::*index :
              {&ovrin_nv21_band::y_top_left, &ovrin_nv21_band::y_top_right,
               &ovrin_nv21_band::y_bottom_left, &ovrin_nv21_band::y_bottom_right,
               &ovrin_nv21_band::vu_top_left, &ovrin_nv21_band::vu_top_right,
@@ -335,7 +332,8 @@ TEST(BandWalkers, TheChromaOffsetIsSteppedByDifferentLengths) {
 
 // As a driver walks: one band less than there are, the last takes what is left.
 TEST(BandWalkers, LumaRowsOfAllBandsButTheLastAddUpToItsStart) {
-    for (const auto& [src_h, dst_h] : {std::pair{1024, 512}, {1100, 333}, {2000, 1999}, {1500, 4000}}) {
+    for (const auto& [src_h, dst_h] :
+         {std::pair{1024, 512}, {1100, 333}, {2000, 1999}, {1500, 4000}}) {
         const auto rows = static_cast<int32_t>(reference::band_height(src_h, dst_h));
         const auto bands = static_cast<int32_t>(reference::band_count(src_h, dst_h));
         auto yuv = first_yuv(rows, 64);

@@ -25,8 +25,8 @@ void letterbox_all_ways(ovrin_resize_target target, int32_t src_h, Random& rando
     GuardedBuffer<uint32_t> words(64);
     GuardedBuffer<uint8_t> bytes(96), words_at_start(64 * 4, Flush::kStart),
         bytes_at_start(96, Flush::kStart);
-    for (void* canvas : {static_cast<void*>(words.data()),
-                         static_cast<void*>(words_at_start.data())}) {
+    for (void* canvas :
+         {static_cast<void*>(words.data()), static_cast<void*>(words_at_start.data())}) {
         for (auto* resize : {ovrin_resize_rgba_keep_ratio_sg, ovrin_resize_rgba_keep_ratio_tps}) {
             ovrin_resize_target rewritten = target;
             rewritten.dst = canvas;

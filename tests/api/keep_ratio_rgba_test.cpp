@@ -40,8 +40,8 @@ int32_t memory_stride(const Way& way, const ovrin_resize_target& clipped, int32_
 
 // Draws random content between guard pages; compares canvas and target with the definition.
 // `source` is the picture that the definition samples, src_w x src_h what the call is told.
-void check(const Way& way, ovrin_resize_target target, int32_t src_w, int32_t src_h,
-           Random& random, Flush flush = Flush::kEnd) {
+void check(const Way& way, ovrin_resize_target target, int32_t src_w, int32_t src_h, Random& random,
+           Flush flush = Flush::kEnd) {
     SCOPED_TRACE(describe(target, src_w, src_h));
     ovrin_resize_target clipped = target;
     int32_t used_w = src_w;

@@ -157,7 +157,7 @@ TEST(Nearest, PositionsBeyond24BitsRoundToSinglePrecision) {
     constexpr int32_t kLong = (1 << 24) + 60000;
     GuardedBuffer<uint32_t> src(size_t{kLong} * 2);
     for (size_t i = 0; i < 60000; ++i) {
-        src[src.size() - 1 - i] = static_cast<uint32_t>(i + 1);        // row 1, or the last rows
+        src[src.size() - 1 - i] = static_cast<uint32_t>(i + 1);         // row 1, or the last rows
         src[size_t{kLong} - 1 - i] = static_cast<uint32_t>(i + 70000);  // row 0
     }
     for (const int32_t dst_length : {16793, 5001, 5600}) {

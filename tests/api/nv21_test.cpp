@@ -425,8 +425,8 @@ TEST(Nv21KeepRatio, TheCanvasAroundThePictureIsBlack) {
         // Chroma rows of 12 bytes; the picture's two pairs are bytes 4 to 7 of rows 1 and 2.
         const size_t row = i < 120 ? i / 12 : (i - 120) / 12;
         const size_t column = i % 12;
-        const bool inside = column >= 4 && column < 8 &&
-                            (i < 120 ? row >= 2 && row < 6 : row >= 1 && row < 3);
+        const bool inside =
+            column >= 4 && column < 8 && (i < 120 ? row >= 2 && row < 6 : row >= 1 && row < 3);
         EXPECT_EQ(canvas[i], inside ? 252 : i < 120 ? 0 : 128) << i;
     }
 }

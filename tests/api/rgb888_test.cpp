@@ -16,8 +16,10 @@ namespace {
 void check(const Sizes& s, Random& random, Flush flush) {
     SCOPED_TRACE(describe(s, flush));
     const GuardedPlane src(random, int64_t{s.src_w} * 3, s.src_h, int64_t{s.src_w} * 3, flush);
-    const auto expected = reference::quarter_packed(src.first(), s.src_w, s.src_h, s.dst_w, s.dst_h, 3);
-    GuardedBuffer<uint8_t> dst(expected.size(), flush, static_cast<uint8_t>(random.between(1, 255)));
+    const auto expected =
+        reference::quarter_packed(src.first(), s.src_w, s.src_h, s.dst_w, s.dst_h, 3);
+    GuardedBuffer<uint8_t> dst(expected.size(), flush,
+                               static_cast<uint8_t>(random.between(1, 255)));
     ovrin_resize_rgb888(src.first(), dst.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     ASSERT_TRUE(same_bytes(dst.data(), expected.data(), expected.size()));
     ASSERT_TRUE(dst.intact());

@@ -28,8 +28,8 @@ Sizes tall_sizes(Random& random) {
                          random.between(300, 1500), random.between(1500, 5000)})};
 }
 
-// A canvas which the picture fills, fits into or passes. It is at least `low` rows high, and as high
-// as the picture lies to the right: the drivers of planes would reject anything else.
+// A canvas which the picture fills, fits into or passes. It is at least `low` rows high, and as
+// high as the picture lies to the right: the drivers of planes would reject anything else.
 ovrin_resize_target around(Random& random, const Sizes& s, int32_t low) {
     const int32_t x = random.between(0, 5);
     const int32_t y = random.between(0, 5);
@@ -96,8 +96,8 @@ void check_keep_ratio_rgba(const Sizes& s, Random& random) {
 void check_yuv420(const Sizes& s, Random& random) {
     const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_i420(s.src_w, s.src_h)));
     Results results(bytes_of_i420(s.dst_w, s.dst_h));
-    results.expected = reference::resize_yuv(
-        reference::i420_source(src.data(), s.src_w, s.src_h), s.dst_w, s.dst_h);
+    results.expected = reference::resize_yuv(reference::i420_source(src.data(), s.src_w, s.src_h),
+                                             s.dst_w, s.dst_h);
     ovrin_resize_yuv420_sg(src.data(), results.single.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     ovrin_resize_yuv420_tps(src.data(), results.threaded.data(), s.src_w, s.src_h, s.dst_w,
                             s.dst_h);
@@ -135,8 +135,8 @@ void check_y_u_v_keep_ratio(const Sizes& s, Random& random) {
 void check_nv21(const Sizes& s, Random& random) {
     const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_nv21(s.src_w, s.src_h)));
     Results results(bytes_of_nv21(s.dst_w, s.dst_h));
-    results.expected = reference::resize_nv21(
-        reference::nv21_source(src.data(), s.src_w, s.src_h), s.dst_w, s.dst_h);
+    results.expected = reference::resize_nv21(reference::nv21_source(src.data(), s.src_w, s.src_h),
+                                              s.dst_w, s.dst_h);
     ovrin_resize_nv21_sg(src.data(), results.single.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     ovrin_resize_nv21_tps(src.data(), results.threaded.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     ASSERT_TRUE(results.agree());
@@ -175,7 +175,9 @@ struct Format {
     void (*check)(const Sizes&, Random&);
 };
 
-std::ostream& operator<<(std::ostream& out, const Format& format) { return out << format.name; }
+std::ostream& operator<<(std::ostream& out, const Format& format) {
+    return out << format.name;
+}
 
 class ThreadedFormats : public ::testing::TestWithParam<Format> {
 protected:

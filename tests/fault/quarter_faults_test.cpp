@@ -54,8 +54,8 @@ Bytes run_rgba(const Source& s, ovrin_resize_target target, bool threaded) {
     target.src_height = s.h;
     target.src_stride = s.w;
     target.dst = canvas.data();
-    (threaded ? ovrin_resize_rgba_keep_ratio_tps
-              : ovrin_resize_rgba_keep_ratio_sg)(s.bytes.data(), s.w, s.h, &target);
+    (threaded ? ovrin_resize_rgba_keep_ratio_tps : ovrin_resize_rgba_keep_ratio_sg)(
+        s.bytes.data(), s.w, s.h, &target);
     Bytes bytes(canvas.size() * 4);
     memcpy(bytes.data(), canvas.data(), bytes.size());
     return bytes;
@@ -63,8 +63,8 @@ Bytes run_rgba(const Source& s, ovrin_resize_target target, bool threaded) {
 
 Bytes run_yuv420(const Source& s, int32_t w, int32_t h, bool threaded) {
     Bytes dst(static_cast<size_t>(reference::i420_size(w, h)), kOld);
-    (threaded ? ovrin_resize_yuv420_tps
-              : ovrin_resize_yuv420_sg)(s.bytes.data(), dst.data(), s.w, s.h, w, h);
+    (threaded ? ovrin_resize_yuv420_tps : ovrin_resize_yuv420_sg)(s.bytes.data(), dst.data(), s.w,
+                                                                  s.h, w, h);
     return dst;
 }
 
@@ -90,8 +90,8 @@ Bytes run_y_u_v_on(const Source& s, ovrin_resize_target target, bool threaded) {
 
 Bytes run_nv21(const Source& s, int32_t w, int32_t h, bool threaded) {
     Bytes dst(static_cast<size_t>(reference::nv21_size(w, h)), kOld);
-    (threaded ? ovrin_resize_nv21_tps
-              : ovrin_resize_nv21_sg)(s.bytes.data(), dst.data(), s.w, s.h, w, h);
+    (threaded ? ovrin_resize_nv21_tps : ovrin_resize_nv21_sg)(s.bytes.data(), dst.data(), s.w, s.h,
+                                                              w, h);
     return dst;
 }
 

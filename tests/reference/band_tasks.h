@@ -89,8 +89,18 @@ void scan_rows(Walk walk, const Scan& scan, Add add) {
 
 inline void rgba_task(const ovrin_rgba_band& band, uint32_t* dst, int32_t row_pixels,
                       int32_t skip_before, int32_t skip_after) {
-    const Scan scan = {band.src + band.src_offset, band.rows_to_do, row_pixels * 4, band.src_w, 4,
-                       band.src_w, band.dst_w, band.src_h, band.dst_h, skip_before, skip_after, 1};
+    const Scan scan = {band.src + band.src_offset,
+                       band.rows_to_do,
+                       row_pixels * 4,
+                       band.src_w,
+                       4,
+                       band.src_w,
+                       band.dst_w,
+                       band.src_h,
+                       band.dst_h,
+                       skip_before,
+                       skip_after,
+                       1};
     scan_rows(start_walk(band, band.src_h), scan, [&](int32_t index, const uint8_t* sample) {
         for (int c = 0; c < 4; ++c) dst[index] += static_cast<uint32_t>(sample[c] >> 2) << (8 * c);
     });
@@ -110,8 +120,18 @@ template <class Band>
 void luma_task(const Band& band, int32_t row_bytes, uint8_t* target) {
     if (band.y_rows < 1) return;
     const int32_t gap = grid_side(band.dst_width) - band.dst_width;
-    const Scan scan = {band.src + band.src_y_offset, band.y_rows, row_bytes, band.src_width, 1,
-                       band.src_width, band.dst_width, band.src_height, band.dst_height, 0, gap, 1};
+    const Scan scan = {band.src + band.src_y_offset,
+                       band.y_rows,
+                       row_bytes,
+                       band.src_width,
+                       1,
+                       band.src_width,
+                       band.dst_width,
+                       band.src_height,
+                       band.dst_height,
+                       0,
+                       gap,
+                       1};
     scan_rows(start_luma(band, band.src_height), scan, [&](int32_t index, const uint8_t* sample) {
         target[index] = static_cast<uint8_t>(target[index] + (*sample >> 2));
     });
@@ -128,8 +148,18 @@ inline void yuv_chroma_task(const ovrin_yuv_band& band, const uint8_t* u, const 
     const int32_t ch = (grid_h + 1) >> 1;
     uint8_t* plane = target + grid_w * grid_h;
     for (const uint8_t* src : {u, v}) {
-        const Scan scan = {src + band.src_uv_offset, band.uv_rows, row_bytes, src_cw, 1,
-                           src_cw, cw, src_ch, ch, 0, 0, 1};
+        const Scan scan = {src + band.src_uv_offset,
+                           band.uv_rows,
+                           row_bytes,
+                           src_cw,
+                           1,
+                           src_cw,
+                           cw,
+                           src_ch,
+                           ch,
+                           0,
+                           0,
+                           1};
         scan_rows(start_chroma(band, band.src_height), scan,
                   [&](int32_t index, const uint8_t* sample) {
                       plane[index] = static_cast<uint8_t>(plane[index] + (*sample >> 2));
@@ -159,21 +189,20 @@ inline void nv21_chroma_task(const ovrin_nv21_band& band, const uint8_t* vu, int
     const int32_t grid_h = grid_side(band.dst_height);
     const int32_t src_row = (band.src_width + 1) & ~1;
     uint8_t* plane = target + grid_w * grid_h;
-    const Scan scan = {vu + band.src_vu_offset, band.vu_rows, row_bytes, src_row / 2, 2,
-                       src_row, (grid_w + 1) & ~1, src_ch, (grid_h + 1) >> 1, 0, 0, 2};
-    scan_rows(start_chroma(band, band.src_height), scan,
-              [&](int32_t index, const uint8_t* sample) {
-                  for (int b = 0; b < 2; ++b) {
-                      plane[index + b] =
-                          static_cast<uint8_t>(plane[index + b] + (sample[b] >> 2));
-                  }
-              });
+    const Scan scan = {
+        vu + band.src_vu_offset, band.vu_rows, row_bytes,         src_row / 2, 2, src_row,
+        (grid_w + 1) & ~1,       src_ch,       (grid_h + 1) >> 1, 0,           0, 2};
+    scan_rows(start_chroma(band, band.src_height), scan, [&](int32_t index, const uint8_t* sample) {
+        for (int b = 0; b < 2; ++b) {
+            plane[index + b] = static_cast<uint8_t>(plane[index + b] + (sample[b] >> 2));
+        }
+    });
 }
 
 inline void resize_nv21_tp(const ovrin_nv21_band& band, uint8_t* target) {
     luma_task(band, band.src_width, target);
-    nv21_chroma_task(band, band.src + band.src_width * band.src_height,
-                     (band.src_width + 1) & ~1, target);
+    nv21_chroma_task(band, band.src + band.src_width * band.src_height, (band.src_width + 1) & ~1,
+                     target);
 }
 
 inline void resize_y_nv21_tp(const ovrin_nv21_band& band, uint8_t* target) {

@@ -54,8 +54,8 @@ inline void pass_row(Walk& walk, const WalkSizes& sizes) {
 // ---- Records to walks and back. Points are not saved before the first row. ----
 
 inline Walk start_walk(const ovrin_rgba_band& band, int32_t src_h) {
-    Walk walk = {band.row_q1, band.row_q3, band.row_acc, band.di_11, band.di_13, band.di_31,
-                 band.di_33};
+    Walk walk = {band.row_q1, band.row_q3, band.row_acc, band.di_11,
+                 band.di_13,  band.di_31,  band.di_33};
     if (band.start_row == 0) {
         walk.top_point = src_h >> 2;
         walk.bottom_point = (3 * src_h) >> 2;

@@ -45,8 +45,7 @@ inline void copy_block(const std::vector<uint8_t>& block, int64_t block_row, int
         for (int64_t b = 0; b < bytes; ++b) {
             const int64_t to = start + r * canvas_row + b;
             if (to >= static_cast<int64_t>(canvas.size())) continue;
-            canvas.at(static_cast<size_t>(to)) =
-                block.at(static_cast<size_t>(r * block_row + b));
+            canvas.at(static_cast<size_t>(to)) = block.at(static_cast<size_t>(r * block_row + b));
         }
     }
 }

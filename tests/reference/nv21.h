@@ -15,23 +15,28 @@
 
 namespace reference {
 
-inline int64_t even_length(int64_t bytes) { return (bytes + 1) & ~int64_t{1}; }
+inline int64_t even_length(int64_t bytes) {
+    return (bytes + 1) & ~int64_t{1};
+}
 
-// Two planes; `stride` is the luma row length, chroma rows lie that length rounded up to even apart.
+// Two planes; `stride` is the luma row length, chroma rows lie that length rounded up to even
+// apart.
 struct Nv21Source {
     const uint8_t* y;
     const uint8_t* vu;
     int64_t width, height, stride;
 };
 
-inline int64_t nv21_size(int64_t w, int64_t h) { return w * h + even_length(w) * ((h + 1) >> 1); }
+inline int64_t nv21_size(int64_t w, int64_t h) {
+    return w * h + even_length(w) * ((h + 1) >> 1);
+}
 
 inline Nv21Source nv21_source(const uint8_t* src, int64_t width, int64_t height) {
     return {src, src + width * height, width, height, width};
 }
 
-// Chroma pairs, src_row bytes x src_rows scaled to dst_row bytes x dst_rows. Positions come from the
-// lengths in bytes and count pairs.
+// Chroma pairs, src_row bytes x src_rows scaled to dst_row bytes x dst_rows. Positions come from
+// the lengths in bytes and count pairs.
 inline std::vector<uint8_t> quarter_pairs(const uint8_t* src, int64_t stride, int64_t src_row,
                                           int64_t src_rows, int64_t dst_row, int64_t dst_rows) {
     std::vector<uint8_t> dst(static_cast<size_t>(dst_row * dst_rows));
@@ -43,9 +48,9 @@ inline std::vector<uint8_t> quarter_pairs(const uint8_t* src, int64_t stride, in
             const int64_t left = near_cell(pair, src_row, dst_row);
             const int64_t right = far_cell(pair, src_row, dst_row);
             for (int64_t b = 0; b < 2; ++b) {
-                dst[static_cast<size_t>(j * dst_row + 2 * pair + b)] = static_cast<uint8_t>(
-                    (row1[2 * left + b] >> 2) + (row1[2 * right + b] >> 2) +
-                    (row3[2 * left + b] >> 2) + (row3[2 * right + b] >> 2));
+                dst[static_cast<size_t>(j * dst_row + 2 * pair + b)] =
+                    static_cast<uint8_t>((row1[2 * left + b] >> 2) + (row1[2 * right + b] >> 2) +
+                                         (row3[2 * left + b] >> 2) + (row3[2 * right + b] >> 2));
             }
         }
     }
@@ -55,8 +60,8 @@ inline std::vector<uint8_t> quarter_pairs(const uint8_t* src, int64_t stride, in
 // The scaled picture: luma at its own size, chroma on half of the grid.
 struct Nv21Grids {
     std::vector<uint8_t> y, vu;
-    int64_t width, height;          // luma
-    int64_t chroma_row, chroma_h;   // chroma grid, bytes and rows
+    int64_t width, height;         // luma
+    int64_t chroma_row, chroma_h;  // chroma grid, bytes and rows
 
     Nv21Grids(const Nv21Source& src, int64_t w, int64_t h)
         : width(w), height(h), chroma_row(grid_length(w)), chroma_h(grid_length(h) / 2) {

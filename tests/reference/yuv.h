@@ -52,8 +52,8 @@ inline std::vector<uint8_t> quarter_plane(const uint8_t* src, int64_t stride, in
 // The scaled picture: luma at its own size, chroma on half of the grid.
 struct YuvGrids {
     std::vector<uint8_t> y, u, v;
-    int64_t width, height;        // luma
-    int64_t chroma_w, chroma_h;   // chroma grids
+    int64_t width, height;       // luma
+    int64_t chroma_w, chroma_h;  // chroma grids
 
     YuvGrids(const YuvSource& src, int64_t w, int64_t h)
         : width(w), height(h), chroma_w(grid_length(w) / 2), chroma_h(grid_length(h) / 2) {
@@ -92,7 +92,8 @@ inline void draw_yuv(const YuvSource& src, const ovrin_resize_target& target,
                int64_t{target.dst_y} * target.canvas_width + target.dst_x, target.canvas_width);
     const int64_t at = ((target.dst_y + 1) >> 1) * cw + ((target.dst_x + 1) >> 1);
     copy_block(grids.u, grids.chroma_w, (h + 1) >> 1, (w + 1) >> 1, canvas, luma + at, cw);
-    copy_block(grids.v, grids.chroma_w, (h + 1) >> 1, (w + 1) >> 1, canvas, luma + cw * ch + at, cw);
+    copy_block(grids.v, grids.chroma_w, (h + 1) >> 1, (w + 1) >> 1, canvas, luma + cw * ch + at,
+               cw);
 }
 
 // Letterboxing. `src.stride` is ignored: the target gives the row length, taken as it stands by the

@@ -13,7 +13,7 @@ namespace ovrin_test {
 template <class Band>
 struct Field {
     const char* name;
-    int32_t Band::* member;
+    int32_t Band::*member;
 };
 
 inline const std::vector<Field<ovrin_rgba_band>>& fields_of(const ovrin_rgba_band&) {
@@ -34,41 +34,67 @@ inline const std::vector<Field<ovrin_rgba_band>>& fields_of(const ovrin_rgba_ban
 
 inline const std::vector<Field<ovrin_yuv_band>>& fields_of(const ovrin_yuv_band&) {
     using B = ovrin_yuv_band;
-    static const std::vector<Field<B>> fields = {
-        {"y_start_row", &B::y_start_row},       {"y_top_point", &B::y_top_point},
-        {"y_bottom_point", &B::y_bottom_point}, {"y_row_base", &B::y_row_base},
-        {"y_top_left", &B::y_top_left},         {"y_top_right", &B::y_top_right},
-        {"y_bottom_left", &B::y_bottom_left},   {"y_bottom_right", &B::y_bottom_right},
-        {"uv_start_row", &B::uv_start_row},     {"uv_top_point", &B::uv_top_point},
-        {"uv_bottom_point", &B::uv_bottom_point}, {"uv_row_base", &B::uv_row_base},
-        {"uv_top_left", &B::uv_top_left},       {"uv_top_right", &B::uv_top_right},
-        {"uv_bottom_left", &B::uv_bottom_left}, {"uv_bottom_right", &B::uv_bottom_right},
-        {"src_width", &B::src_width},           {"src_height", &B::src_height},
-        {"src_row_bytes", &B::src_row_bytes},   {"src_rows", &B::src_rows},
-        {"dst_width", &B::dst_width},           {"dst_height", &B::dst_height},
-        {"band_rows", &B::band_rows},           {"src_y_offset", &B::src_y_offset},
-        {"src_uv_offset", &B::src_uv_offset},   {"y_rows", &B::y_rows},
-        {"uv_rows", &B::uv_rows},               {"done", &B::done}};
+    static const std::vector<Field<B>> fields = {{"y_start_row", &B::y_start_row},
+                                                 {"y_top_point", &B::y_top_point},
+                                                 {"y_bottom_point", &B::y_bottom_point},
+                                                 {"y_row_base", &B::y_row_base},
+                                                 {"y_top_left", &B::y_top_left},
+                                                 {"y_top_right", &B::y_top_right},
+                                                 {"y_bottom_left", &B::y_bottom_left},
+                                                 {"y_bottom_right", &B::y_bottom_right},
+                                                 {"uv_start_row", &B::uv_start_row},
+                                                 {"uv_top_point", &B::uv_top_point},
+                                                 {"uv_bottom_point", &B::uv_bottom_point},
+                                                 {"uv_row_base", &B::uv_row_base},
+                                                 {"uv_top_left", &B::uv_top_left},
+                                                 {"uv_top_right", &B::uv_top_right},
+                                                 {"uv_bottom_left", &B::uv_bottom_left},
+                                                 {"uv_bottom_right", &B::uv_bottom_right},
+                                                 {"src_width", &B::src_width},
+                                                 {"src_height", &B::src_height},
+                                                 {"src_row_bytes", &B::src_row_bytes},
+                                                 {"src_rows", &B::src_rows},
+                                                 {"dst_width", &B::dst_width},
+                                                 {"dst_height", &B::dst_height},
+                                                 {"band_rows", &B::band_rows},
+                                                 {"src_y_offset", &B::src_y_offset},
+                                                 {"src_uv_offset", &B::src_uv_offset},
+                                                 {"y_rows", &B::y_rows},
+                                                 {"uv_rows", &B::uv_rows},
+                                                 {"done", &B::done}};
     return fields;
 }
 
 inline const std::vector<Field<ovrin_nv21_band>>& fields_of(const ovrin_nv21_band&) {
     using B = ovrin_nv21_band;
-    static const std::vector<Field<B>> fields = {
-        {"y_start_row", &B::y_start_row},       {"y_top_point", &B::y_top_point},
-        {"y_bottom_point", &B::y_bottom_point}, {"y_row_base", &B::y_row_base},
-        {"y_top_left", &B::y_top_left},         {"y_top_right", &B::y_top_right},
-        {"y_bottom_left", &B::y_bottom_left},   {"y_bottom_right", &B::y_bottom_right},
-        {"vu_start_row", &B::vu_start_row},     {"vu_top_point", &B::vu_top_point},
-        {"vu_bottom_point", &B::vu_bottom_point}, {"vu_row_base", &B::vu_row_base},
-        {"vu_top_left", &B::vu_top_left},       {"vu_top_right", &B::vu_top_right},
-        {"vu_bottom_left", &B::vu_bottom_left}, {"vu_bottom_right", &B::vu_bottom_right},
-        {"src_width", &B::src_width},           {"src_height", &B::src_height},
-        {"src_row_bytes", &B::src_row_bytes},   {"src_rows", &B::src_rows},
-        {"dst_width", &B::dst_width},           {"dst_height", &B::dst_height},
-        {"band_rows", &B::band_rows},           {"src_y_offset", &B::src_y_offset},
-        {"src_vu_offset", &B::src_vu_offset},   {"y_rows", &B::y_rows},
-        {"vu_rows", &B::vu_rows},               {"done", &B::done}};
+    static const std::vector<Field<B>> fields = {{"y_start_row", &B::y_start_row},
+                                                 {"y_top_point", &B::y_top_point},
+                                                 {"y_bottom_point", &B::y_bottom_point},
+                                                 {"y_row_base", &B::y_row_base},
+                                                 {"y_top_left", &B::y_top_left},
+                                                 {"y_top_right", &B::y_top_right},
+                                                 {"y_bottom_left", &B::y_bottom_left},
+                                                 {"y_bottom_right", &B::y_bottom_right},
+                                                 {"vu_start_row", &B::vu_start_row},
+                                                 {"vu_top_point", &B::vu_top_point},
+                                                 {"vu_bottom_point", &B::vu_bottom_point},
+                                                 {"vu_row_base", &B::vu_row_base},
+                                                 {"vu_top_left", &B::vu_top_left},
+                                                 {"vu_top_right", &B::vu_top_right},
+                                                 {"vu_bottom_left", &B::vu_bottom_left},
+                                                 {"vu_bottom_right", &B::vu_bottom_right},
+                                                 {"src_width", &B::src_width},
+                                                 {"src_height", &B::src_height},
+                                                 {"src_row_bytes", &B::src_row_bytes},
+                                                 {"src_rows", &B::src_rows},
+                                                 {"dst_width", &B::dst_width},
+                                                 {"dst_height", &B::dst_height},
+                                                 {"band_rows", &B::band_rows},
+                                                 {"src_y_offset", &B::src_y_offset},
+                                                 {"src_vu_offset", &B::src_vu_offset},
+                                                 {"y_rows", &B::y_rows},
+                                                 {"vu_rows", &B::vu_rows},
+                                                 {"done", &B::done}};
     return fields;
 }
 
