@@ -158,7 +158,8 @@ OVRIN_API void _resize_rgba8888_tp(void* band);
  * proportion: dst_width becomes canvas_width - dst_x, and the source width becomes
  * (int)(target->src_width * ((double)new_dst_width / old_dst_width)); both are written back into
  * the target, likewise for heights. Keep target->src_width and src_height equal to the arguments:
- * they are what is cut.
+ * they are what is cut. A rectangle that a negative position puts outside the canvas's memory is
+ * not drawn.
  *
  * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
  * dst_y), or dst_height is 0. Threads as ovrin_resize_rgba8888, by src_h.
