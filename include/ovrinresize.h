@@ -32,13 +32,44 @@ extern "C" {
 #endif
 
 /*
+ * ---- Placing a picture in a larger canvas ------------------------------------------------------
+ */
+
+/*
+ * Where the keep-ratio functions and the bilinear engine find their source rows and put the scaled
+ * picture. The caller fills it. Only ovrin_resize_rgba8888_keep_ratio and the two functions behind
+ * it ever write it.
+ *
+ * dst_x and dst_y must not be negative.
+ */
+typedef struct ovrin_resize_target {
+    void* reserved_head;         /* the caller's; neither read nor written */
+    const uint8_t* src_vu_plane; /* source chroma pairs: bilinear engine, formats 18 and 19 */
+    const uint8_t* src_u_plane;  /* source U plane: bilinear engine, format 2 */
+    const uint8_t* src_v_plane;  /* source V plane: bilinear engine, format 2 */
+    int32_t src_width; /* source size, pixels; rewritten when an RGBA picture is clipped */
+    int32_t src_height;
+    int32_t src_stride;        /* source row length: pixels (RGBA8888), bytes (planes) */
+    int32_t src_buffer_height; /* rows in the source buffer */
+    int32_t format;            /* format code of the bilinear engine */
+    void* dst;                 /* the canvas: 32-bit pixels or planes */
+    int32_t dst_width;         /* size of the scaled picture, pixels; rewritten when an RGBA */
+    int32_t dst_height;        /* picture is clipped */
+    int32_t canvas_width;      /* size of the canvas, pixels */
+    int32_t canvas_height;
+    int32_t dst_x; /* canvas position of the picture's top left pixel */
+    int32_t dst_y;
+} ovrin_resize_target;
+
+/*
  * ---- RGBA8888: four bytes per pixel, in any channel order ------------------------------------
  *
  * The quarter-point downscaler. A destination pixel is the sum of four source pixels, taken one
  * quarter and three quarters of the way across its source cell in each direction; each byte is
  * shifted right by 2 before it is added:
  *
- *     row1 = (j * src_h + (src_h >> 2)) / dst_h      row3 = (j * src_h + ((3 * src_h) >> 2)) / dst_h
+ *     row1 = (j * src_h + (src_h >> 2)) / dst_h      row3 = (j * src_h + ((3 * src_h) >> 2)) /
+ * dst_h
  *
  * and columns likewise. The shift drops the two low bits of every sample, so 252 is the largest
  * result: a white source (255) gives 252. Enlarging is allowed; it repeats samples.
@@ -54,11 +85,11 @@ extern "C" {
  * With a source size of 0 or less the destination is filled with 0; with a destination size of 0
  * or less nothing is written.
  */
-OVRIN_API void ovrin_resize_rgba8888(const uint8_t *src, uint32_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_rgba8888(const uint8_t* src, uint32_t* dst, int32_t src_w,
                                      int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /* As ovrin_resize_rgba8888, on the calling thread whatever the height. */
-OVRIN_API void ovrin_resize_rgba8888_sg(const uint8_t *src, uint32_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_rgba8888_sg(const uint8_t* src, uint32_t* dst, int32_t src_w,
                                         int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /*
@@ -66,7 +97,7 @@ OVRIN_API void ovrin_resize_rgba8888_sg(const uint8_t *src, uint32_t *dst, int32
  * thread instead when the picture makes fewer than two bands, when its byte offsets do not fit the
  * band record, or when memory or threads are missing.
  */
-OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t *src, uint32_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int32_t src_w,
                                          int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /*
@@ -75,15 +106,16 @@ OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t *src, uint32_t *dst, int3
  * [i * dst_h, (i + 1) * dst_h).
  */
 typedef struct ovrin_rgba_band {
-    int32_t start_row; /* first source row of the band; 0: the running state below is at its start */
-    int32_t row_q1;    /* next pending one-quarter row point, scaled coordinates */
-    int32_t row_q3;    /* next pending three-quarter row point */
-    int32_t row_acc;   /* start_row * dst_h */
-    int32_t di_11;     /* next destination word for (one-quarter row, one-quarter column) */
-    int32_t di_13;     /* ... for (one-quarter row, three-quarter column) */
-    int32_t di_31;     /* ... for (three-quarter row, one-quarter column) */
-    int32_t di_33;     /* ... for (three-quarter row, three-quarter column) */
-    int32_t src_w;     /* source size, pixels */
+    int32_t
+        start_row;   /* first source row of the band; 0: the running state below is at its start */
+    int32_t row_q1;  /* next pending one-quarter row point, scaled coordinates */
+    int32_t row_q3;  /* next pending three-quarter row point */
+    int32_t row_acc; /* start_row * dst_h */
+    int32_t di_11;   /* next destination word for (one-quarter row, one-quarter column) */
+    int32_t di_13;   /* ... for (one-quarter row, three-quarter column) */
+    int32_t di_31;   /* ... for (three-quarter row, one-quarter column) */
+    int32_t di_33;   /* ... for (three-quarter row, three-quarter column) */
+    int32_t src_w;   /* source size, pixels */
     int32_t src_h;
     int32_t src_stride; /* source row length, pixels */
     int32_t src_rows;   /* rows in the source buffer */
@@ -93,8 +125,8 @@ typedef struct ovrin_rgba_band {
     int32_t dst_skip;   /* canvas pixels to the right of the picture; 0 without a canvas */
     int32_t band_rows;  /* source rows in a band */
     int32_t src_offset; /* byte offset of the band's first source row from src */
-    const uint8_t *src; /* the whole source picture */
-    uint32_t *dst;      /* the whole destination picture */
+    const uint8_t* src; /* the whole source picture */
+    uint32_t* dst;      /* the whole destination picture */
     int32_t rows_to_do; /* source rows that this band processes */
     int32_t done;       /* 0 until the band's task has finished, then 1 (stored with release) */
 } ovrin_rgba_band;
@@ -105,14 +137,273 @@ typedef struct ovrin_rgba_band {
  * adds their bytes to src_offset. Writes no other field.
  */
 OVRIN_API void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w,
-                                             int32_t dst_h, ovrin_rgba_band *band);
+                                             int32_t dst_h, ovrin_rgba_band* band);
 
 /*
  * Band task; band points to an ovrin_rgba_band. Adds the samples of rows_to_do source rows to what
  * the destination holds (the caller clears it beforehand), then sets done. Bands that add into one
  * destination row must not run at the same time.
  */
-OVRIN_API void _resize_rgba8888_tp(void *band);
+OVRIN_API void _resize_rgba8888_tp(void* band);
+
+/*
+ * ---- RGBA8888 in a canvas ----------------------------------------------------------------------
+ */
+
+/*
+ * Fills the target's canvas with 0 and resizes src into the rectangle dst_width x dst_height at
+ * (dst_x, dst_y). src_w x src_h is the source size; its rows lie target->src_stride pixels apart.
+ *
+ * A rectangle that passes the canvas's right or lower edge is cut there, and the source is cut in
+ * proportion: dst_width becomes canvas_width - dst_x, and the source width becomes
+ * (int)(target->src_width * ((double)new_dst_width / old_dst_width)); both are written back into
+ * the target, likewise for heights. Keep target->src_width and src_height equal to the arguments:
+ * they are what is cut.
+ *
+ * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
+ * dst_y), or dst_height is 0. Threads as ovrin_resize_rgba8888, by src_h.
+ */
+OVRIN_API void ovrin_resize_rgba8888_keep_ratio(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                                ovrin_resize_target* target);
+
+/* On the calling thread. A src_stride of 0 samples the first row for every destination row. */
+OVRIN_API void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                               ovrin_resize_target* target);
+
+/*
+ * In bands. Returns at once when target is null. A src_stride of 0 or less counts as the source
+ * width here. Falls back to the calling thread as ovrin_resize_rgba8888_tps does.
+ */
+OVRIN_API void ovrin_resize_rgba_keep_ratio_tps(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                                ovrin_resize_target* target);
+
+/*
+ * As ovrin_resize_rgba8888_get_pos, for a picture in a canvas: destination indices count canvas
+ * words from canvas row dst_y, without dst_x; source rows lie band->src_stride pixels apart.
+ * canvas_h is not used.
+ */
+OVRIN_API void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t src_w, int32_t src_h, int32_t dst_w,
+                                                        int32_t dst_h, int32_t canvas_w,
+                                                        int32_t canvas_h, ovrin_rgba_band* band);
+
+/* As _resize_rgba8888_tp, for a picture in a canvas: band->dst is the first word of row dst_y. */
+OVRIN_API void _resize_rgba8888_keep_ratio_tp(void* band);
+
+/*
+ * ---- RGB888 and nearest neighbour --------------------------------------------------------------
+ */
+
+/*
+ * As ovrin_resize_rgba8888_sg with three bytes per pixel, in any channel order; always on the
+ * calling thread.
+ */
+OVRIN_API void ovrin_resize_rgb888(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                   int32_t dst_w, int32_t dst_h);
+
+/*
+ * Copies one source pixel per destination pixel, on the calling thread. The step between samples is
+ * a whole number, the ratio rounded to the nearest (sx = (int)(src_w / dst_w + 0.5)); the first
+ * sample lies half a step in, rounded up. Samples beyond the source are dropped, not clamped: what
+ * is written to a row closes up to its left, and the rest of the destination keeps its contents.
+ *
+ * Returns without writing when a pointer is null or a size is 0 or less.
+ */
+OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst, int32_t src_w,
+                                             int32_t src_h, int32_t dst_w, int32_t dst_h);
+
+/*
+ * ---- 4:2:0 pictures: planar YUV and NV21 -------------------------------------------------------
+ *
+ * A picture of w x h pixels has w * h bytes of luma, then its chroma at half the size in either
+ * direction, rounded up:
+ *
+ *     I420   a plane of U, then a plane of V, each (h + 1) >> 1 rows of (w + 1) >> 1 bytes
+ *     NV21   one plane of (h + 1) >> 1 rows of (w + 1) >> 1 pairs, V before U
+ *
+ * Both are resized as RGBA8888 is, byte by byte. Chroma is sampled for the destination size rounded
+ * up to multiples of 4 in each direction, and then cut to its own size: where the destination's
+ * width or height is not a multiple of 4, the chroma that is kept covers a little less of the
+ * source than the luma. Such sizes need a work buffer of 2 * width * height bytes, both rounded up;
+ * without memory for it nothing is written. A destination size of 0 or less writes nothing; a
+ * source size of 0 or less fills the destination with 0, chroma included.
+ *
+ * The keep-ratio forms paint the target's canvas black (luma 0, chroma 128) and place the picture,
+ * scaled to dst_width x dst_height, at (dst_x, dst_y). What does not fit into the canvas is cut
+ * off, not rescaled. Chroma goes to half the position rounded up, so with an odd dst_x or dst_y it
+ * lies one pixel further right or down than the luma; chroma that would pass the end of the canvas
+ * is dropped. Source luma rows lie target->src_stride bytes apart, chroma rows half as many
+ * samples, rounded up. The target is never written. Nothing is touched if canvas_width < dst_x,
+ * canvas_height < dst_y or dst_height is 0.
+ *
+ * Wrappers and drivers divide the work as for RGBA8888.
+ */
+
+/* I420 to I420, contiguous buffers. */
+OVRIN_API void ovrin_resize_yuv420(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                   int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_yuv420_sg(const uint8_t* src, uint8_t* dst, int32_t src_w,
+                                      int32_t src_h, int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_yuv420_tps(const uint8_t* src, uint8_t* dst, int32_t src_w,
+                                       int32_t src_h, int32_t dst_w, int32_t dst_h);
+
+/* Three source planes to a contiguous I420 buffer. */
+OVRIN_API void ovrin_resize_y_u_v(const uint8_t* src_y, const uint8_t* src_u, const uint8_t* src_v,
+                                  uint8_t* dst, int32_t src_w, int32_t src_h, int32_t dst_w,
+                                  int32_t dst_h);
+
+/* Three source planes into an I420 canvas. */
+OVRIN_API void ovrin_resize_y_u_v_keep_ratio(const uint8_t* src_y, const uint8_t* src_u,
+                                             const uint8_t* src_v, int32_t src_w, int32_t src_h,
+                                             const ovrin_resize_target* target);
+
+/*
+ * Both of these: a null target selects the contiguous destination; otherwise dst, dst_w and dst_h
+ * are ignored.
+ *
+ * The driver runs on the calling thread below 1024 source rows. With a target it takes a src_stride
+ * of 0 or less for src_w, and its second test compares canvas_height with dst_x, not dst_y: a
+ * picture that starts below the canvas gives a black canvas.
+ */
+OVRIN_API void ovrin_resize_y_u_v_sg(const uint8_t* src_y, const uint8_t* src_u,
+                                     const uint8_t* src_v, uint8_t* dst, int32_t src_w,
+                                     int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                     const ovrin_resize_target* target);
+OVRIN_API void ovrin_resize_y_u_v_tps(const uint8_t* src_y, const uint8_t* src_u,
+                                      const uint8_t* src_v, uint8_t* dst, int32_t src_w,
+                                      int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                      const ovrin_resize_target* target);
+
+/*
+ * One band of a planar picture. Points, bases and indices as in ovrin_rgba_band, once for luma and
+ * once for the two chroma planes together; indices count bytes from the start of the plane in the
+ * work buffer or destination. "Top" is the quarter point of a destination row, "left" that of a
+ * column.
+ */
+typedef struct ovrin_yuv_band {
+    int32_t y_start_row; /* luma rows before this band; 0: the points below are not set yet */
+    int32_t y_top_point;
+    int32_t y_bottom_point;
+    int32_t y_row_base;
+    int32_t y_top_left;
+    int32_t y_top_right;
+    int32_t y_bottom_left;
+    int32_t y_bottom_right;
+    int32_t uv_start_row; /* chroma rows before this band; 0: the points below are not set yet */
+    int32_t uv_top_point;
+    int32_t uv_bottom_point;
+    int32_t uv_row_base;
+    int32_t uv_top_left;
+    int32_t uv_top_right;
+    int32_t uv_bottom_left;
+    int32_t uv_bottom_right;
+    int32_t src_width; /* source size, pixels */
+    int32_t src_height;
+    int32_t src_row_bytes; /* from one source luma row to the next */
+    int32_t src_rows;      /* rows in the source buffer */
+    int32_t dst_width;     /* size of the scaled picture, pixels */
+    int32_t dst_height;
+    int32_t band_rows;     /* luma rows in a band */
+    int32_t src_y_offset;  /* bytes from the luma plane to the band's first row */
+    int32_t src_uv_offset; /* bytes from either chroma plane to the band's first row */
+    const uint8_t* src;    /* the whole source buffer, or its luma plane */
+    uint8_t* dst;          /* the destination buffer, or the canvas */
+    const uint8_t* src_u;  /* chroma planes of a source in three planes */
+    const uint8_t* src_v;
+    uint8_t* work;   /* work buffer shared by all bands; null when dst takes the samples itself */
+    int32_t y_rows;  /* luma rows that this band processes */
+    int32_t uv_rows; /* chroma rows that this band processes */
+    int32_t done;    /* 0 until the band's task has finished, then 1 (stored with release) */
+} ovrin_yuv_band;
+
+/*
+ * Moves a band record to the following band without touching pixels, and sets y_rows and uv_rows to
+ * the rows of the band just walked. A band has band_rows luma rows; its chroma is a quarter of
+ * that, rounded up, and then as many rows more as it takes to complete a destination row. Luma rows
+ * beyond the source give y_rows 0, chroma rows beyond it are cut off. src_width is not used.
+ */
+OVRIN_API void ovrin_resize_yuv420_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
+                                           int32_t dst_height, ovrin_yuv_band* band);
+
+/*
+ * Band tasks; band points to an ovrin_yuv_band. They add to what the work buffer or destination
+ * holds, then set done; where a work buffer is needed and missing they only set done. The first
+ * reads three planes and prefers the work buffer whenever there is one; the second reads one
+ * contiguous buffer.
+ */
+OVRIN_API void _resize_y_u_v_tp(void* band);
+OVRIN_API void _resize_yuv420_tp(void* band);
+
+/* NV21 to NV21, contiguous buffers. */
+OVRIN_API void ovrin_resize_nv21(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                 int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_nv21_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                    int32_t dst_w, int32_t dst_h);
+OVRIN_API void ovrin_resize_nv21_tps(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                     int32_t dst_w, int32_t dst_h);
+
+/* Luma and chroma plane apart, to a contiguous NV21 buffer. */
+OVRIN_API void ovrin_resize_y_nv21(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
+                                   int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h);
+
+/* Luma and chroma plane apart, into an NV21 canvas. */
+OVRIN_API void ovrin_resize_y_nv21_keep_ratio(const uint8_t* src_y, const uint8_t* src_vu,
+                                              int32_t src_w, int32_t src_h,
+                                              const ovrin_resize_target* target);
+
+/* As ovrin_resize_y_u_v_sg and ovrin_resize_y_u_v_tps, for NV21. */
+OVRIN_API void ovrin_resize_y_nv_sg(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
+                                    int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                    const ovrin_resize_target* target);
+OVRIN_API void ovrin_resize_y_nv_tps(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
+                                     int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
+                                     const ovrin_resize_target* target);
+
+/* One band of an NV21 picture; as ovrin_yuv_band, with one plane of chroma pairs. */
+typedef struct ovrin_nv21_band {
+    int32_t y_start_row;
+    int32_t y_top_point;
+    int32_t y_bottom_point;
+    int32_t y_row_base;
+    int32_t y_top_left;
+    int32_t y_top_right;
+    int32_t y_bottom_left;
+    int32_t y_bottom_right;
+    int32_t vu_start_row;
+    int32_t vu_top_point;
+    int32_t vu_bottom_point;
+    int32_t vu_row_base;
+    int32_t vu_top_left;
+    int32_t vu_top_right;
+    int32_t vu_bottom_left;
+    int32_t vu_bottom_right;
+    int32_t src_width;
+    int32_t src_height;
+    int32_t src_row_bytes;
+    int32_t src_rows;
+    int32_t dst_width;
+    int32_t dst_height;
+    int32_t band_rows;
+    int32_t src_y_offset;
+    int32_t src_vu_offset;
+    const uint8_t* src;
+    uint8_t* dst;
+    const uint8_t* src_vu; /* chroma plane of a source in two planes */
+    uint8_t* work;
+    int32_t y_rows;
+    int32_t vu_rows;
+    int32_t done;
+} ovrin_nv21_band;
+
+/*
+ * As ovrin_resize_yuv420_get_pos, except that a chroma band which does not end on a destination row
+ * takes all chroma rows that are left, and the bands after it get none.
+ */
+OVRIN_API void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
+                                         int32_t dst_height, ovrin_nv21_band* band);
+
+/* Band tasks; band points to an ovrin_nv21_band. As _resize_yuv420_tp and _resize_y_u_v_tp. */
+OVRIN_API void _resize_nv21_tp(void* band);
+OVRIN_API void _resize_y_nv21_tp(void* band);
 
 /*
  * ---- Thread pool -----------------------------------------------------------------------------
@@ -124,67 +415,68 @@ OVRIN_API void _resize_rgba8888_tp(void *band);
 #define OVRIN_THREADPOOL_CAPACITY 2000
 
 typedef struct ovrin_threadpool_queue {
-    uint32_t head;  /* index of the oldest entry */
-    uint32_t tail;  /* index where the next entry goes */
-    uint32_t count; /* number of entries held */
-    void *entries[OVRIN_THREADPOOL_CAPACITY]; /* the ring; null where empty */
+    uint32_t head;                            /* index of the oldest entry */
+    uint32_t tail;                            /* index where the next entry goes */
+    uint32_t count;                           /* number of entries held */
+    void* entries[OVRIN_THREADPOOL_CAPACITY]; /* the ring; null where empty */
 } ovrin_threadpool_queue;
 
 typedef struct ovrin_threadpool_task {
-    void (*function)(void *);
-    void *argument;
+    void (*function)(void*);
+    void* argument;
 } ovrin_threadpool_task;
 
 typedef struct ovrin_threadpool {
-    ovrin_threadpool_queue pending;    /* tasks waiting to be run */
-    ovrin_threadpool_queue free_slots; /* slots available for new tasks */
+    ovrin_threadpool_queue pending;                         /* tasks waiting to be run */
+    ovrin_threadpool_queue free_slots;                      /* slots available for new tasks */
     ovrin_threadpool_task tasks[OVRIN_THREADPOOL_CAPACITY]; /* the slots; queues point into them */
-    uint16_t thread_count;       /* workers started */
-    uint16_t stop;               /* 1 once teardown has begun */
-    pthread_t *threads;          /* one handle per worker */
-    pthread_mutex_t free_lock;   /* guards free_slots */
-    pthread_mutex_t pending_lock; /* guards pending */
-    pthread_cond_t slot_freed;   /* submitters wait here; broadcast when free_slots gets its first entry */
-    pthread_cond_t task_ready;   /* workers wait here; broadcast when pending gets its first entry */
+    uint16_t thread_count;                                  /* workers started */
+    uint16_t stop;                                          /* 1 once teardown has begun */
+    pthread_t* threads;                                     /* one handle per worker */
+    pthread_mutex_t free_lock;                              /* guards free_slots */
+    pthread_mutex_t pending_lock;                           /* guards pending */
+    pthread_cond_t
+        slot_freed; /* submitters wait here; broadcast when free_slots gets its first entry */
+    pthread_cond_t task_ready; /* workers wait here; broadcast when pending gets its first entry */
 } ovrin_threadpool;
 
 /*
  * Makes a pool of n worker threads. With n below 1 the pool has no workers: tasks are kept, not
  * run. Null when memory or a thread is missing, or when n is above 65535.
  */
-OVRIN_API ovrin_threadpool *ovrin_threadpool_init(int32_t n);
+OVRIN_API ovrin_threadpool* ovrin_threadpool_init(int32_t n);
 
 /*
  * Queues function(argument). With wait non-zero it blocks while no slot is free.
  * Returns 1 when queued, -2 when no slot is free and wait is 0, -1 on error (a null pool included).
  */
-OVRIN_API int32_t ovrin_threadpool_add_task(ovrin_threadpool *pool, void (*function)(void *),
-                                            void *argument, int32_t wait);
+OVRIN_API int32_t ovrin_threadpool_add_task(ovrin_threadpool* pool, void (*function)(void*),
+                                            void* argument, int32_t wait);
 
 /*
  * Ends the pool; tasks that are queued still run. With sync non-zero the call returns when all
  * have run and the pool is released; with 0 a thread of its own does that in the background. The
  * pool must not be null and must not be used afterwards.
  */
-OVRIN_API void ovrin_threadpool_free(ovrin_threadpool *pool, int32_t sync);
+OVRIN_API void ovrin_threadpool_free(ovrin_threadpool* pool, int32_t sync);
 
 /* Blocks until a task is queued and returns its slot; null once the pool stops and is empty. */
-OVRIN_API ovrin_threadpool_task *ovrin_threadpool_task_get_task(ovrin_threadpool *pool);
+OVRIN_API ovrin_threadpool_task* ovrin_threadpool_task_get_task(ovrin_threadpool* pool);
 
 /* Clears a slot. */
-OVRIN_API void ovrin_threadpool_task_init(ovrin_threadpool_task *task);
+OVRIN_API void ovrin_threadpool_task_init(ovrin_threadpool_task* task);
 
 /* Appends entry. Returns 0, or -1 when the queue is full or its next position is occupied. */
-OVRIN_API int32_t ovrin_threadpool_queue_enqueue(ovrin_threadpool_queue *queue, void *entry);
+OVRIN_API int32_t ovrin_threadpool_queue_enqueue(ovrin_threadpool_queue* queue, void* entry);
 
 /* Takes the oldest entry; null when the queue is null or empty. */
-OVRIN_API void *ovrin_threadpool_queue_dequeue(ovrin_threadpool_queue *queue);
+OVRIN_API void* ovrin_threadpool_queue_dequeue(ovrin_threadpool_queue* queue);
 
 /* 1 when the queue holds nothing, otherwise 0. */
-OVRIN_API int32_t ovrin_threadpool_queue_is_empty(const ovrin_threadpool_queue *queue);
+OVRIN_API int32_t ovrin_threadpool_queue_is_empty(const ovrin_threadpool_queue* queue);
 
 /* The number of entries held. */
-OVRIN_API uint32_t ovrin_threadpool_queue_getsize(const ovrin_threadpool_queue *queue);
+OVRIN_API uint32_t ovrin_threadpool_queue_getsize(const ovrin_threadpool_queue* queue);
 
 /* ---- Utility --------------------------------------------------------------------------------- */
 

@@ -8,11 +8,11 @@ namespace ovrin {
 // A band on its way through the pool.
 struct BandJob {
     void (*task)(void*);
-    void* band;             // the task's argument, a band record
-    const int32_t* done;    // the record's flag, set by the task
-    bool shares_row;        // this band and the one before it add into one destination row
-    bool skip;              // nothing is left for this band
-    int32_t claimed;        // 1 once a thread has taken the band on
+    void* band;           // the task's argument, a band record
+    const int32_t* done;  // the record's flag, set by the task
+    bool shares_row;      // this band and the one before it add into one destination row
+    bool skip;            // nothing is left for this band
+    int32_t claimed;      // 1 once a thread has taken the band on
 };
 
 // Runs every band exactly once, so that no two bands that add into one destination row run at the

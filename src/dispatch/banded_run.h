@@ -60,12 +60,9 @@ private:
         const int32_t last = count_ - 1;
         const bool rest = Format::take_rest(bands_[last], bands_[last - 1]);
         for (int32_t i = 0; i < count_; ++i) {
-            jobs_[i] = {Format::task,
-                        &bands_[i],
-                        &bands_[i].done,
-                        i > 0 && Format::shares_row(bands_[i]),
-                        i == last && !rest,
-                        0};
+            jobs_[i] = {Format::task,       &bands_[i],
+                        &bands_[i].done,    i > 0 && Format::shares_row(bands_[i]),
+                        i == last && !rest, 0};
         }
     }
 

@@ -4,11 +4,60 @@
 
 #include "dispatch/band_size.h"
 
-using ovrin::kThreadedRows;
+namespace {
+
+template <class Function>
+Function* choose(int32_t src_h, Function* single, Function* threaded) {
+    return src_h < ovrin::kThreadedRows ? single : threaded;
+}
+
+}  // namespace
 
 void ovrin_resize_rgba8888(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
                            int32_t dst_w, int32_t dst_h) {
-    const auto resize =
-        src_h < kThreadedRows ? ovrin_resize_rgba8888_sg : ovrin_resize_rgba8888_tps;
-    resize(src, dst, src_w, src_h, dst_w, dst_h);
+    choose(src_h, ovrin_resize_rgba8888_sg, ovrin_resize_rgba8888_tps)(src, dst, src_w, src_h,
+                                                                       dst_w, dst_h);
+}
+
+void ovrin_resize_rgba8888_keep_ratio(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                      ovrin_resize_target* target) {
+    choose(src_h, ovrin_resize_rgba_keep_ratio_sg, ovrin_resize_rgba_keep_ratio_tps)(src, src_w,
+                                                                                     src_h, target);
+}
+
+void ovrin_resize_yuv420(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                         int32_t dst_w, int32_t dst_h) {
+    choose(src_h, ovrin_resize_yuv420_sg, ovrin_resize_yuv420_tps)(src, dst, src_w, src_h, dst_w,
+                                                                   dst_h);
+}
+
+void ovrin_resize_y_u_v(const uint8_t* src_y, const uint8_t* src_u, const uint8_t* src_v,
+                        uint8_t* dst, int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h) {
+    choose(src_h, ovrin_resize_y_u_v_sg, ovrin_resize_y_u_v_tps)(src_y, src_u, src_v, dst, src_w,
+                                                                 src_h, dst_w, dst_h, nullptr);
+}
+
+void ovrin_resize_y_u_v_keep_ratio(const uint8_t* src_y, const uint8_t* src_u, const uint8_t* src_v,
+                                   int32_t src_w, int32_t src_h,
+                                   const ovrin_resize_target* target) {
+    choose(src_h, ovrin_resize_y_u_v_sg, ovrin_resize_y_u_v_tps)(src_y, src_u, src_v, nullptr,
+                                                                 src_w, src_h, 0, 0, target);
+}
+
+void ovrin_resize_nv21(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                       int32_t dst_w, int32_t dst_h) {
+    choose(src_h, ovrin_resize_nv21_sg, ovrin_resize_nv21_tps)(src, dst, src_w, src_h, dst_w,
+                                                               dst_h);
+}
+
+void ovrin_resize_y_nv21(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst, int32_t src_w,
+                         int32_t src_h, int32_t dst_w, int32_t dst_h) {
+    choose(src_h, ovrin_resize_y_nv_sg, ovrin_resize_y_nv_tps)(src_y, src_vu, dst, src_w, src_h,
+                                                               dst_w, dst_h, nullptr);
+}
+
+void ovrin_resize_y_nv21_keep_ratio(const uint8_t* src_y, const uint8_t* src_vu, int32_t src_w,
+                                    int32_t src_h, const ovrin_resize_target* target) {
+    choose(src_h, ovrin_resize_y_nv_sg, ovrin_resize_y_nv_tps)(src_y, src_vu, nullptr, src_w, src_h,
+                                                               0, 0, target);
 }

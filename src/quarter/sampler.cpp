@@ -9,7 +9,8 @@ namespace ovrin {
 
 namespace {
 
-using PairKernel = decltype(QuarterKernels::store_pair);
+// Whether target rows are stored or added to what is there.
+enum class Write { kStore, kAdd };
 
 // Where the next samples of a source row go: those of the left columns and those of the right ones.
 struct RowTarget {
@@ -42,29 +43,72 @@ struct RowScan {
     }
 };
 
-ColumnPlan plan_strip(QuarterPoints& left, QuarterPoints& right, int32_t count) {
-    ColumnPlan columns;
-    columns.count = count;
-    for (int32_t i = 0; i < count; ++i, left.next(), right.next()) {
-        columns.left[i] = static_cast<int32_t>(left.cell());
-        columns.right[i] = static_cast<int32_t>(right.cell());
+// The columns of a row from some target sample on.
+struct Columns {
+    QuarterPoints left;
+    QuarterPoints right;
+
+    Tap next() {
+        const Tap tap = {static_cast<int32_t>(left.cell()), static_cast<int32_t>(right.cell())};
+        left.next();
+        right.next();
+        return tap;
     }
-    return columns;
+};
+
+// One strip of the plane: its columns, planned, and where they start.
+struct Strip {
+    const QuarterKernels& kernels;
+    const QuarterPlan& plan;
+    Columns columns;
+    Write write;
+};
+
+// Plans as many of the columns as one strip takes.
+const QuarterKernels& plan_strip(const QuarterPlane& plane, int32_t samples_left, Columns& columns,
+                                 QuarterPlan& plan) {
+    const QuarterKernels& strip_kernels = kernels().begin_quarter_plan(
+        plan, {plane.sample_bytes, plane.src_samples, plane.src_columns, plane.dst_columns});
+    const int32_t samples = samples_left < plan.capacity ? samples_left : plan.capacity;
+    Tap taps[kTapBlock];
+    for (int32_t planned = 0; planned < samples;) {
+        const int32_t rest = samples - planned;
+        const int32_t count = rest < kTapBlock ? rest : kTapBlock;
+        for (int32_t i = 0; i < count; ++i) taps[i] = columns.next();
+        strip_kernels.append(plan, taps, count);
+        planned += count;
+    }
+    return strip_kernels;
 }
 
-void add_row(const QuarterKernels& kernel, const RowTarget& target, const uint8_t* row,
-             const ColumnPlan& columns) {
-    kernel.add_taps(target.left, row, columns.left, columns.count);
-    kernel.add_taps(target.right, row, columns.right, columns.count);
+void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const QuarterPlan& plan) {
+    for (int32_t i = 0; i < plan.samples; ++i, points.next()) {
+        const uint8_t* sample = row + points.cell() * plan.sample_bytes;
+        for (int32_t c = 0; c < plan.sample_bytes; ++c, ++dst) {
+            *dst = static_cast<uint8_t>(*dst + (sample[c] >> 2));
+        }
+    }
+}
+
+void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
+    if (target.left == target.right) {
+        strip.kernels.add_row(target.left, row, strip.plan);
+        return;
+    }
+    // Only a record that no walk has made sends the columns' samples to two places.
+    add_taps(target.left, row, strip.columns.left, strip.plan);
+    add_taps(target.right, row, strip.columns.right, strip.plan);
 }
 
 // A target row whose two source rows both lie in the scan is done in one go. Bands also hold halves
-// of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies behind.
-void scan_strip(const QuarterPlane& plane, RowScan scan, const QuarterKernels& kernel,
-                PairKernel pair, const ColumnPlan& columns) {
+// of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
+// behind.
+void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     const auto row = [&](const QuarterPoints& points) {
         return plane.src + points.cell() * plane.src_pitch;
     };
+    const auto pair =
+        strip.write == Write::kStore ? strip.kernels.store_pair : strip.kernels.add_pair;
     while (scan.has_top() || scan.has_bottom()) {
         const bool both = scan.has_pair();
         // On one source row the bottom half goes first: it closes the row that is open.
@@ -72,11 +116,11 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const QuarterKernels& k
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            pair(scan.top_target.left, row(scan.top), row(scan.bottom), columns);
+            pair(scan.top_target.left, row(scan.top), row(scan.bottom), strip.plan);
         } else if (take_top) {
-            add_row(kernel, scan.top_target, row(scan.top), columns);
+            add_row(strip, scan.top_target, row(scan.top));
         } else {
-            add_row(kernel, scan.bottom_target, row(scan.bottom), columns);
+            add_row(strip, scan.bottom_target, row(scan.bottom));
         }
         if (take_top) {
             scan.top.next();
@@ -89,25 +133,25 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const QuarterKernels& k
     }
 }
 
-void scan_plane(const QuarterPlane& plane, RowScan scan, const QuarterKernels& kernel,
-                PairKernel pair) {
-    QuarterPoints left(quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns);
-    QuarterPoints right(three_quarter_point(plane.src_columns), plane.src_columns,
-                        plane.dst_columns);
-    for (int32_t done = 0; done < plane.samples;) {
-        const int32_t rest = plane.samples - done;
-        const int32_t count = rest < kStripColumns ? rest : kStripColumns;
-        const ColumnPlan columns = plan_strip(left, right, count);
-        scan_strip(plane, scan, kernel, pair, columns);
-        const ptrdiff_t strip_bytes = ptrdiff_t{count} * plane.sample_bytes;
+void scan_plane(const QuarterPlane& plane, RowScan scan, Write write) {
+    Columns columns = {
+        {quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns},
+        {three_quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns}};
+    QuarterPlan plan;
+    for (int32_t done = 0; done < plane.samples; done += plan.samples) {
+        const Columns first = columns;
+        const QuarterKernels& strip_kernels =
+            plan_strip(plane, plane.samples - done, columns, plan);
+        scan_strip(plane, scan, {strip_kernels, plan, first, write});
+        const ptrdiff_t strip_bytes = ptrdiff_t{plan.samples} * plane.sample_bytes;
         scan.top_target.move(strip_bytes);
         scan.bottom_target.move(strip_bytes);
-        done += count;
     }
 }
 
 void clear_plane(const QuarterPlane& plane) {
-    const size_t row_bytes = static_cast<size_t>(plane.samples) * static_cast<size_t>(plane.sample_bytes);
+    const size_t row_bytes =
+        static_cast<size_t>(plane.samples) * static_cast<size_t>(plane.sample_bytes);
     uint8_t* row = plane.dst;
     for (int32_t j = 0; j < plane.dst_rows; ++j, row += plane.dst_pitch) memset(row, 0, row_bytes);
 }
@@ -128,8 +172,7 @@ void sample_plane(const QuarterPlane& plane) {
         target,
         plane.src_rows,
     };
-    const QuarterKernels& kernel = kernels().quarter[plane.sample_bytes - 1];
-    scan_plane(plane, scan, kernel, kernel.store_pair);
+    scan_plane(plane, scan, Write::kStore);
 }
 
 void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
@@ -144,8 +187,7 @@ void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
         {at(state.bottom_left), at(state.bottom_right)},
         rows,
     };
-    const QuarterKernels& kernel = kernels().quarter[plane.sample_bytes - 1];
-    scan_plane(plane, scan, kernel, kernel.add_pair);
+    scan_plane(plane, scan, Write::kAdd);
 }
 
 }  // namespace ovrin

@@ -13,16 +13,17 @@ namespace ovrin {
 // One plane to sample. The extents set the ratio of either axis in any unit that both sides share;
 // interleaved chroma counts bytes where its samples are pairs.
 struct QuarterPlane {
-    const uint8_t* src;       // first byte of the first source row
-    ptrdiff_t src_pitch;      // bytes from one source row to the next
-    int32_t src_columns;      // source extent of a row
-    int32_t src_rows;         // source extent of a column
-    uint8_t* dst;             // first byte of the first target row
-    ptrdiff_t dst_pitch;      // bytes from one target row to the next
-    int32_t dst_columns;      // target extent of a row
-    int32_t dst_rows;         // target extent of a column
-    int32_t samples;          // target samples in a row
-    int32_t sample_bytes;     // 1 to 4
+    const uint8_t* src;    // first byte of the first source row
+    ptrdiff_t src_pitch;   // bytes from one source row to the next
+    int32_t src_columns;   // source extent of a row
+    int32_t src_rows;      // source extent of a column
+    uint8_t* dst;          // first byte of the first target row
+    ptrdiff_t dst_pitch;   // bytes from one target row to the next
+    int32_t dst_columns;   // target extent of a row
+    int32_t dst_rows;      // target extent of a column
+    int32_t samples;       // target samples in a row
+    int32_t src_samples;   // source samples in a row
+    int32_t sample_bytes;  // 1 to 4
 };
 
 // Stores every target sample of the plane; zeros when the source is empty.
@@ -30,7 +31,6 @@ void sample_plane(const QuarterPlane& plane);
 
 // Adds the samples of `rows` source rows to the target, from a state between two rows. plane.src is
 // the first of these rows; the state's indices count `index_bytes` from plane.dst.
-void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
-              int32_t index_bytes);
+void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes);
 
 }  // namespace ovrin

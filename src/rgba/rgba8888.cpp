@@ -69,6 +69,7 @@ void ovrin_resize_rgba8888_sg(const uint8_t* src, uint32_t* dst, int32_t src_w, 
         dst_w,
         dst_h,
         dst_w,
+        src_w,
         kRgbaBytes,
     });
 }

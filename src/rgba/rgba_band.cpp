@@ -31,8 +31,7 @@ void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, cons
     walk_rows(state, {src_h, dst_h, rows.dst_pixels}, walked);
     store_scan_state(band, state);
     band.start_row = wrapping_add(band.start_row, walked);
-    band.src_offset =
-        wrapping_add(band.src_offset, int64_t{walked} * rows.src_pixels * kRgbaBytes);
+    band.src_offset = wrapping_add(band.src_offset, int64_t{walked} * rows.src_pixels * kRgbaBytes);
     band.rows_to_do = src_h >= band.start_row ? walked : 0;
 }
 
@@ -47,6 +46,7 @@ void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
         band.dst_w,
         band.dst_h,
         band.dst_w,
+        band.src_w,
         kRgbaBytes,
     };
     add_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes);

@@ -32,8 +32,8 @@ void check(Resize* resize, const Sizes& s, Random& random, Flush flush) {
     resize(src.data(), dst.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     const auto expected =
         reference::quarter_packed(src.data(), s.src_w, s.src_h, s.dst_w, s.dst_h, 4);
-    ASSERT_TRUE(same_bytes(reinterpret_cast<const uint8_t*>(dst.data()), expected.data(),
-                           expected.size()));
+    ASSERT_TRUE(
+        same_bytes(reinterpret_cast<const uint8_t*>(dst.data()), expected.data(), expected.size()));
     ASSERT_TRUE(dst.intact());
 }
 

@@ -13,9 +13,8 @@ inline ::testing::AssertionResult same_bytes(const uint8_t* actual, const uint8_
                                              size_t count) {
     for (size_t i = 0; i < count; ++i) {
         if (actual[i] != expected[i]) {
-            return ::testing::AssertionFailure()
-                   << "byte " << i << " of " << count << " is " << int{actual[i]} << ", not "
-                   << int{expected[i]};
+            return ::testing::AssertionFailure() << "byte " << i << " of " << count << " is "
+                                                 << int{actual[i]} << ", not " << int{expected[i]};
         }
     }
     return ::testing::AssertionSuccess();

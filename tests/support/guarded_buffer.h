@@ -15,14 +15,13 @@ namespace ovrin_test {
 // Which end of the buffer lies against an inaccessible page without a byte between.
 enum class Flush { kEnd, kStart };
 
-// `size` elements between two inaccessible pages, flush against one of them: reading or writing past
-// that end faults. The few bytes between the other end and its page hold a pattern; intact() tells
-// whether they still do.
+// `size` elements between two inaccessible pages, flush against one of them: reading or writing
+// past that end faults. The few bytes between the other end and its page hold a pattern; intact()
+// tells whether they still do.
 template <class T>
 class GuardedBuffer {
 public:
-    explicit GuardedBuffer(size_t size, Flush flush = Flush::kEnd, uint8_t fill = 0)
-        : size_(size) {
+    explicit GuardedBuffer(size_t size, Flush flush = Flush::kEnd, uint8_t fill = 0) : size_(size) {
         const size_t page = static_cast<size_t>(sysconf(_SC_PAGESIZE));
         const size_t bytes = size * sizeof(T);
         inner_bytes_ = (bytes + page - 1) / page * page;

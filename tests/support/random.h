@@ -14,7 +14,8 @@ namespace ovrin_test {
 // it. Name it in the failure message: SCOPED_TRACE(random.trace()).
 class Random {
 public:
-    explicit Random(uint64_t stream) : seed_(environment_seed()), engine_(seed_ * 1000003 + stream) {}
+    explicit Random(uint64_t stream)
+        : seed_(environment_seed()), engine_(seed_ * 1000003 + stream) {}
 
     int32_t between(int32_t low, int32_t high) {
         return std::uniform_int_distribution<int32_t>(low, high)(engine_);

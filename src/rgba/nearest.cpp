@@ -1,0 +1,65 @@
+// SPDX-License-Identifier: Apache-2.0
+// Nearest neighbour by whole-number steps.
+#include <math.h>
+#include <ovrinresize.h>
+#include <stddef.h>
+
+#include "kernels/kernels.h"
+
+namespace ovrin {
+
+namespace {
+
+// Where one axis is sampled. Positions pass through single precision, which rounds those above
+// 2^24; they never decrease.
+struct NearestAxis {
+    int32_t src_size;
+    int32_t step;
+    float offset;
+
+    NearestAxis(int32_t src, int32_t dst)
+        : src_size(src), step(static_cast<int32_t>(static_cast<double>(src) / dst + 0.5)) {
+        const float half = ceilf(static_cast<float>(step) * 0.5F);
+        offset = half < 0.0F ? 0.0F : half;
+    }
+
+    // Source index of destination index k; at or beyond src_size for a sample that is dropped.
+    int64_t at(int32_t k) const {
+        const float position = static_cast<float>(static_cast<double>(step) * k) + offset;
+        return static_cast<int64_t>(position);
+    }
+
+    bool holds(int64_t index) const { return index >= 0 && index < src_size; }
+
+    // Positions rise, so the samples that are kept are the first ones.
+    int32_t kept(int32_t dst_size) const {
+        int32_t count = 0;
+        while (count < dst_size && holds(at(count))) ++count;
+        return count;
+    }
+};
+
+}  // namespace
+
+}  // namespace ovrin
+
+using namespace ovrin;
+
+void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
+                                   int32_t dst_w, int32_t dst_h) {
+    if (src == nullptr || dst == nullptr) return;
+    if (src_w < 1 || src_h < 1 || dst_w < 1 || dst_h < 1) return;
+    const NearestAxis columns(src_w, dst_w);
+    const NearestAxis rows(src_h, dst_h);
+    const int32_t width = columns.kept(dst_w);
+    const int32_t height = rows.kept(dst_h);
+    int32_t taps[kCopyTaps];
+    for (int32_t x = 0; x < width; x += kCopyTaps) {
+        const int32_t count = width - x < kCopyTaps ? width - x : kCopyTaps;
+        for (int32_t i = 0; i < count; ++i) taps[i] = static_cast<int32_t>(columns.at(x + i));
+        for (int32_t j = 0; j < height; ++j) {
+            kernels().copy_taps4(dst + ptrdiff_t{j} * dst_w + x,
+                                 src + ptrdiff_t{src_w} * rows.at(j), taps, count);
+        }
+    }
+}

@@ -1,0 +1,156 @@
+// SPDX-License-Identifier: Apache-2.0
+// RGBA8888 into a canvas.
+#include <string.h>
+
+#include "dispatch/banded_run.h"
+#include "rgba/rgba_band.h"
+
+namespace ovrin {
+
+namespace {
+
+struct SourceSize {
+    int32_t width;
+    int32_t height;
+};
+
+// The vertical test looks at the picture's height where the horizontal one looks at its position.
+bool is_rejected(const ovrin_resize_target& target) {
+    return target.canvas_width < target.dst_x || target.canvas_height < target.dst_height ||
+           target.dst_height == 0;
+}
+
+int32_t scaled(int32_t size, int32_t new_extent, int32_t old_extent) {
+    const double result = size * (static_cast<double>(new_extent) / old_extent);
+    // Only a negative height can leave the range; what it means is not defined, a trap would be.
+    if (!(result > INT32_MIN && result < INT32_MAX)) return 0;
+    return static_cast<int32_t>(result);
+}
+
+// Cuts one axis of the picture at the canvas's edge, and the source in proportion. Returns the
+// source size to use: the target's when it was cut, otherwise the argument's.
+int32_t clip(int32_t canvas, int32_t position, int32_t& dst_size, int32_t& target_src_size,
+             int32_t src_size) {
+    if (canvas >= int64_t{dst_size} + position) return src_size;
+    const int32_t cut = wrapping_add(canvas, -int64_t{position});
+    target_src_size = scaled(target_src_size, cut, dst_size);
+    dst_size = cut;
+    return target_src_size;
+}
+
+SourceSize clip_to_canvas(ovrin_resize_target& target, int32_t src_w, int32_t src_h) {
+    const int32_t width =
+        clip(target.canvas_width, target.dst_x, target.dst_width, target.src_width, src_w);
+    const int32_t height =
+        clip(target.canvas_height, target.dst_y, target.dst_height, target.src_height, src_h);
+    return {width, height};
+}
+
+uint32_t* first_picture_row(const ovrin_resize_target& target) {
+    return static_cast<uint32_t*>(target.dst) + ptrdiff_t{target.canvas_width} * target.dst_y;
+}
+
+void clear_canvas(const ovrin_resize_target& target) {
+    if (target.canvas_width < 1 || target.canvas_height < 1) return;
+    memset(target.dst, 0,
+           static_cast<size_t>(target.canvas_width) * static_cast<size_t>(target.canvas_height) *
+               kRgbaBytes);
+}
+
+struct CanvasBands : RgbaBands {
+    static void task(void* band) { _resize_rgba8888_keep_ratio_tp(band); }
+
+    static void advance(Band& next, Band& previous) {
+        const int32_t canvas_w = next.dst_x + next.dst_w + next.dst_skip;
+        ovrin_resize_rgba8888_get_pos_keep_ratio(next.src_w, next.src_h, next.dst_w, next.dst_h,
+                                                 canvas_w, 0, &next);
+        end_where_next_begins(previous, next);
+    }
+};
+
+ovrin_rgba_band first_band(const uint8_t* src, const SourceSize& size,
+                           const ovrin_resize_target& target) {
+    ovrin_rgba_band band = {};
+    band.src_w = size.width;
+    band.src_h = size.height;
+    band.src_stride = target.src_stride > 0 ? target.src_stride : size.width;
+    band.src_rows = target.src_buffer_height > 0 ? target.src_buffer_height : size.height;
+    band.dst_w = target.dst_width;
+    band.dst_h = target.dst_height;
+    band.dst_x = target.dst_x;
+    band.dst_skip = target.canvas_width - (target.dst_x + target.dst_width);
+    band.band_rows = band_height(size.height, target.dst_height);
+    band.src = src;
+    band.dst = first_picture_row(target);
+    return band;
+}
+
+// A band record counts source bytes and canvas words in 32 bits.
+bool fits_band_record(const SourceSize& size, const ovrin_resize_target& target) {
+    const int64_t stride = target.src_stride > 0 ? target.src_stride : size.width;
+    return stride * size.height <= INT32_MAX / kRgbaBytes &&
+           int64_t{target.canvas_width} * target.canvas_height <= INT32_MAX;
+}
+
+bool resize_in_bands(const uint8_t* src, const SourceSize& size,
+                     const ovrin_resize_target& target) {
+    const int32_t count = band_count(size.height, band_height(size.height, target.dst_height));
+    if (count < 2 || target.dst_width < 1 || target.dst_height < 1) return false;
+    if (!fits_band_record(size, target)) return false;
+    BandedRun<CanvasBands> bands(first_band(src, size, target), count);
+    if (!bands.ready()) return false;
+    clear_canvas(target);
+    bands.run();
+    return true;
+}
+
+RgbaRows canvas_rows(const ovrin_rgba_band& band) {
+    return {band.src_stride, wrapping_add(wrapping_add(band.dst_x, band.dst_w), band.dst_skip),
+            band.dst_x};
+}
+
+}  // namespace
+
+}  // namespace ovrin
+
+using namespace ovrin;
+
+void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                     ovrin_resize_target* target) {
+    if (is_rejected(*target)) return;
+    const SourceSize size = clip_to_canvas(*target, src_w, src_h);
+    clear_canvas(*target);
+    sample_plane({
+        src,
+        ptrdiff_t{target->src_stride} * kRgbaBytes,
+        size.width,
+        size.height,
+        reinterpret_cast<uint8_t*>(first_picture_row(*target) + target->dst_x),
+        ptrdiff_t{target->canvas_width} * kRgbaBytes,
+        target->dst_width,
+        target->dst_height,
+        target->dst_width,
+        size.width,
+        kRgbaBytes,
+    });
+}
+
+void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t /*src_w*/, int32_t src_h, int32_t /*dst_w*/,
+                                              int32_t dst_h, int32_t canvas_w, int32_t /*canvas_h*/,
+                                              ovrin_rgba_band* band) {
+    advance_rgba_band(*band, src_h, dst_h, {band->src_stride, canvas_w, 0});
+}
+
+void _resize_rgba8888_keep_ratio_tp(void* band) {
+    auto* record = static_cast<ovrin_rgba_band*>(band);
+    run_rgba_band(*record, canvas_rows(*record));
+}
+
+void ovrin_resize_rgba_keep_ratio_tps(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                      ovrin_resize_target* target) {
+    if (target == nullptr || is_rejected(*target)) return;
+    const SourceSize size = clip_to_canvas(*target, src_w, src_h);
+    if (!resize_in_bands(src, size, *target)) {
+        ovrin_resize_rgba_keep_ratio_sg(src, size.width, size.height, target);
+    }
+}

@@ -1,0 +1,21 @@
+// SPDX-License-Identifier: Apache-2.0
+// From the grid to the destination.
+#pragma once
+
+#include <ovrinresize.h>
+
+#include "yuv420/layout.h"
+
+namespace ovrin {
+
+// Cuts the picture out of its grid.
+void cut_out(const uint8_t* grid_base, const Yuv420Layout& picture, uint8_t* dst);
+
+// Paints the canvas black and copies the part of the picture that it has room for.
+void place_in_canvas(const uint8_t* grid_base, const Yuv420Layout& picture,
+                     const ovrin_resize_target& target);
+
+// Paints the canvas black.
+void paint_canvas(ChromaLayout chroma, const ovrin_resize_target& target);
+
+}  // namespace ovrin

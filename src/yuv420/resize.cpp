@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "yuv420/resize.h"
+
+#include "yuv420/place.h"
+#include "yuv420/planes.h"
+#include "yuv420/work_buffer.h"
+
+namespace ovrin {
+
+namespace {
+
+void sample_into(const Yuv420Source& source, const Yuv420Layout& picture, const Yuv420Layout& grid,
+                 uint8_t* base) {
+    sample_plane(luma_plane(source, picture, grid, base));
+    for (int32_t plane = 0; plane < source.chroma.planes; ++plane) {
+        sample_plane(chroma_plane(source, grid, base, plane));
+    }
+}
+
+}  // namespace
+
+void resize_yuv420(const Yuv420Source& source, uint8_t* dst, int32_t width, int32_t height) {
+    const Yuv420Layout picture = {source.chroma, width, height};
+    if (!has_grid(picture)) return;
+    if (is_own_grid(picture)) {
+        sample_into(source, picture, picture, dst);
+        return;
+    }
+    const Yuv420Layout grid = grid_of(picture);
+    const WorkBuffer work(grid);
+    if (work.data() == nullptr) return;
+    sample_into(source, picture, grid, work.data());
+    cut_out(work.data(), picture, dst);
+}
+
+void resize_yuv420_into_canvas(const Yuv420Source& source, const ovrin_resize_target& target) {
+    if (target.canvas_width < target.dst_x || target.canvas_height < target.dst_y ||
+        target.dst_height == 0) {
+        return;
+    }
+    const Yuv420Layout picture = {source.chroma, target.dst_width, target.dst_height};
+    if (picture.is_empty()) {
+        paint_canvas(source.chroma, target);
+        return;
+    }
+    if (!has_grid(picture)) return;
+    const Yuv420Layout grid = grid_of(picture);
+    const WorkBuffer work(grid);
+    if (work.data() == nullptr) return;
+    sample_into(source, picture, grid, work.data());
+    place_in_canvas(work.data(), picture, target);
+}
+
+}  // namespace ovrin

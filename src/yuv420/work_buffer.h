@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <stdlib.h>
+
+#include "yuv420/layout.h"
+
+namespace ovrin {
+
+// A zeroed buffer for one grid. It takes twice the luma, a third more than the planes need.
+class WorkBuffer {
+public:
+    explicit WorkBuffer(const Yuv420Layout& grid)
+        : data_(static_cast<uint8_t*>(calloc(2, static_cast<size_t>(grid.luma_plane())))) {}
+    ~WorkBuffer() { free(data_); }
+
+    WorkBuffer(const WorkBuffer&) = delete;
+    WorkBuffer& operator=(const WorkBuffer&) = delete;
+
+    uint8_t* data() const { return data_; }  // null when there was no memory
+
+private:
+    uint8_t* data_;
+};
+
+}  // namespace ovrin

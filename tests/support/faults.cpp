@@ -1,0 +1,133 @@
+// SPDX-License-Identifier: Apache-2.0
+// Stands between the library's objects and the C library; linked with --wrap for each function.
+#include "support/faults.h"
+
+#include <pthread.h>
+#include <unistd.h>
+
+#include <atomic>
+#include <cstdlib>
+#include <mutex>
+#include <unordered_set>
+
+extern "C" {
+void* __real_malloc(size_t size);
+void* __real_calloc(size_t count, size_t size);
+void __real_free(void* block);
+int __real_pthread_create(pthread_t* thread, const pthread_attr_t* attributes,
+                          void* (*start)(void*), void* argument);
+int __real_pthread_mutex_init(pthread_mutex_t* mutex, const pthread_mutexattr_t* attributes);
+int __real_pthread_cond_init(pthread_cond_t* condition, const pthread_condattr_t* attributes);
+}
+
+namespace {
+
+constexpr int kKinds = 5;
+
+std::atomic<int> call_count[kKinds];
+std::atomic<int> failing_kind{-1};
+std::atomic<int> failing_call{0};
+std::atomic<bool> failing_later{false};
+std::atomic<bool> failed{false};
+
+std::mutex blocks_mutex;
+std::unordered_set<void*>& blocks() {
+    static auto* set = new std::unordered_set<void*>;
+    return *set;
+}
+
+int index_of(faults::Kind kind) {
+    return static_cast<int>(kind);
+}
+
+bool refuses(faults::Kind kind) {
+    const int call = ++call_count[index_of(kind)];
+    if (failing_kind != index_of(kind)) return false;
+    if (call < failing_call || (call > failing_call && !failing_later)) return false;
+    failed = true;
+    return true;
+}
+
+void* remember(void* block) {
+    const std::lock_guard<std::mutex> lock(blocks_mutex);
+    if (block != nullptr) blocks().insert(block);
+    return block;
+}
+
+int block_count() {
+    const std::lock_guard<std::mutex> lock(blocks_mutex);
+    return static_cast<int>(blocks().size());
+}
+
+}  // namespace
+
+extern "C" {
+
+void* __wrap_malloc(size_t size) {
+    return refuses(faults::Kind::kMalloc) ? nullptr : remember(__real_malloc(size));
+}
+
+void* __wrap_calloc(size_t count, size_t size) {
+    return refuses(faults::Kind::kCalloc) ? nullptr : remember(__real_calloc(count, size));
+}
+
+void __wrap_free(void* block) {
+    {
+        const std::lock_guard<std::mutex> lock(blocks_mutex);
+        blocks().erase(block);
+    }
+    __real_free(block);
+}
+
+int __wrap_pthread_create(pthread_t* thread, const pthread_attr_t* attributes,
+                          void* (*start)(void*), void* argument) {
+    if (refuses(faults::Kind::kThread)) return 11;
+    return __real_pthread_create(thread, attributes, start, argument);
+}
+
+int __wrap_pthread_mutex_init(pthread_mutex_t* mutex, const pthread_mutexattr_t* attributes) {
+    if (refuses(faults::Kind::kMutex)) return 12;
+    return __real_pthread_mutex_init(mutex, attributes);
+}
+
+int __wrap_pthread_cond_init(pthread_cond_t* condition, const pthread_condattr_t* attributes) {
+    if (refuses(faults::Kind::kCondition)) return 12;
+    return __real_pthread_cond_init(condition, attributes);
+}
+}
+
+namespace faults {
+
+const char* name(Kind kind) {
+    constexpr const char* kNames[kKinds] = {"malloc", "calloc", "pthread_create",
+                                            "pthread_mutex_init", "pthread_cond_init"};
+    return kNames[index_of(kind)];
+}
+
+void reset() {
+    failing_kind = -1;
+    failed = false;
+    for (std::atomic<int>& count : call_count) count = 0;
+}
+
+void fail(Kind kind, int nth, bool and_all_later) {
+    reset();
+    failing_call = nth;
+    failing_later = and_all_later;
+    failing_kind = index_of(kind);
+}
+
+int calls(Kind kind) {
+    return call_count[index_of(kind)];
+}
+
+bool has_failed() {
+    return failed;
+}
+
+int live_blocks(int seconds) {
+    for (int i = 0; i < seconds * 1000 && block_count() > 0; ++i) usleep(1000);
+    return block_count();
+}
+
+}  // namespace faults
