@@ -54,9 +54,10 @@ struct Yuv420Source {
 inline Yuv420Source contiguous_source(ChromaLayout chroma, const uint8_t* picture, int32_t width,
                                       int32_t height) {
     const Yuv420Layout layout = {chroma, width, height};
-    return {chroma,  width,
-            height,  width,
-            picture, {picture + layout.chroma_offset(0), picture + layout.chroma_offset(1)}};
+    // An empty picture has no planes to point to, and may well be a null pointer.
+    const ptrdiff_t first = layout.is_empty() ? 0 : layout.chroma_offset(0);
+    const ptrdiff_t second = layout.is_empty() ? 0 : layout.chroma_offset(1);
+    return {chroma, width, height, width, picture, {picture + first, picture + second}};
 }
 
 // Chroma is sampled on a grid: the destination size rounded up to multiples of 4. A destination
