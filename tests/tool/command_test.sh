@@ -17,7 +17,7 @@ complain() {
 # Runs the tool; it must succeed and say nothing.
 works() {
     "$tool" "$@" >stdout 2>stderr || complain "exit code $? of: $*: $(cat stderr)"
-    [ ! -s stdout ] && [ ! -s stderr ] || complain "output of: $*: $(cat stdout stderr)"
+    if [ -s stdout ] || [ -s stderr ]; then complain "output of: $*: $(cat stdout stderr)"; fi
 }
 
 # fails CODE PATTERN ARGUMENT...: the tool must end with that exit code and one line on standard error
@@ -47,7 +47,7 @@ dimensions() {
     case $1 in
         *.png) hex "$1" | sed -E 's/^.{32}(.{8})(.{8}).*/\1 \2/' ;;
         *.jpg | *.jpeg) hex "$1" | sed -E 's/.*ffc0....08(....)(....).*/\2 \1/' ;;
-        *.ppm) printf '%x %x' $(head -n 2 "$1" | tail -n 1) ;;
+        *.ppm) sed -n 2p "$1" | { read -r width height; printf '%x %x' "$width" "$height"; } ;;
     esac | { read -r width height; echo "$((16#$width))x$((16#$height))"; }
 }
 
@@ -59,7 +59,7 @@ has_size() {
 make_picture() {
     printf 'P6\n48 40\n255\n'
     awk 'BEGIN { for (i = 0; i < 48 * 40; ++i) print i % 48 * 5, int(i / 48) * 6, i % 251 }' |
-        while read -r r g b; do printf "\\x$(printf %x "$r")\\x$(printf %x "$g")\\x$(printf %x "$b")"; done
+        while read -r r g b; do printf '%b' "$(printf '\\x%x' "$r" "$g" "$b")"; done
 }
 
 make_picture >in.ppm
