@@ -3,12 +3,24 @@
 find_package(Threads REQUIRED)
 
 add_library(ovrinresize_objects OBJECT
+  src/bilinear/plan.cpp
+  src/bilinear/progressive.cpp
+  src/bilinear/rows.cpp
+  src/bilinear/single.cpp
+  src/bilinear/threaded.cpp
   src/dispatch/band_schedule.cpp
+  src/dispatch/helping_run.cpp
   src/dispatch/sleep.cpp
   src/dispatch/wrappers.cpp
+  src/kernels/bilinear_scalar.cpp
   src/kernels/cpu.cpp
-  src/kernels/scalar.cpp
+  src/kernels/lanczos_scalar.cpp
+  src/kernels/quarter_scalar.cpp
   src/kernels/select.cpp
+  src/lanczos/rows.cpp
+  src/lanczos/threaded.cpp
+  src/lanczos/transform.cpp
+  src/lanczos/weights.cpp
   src/layout.cpp
   src/nv21/nv21.cpp
   src/nv21/nv21_bands.cpp

@@ -157,7 +157,8 @@ OVRIN_API void _resize_rgba8888_tp(void* band);
  * proportion: dst_width becomes canvas_width - dst_x, and the source width becomes
  * (int)(target->src_width * ((double)new_dst_width / old_dst_width)); both are written back into
  * the target, likewise for heights. Keep target->src_width and src_height equal to the arguments:
- * they are what is cut.
+ * they are what is cut. A rectangle that a negative position puts outside the canvas's memory is
+ * not drawn.
  *
  * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
  * dst_y), or dst_height is 0. Threads as ovrin_resize_rgba8888, by src_h.
@@ -403,6 +404,164 @@ OVRIN_API void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, 
 /* Band tasks; band points to an ovrin_nv21_band. As _resize_yuv420_tp and _resize_y_u_v_tp. */
 OVRIN_API void _resize_nv21_tp(void* band);
 OVRIN_API void _resize_y_nv21_tp(void* band);
+
+/*
+ * ---- Bilinear engine ---------------------------------------------------------------------------
+ *
+ * Scales by any ratio, up or down. Format codes:
+ *
+ *     7, 8     four 8-bit channels per pixel, in any order
+ *     2        planar YUV 4:2:0: Y, then U, then V
+ *     18, 19   semi-planar YUV 4:2:0: Y, then chroma pairs in any order
+ *
+ * The canvas always holds its planes one behind the other; so does the source without a target.
+ * With a target the source's size, row length and chroma planes come from it, as do the format and
+ * the canvas; src_w, src_h and format are then only tested for 0 or ignored. The target's dst_width
+ * and dst_height are not read: dst_w x dst_h is the size of the scaled picture. Without a target
+ * the canvas is dst_w x dst_h. The target is never written.
+ *
+ * The canvas is cleared (0; chroma 128) and the picture placed at (dst_x, dst_y); what does not fit
+ * is cut off. Source indices are i * (source size / destination size) in single precision. Weights
+ * have 12 fractional bits and lie a quarter of a pixel further right and down, up to 5119 / 4096:
+ * sums may wrap, and then a dark sample beside a bright one can come out bright. In the columns
+ * that sample at source column src_width - 2 and later there is no horizontal blend, in the rows
+ * from src_height - 2 on no vertical one. A source one pixel wide or high is read one pixel beyond
+ * its end, and so is the right end of its last two rows when enlarging; buffers must allow that.
+ * Chroma takes the weights of the luma pixel at its even column and row.
+ *
+ * Nothing is written when a size is 0, a destination size is negative, the format is another one,
+ * or memory is missing.
+ */
+
+/* On the calling thread, interpolating. */
+OVRIN_API void ov_bilinear_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                              int32_t dst_w, int32_t dst_h, int32_t format,
+                              const ovrin_resize_target* target);
+
+/*
+ * As ov_bilinear_sg below 1024 destination rows. From 1024 on, in bands of destination rows on four
+ * worker threads and the calling one, and without interpolation: each sample is the top left one of
+ * the four that ov_bilinear_sg would blend.
+ */
+OVRIN_API void ov_bilinear(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                           int32_t dst_w, int32_t dst_h, int32_t format,
+                           const ovrin_resize_target* target);
+
+/*
+ * For large reductions: halves the picture through ov_bilinear while the remaining ratio is 4 or
+ * more, then makes the last pass to dst. Every pass has the same format and target; with a target
+ * that means the same source geometry and canvas, so callers that want the halving pass null.
+ * Without memory for the two intermediate pictures it makes a single pass.
+ */
+OVRIN_API void ov_bilinear_ex(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                              int32_t dst_w, int32_t dst_h, int32_t format,
+                              const ovrin_resize_target* target);
+
+/* One band of destination rows of a bilinear picture. */
+typedef struct ovrin_bilinear_band {
+    const ovrin_resize_target* target; /* the caller's, or null */
+    int32_t src_width;                 /* source size, pixels */
+    int32_t src_height;
+    int32_t dst_w; /* size of the scaled picture inside the canvas */
+    int32_t dst_h;
+    const uint8_t* src;
+    uint8_t* dst; /* the canvas */
+    int32_t format;
+    void* reserved_pointer;    /* null */
+    const int32_t* col_weight; /* per destination column and row: weight of the next sample, 12 */
+    const int32_t* row_weight; /* fractional bits, and index of the sample; shared by all bands */
+    const int32_t* col_index;
+    const int32_t* row_index;
+    int32_t first_row; /* destination rows [first_row, end_row) */
+    int32_t end_row;
+    int32_t reserved;     /* 0 */
+    int32_t canvas_width; /* pixels */
+    int32_t src_pitch;    /* bytes from one source row to the next */
+    int32_t bpp;          /* bytes per pixel of the first plane */
+    int32_t edge_cols;    /* columns without horizontal blend */
+    int32_t edge_rows;    /* rows without vertical blend; 0 in all bands but the last */
+} ovrin_bilinear_band;
+
+/* Band task; band points to an ovrin_bilinear_band. Writes the band's rows; the canvas is cleared.
+ */
+OVRIN_API void _ov_bilinear_tp(void* band);
+
+/*
+ * ---- Lanczos engine ----------------------------------------------------------------------------
+ *
+ * A seven-tap filter with the three-lobe kernel sinc(x) * sinc(x / 3), stretched when reducing,
+ * still over seven taps. Sums are formed in double precision by fused multiply-adds in a fixed
+ * order, so results are the same on every processor. Rows and columns beyond the picture repeat its
+ * border.
+ */
+
+/* A picture of interleaved 8-bit components. */
+typedef struct lanczos_image {
+    int32_t width; /* pixels */
+    int32_t height;
+    int32_t stride; /* bytes from one row to the next; of a source: width * bytes_per_pixel */
+    int32_t bytes_per_pixel;
+    uint8_t* data; /* only read in a source */
+} lanczos_image;
+
+/*
+ * The kernel at distances 0, 0.00025, 0.0005 ... below 4 source pixels: 16000 floats. The caller
+ * releases the table with free(). Null when memory is missing.
+ */
+OVRIN_API float* create_lanczos_lookup(void);
+
+/* 1 when image is not null, its pointer is not null and its four numbers are above 0; otherwise 0.
+ */
+OVRIN_API int32_t checkOvImage(const lanczos_image* image);
+
+/*
+ * Resizes src into dst, on the calling thread; the pictures say to what size. Both should have the
+ * same bytes_per_pixel. Writes nothing when checkOvImage fails for either or memory is missing.
+ */
+OVRIN_API void OvTransformLanczos(const lanczos_image* src, const lanczos_image* dst);
+
+/* As OvTransformLanczos, for packed pictures. */
+OVRIN_API void ov_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst,
+                          int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
+
+/*
+ * Resizes a luma plane and, right behind it, a chroma plane of the same width and height in pairs:
+ * src_h rows of src_w * 2 bytes are read behind the source luma, dst_h rows of dst_w * 2 bytes
+ * written behind the destination luma. NV21's own chroma plane has only a quarter as many pairs;
+ * give buffers of that larger size.
+ */
+OVRIN_API void ov_lanczos_nv(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst,
+                             int32_t dst_w, int32_t dst_h);
+
+/*
+ * As ov_lanczos for pixels of 4 bytes (other sizes are not placed right), in bands of destination
+ * rows on four worker threads and the calling one; pictures that do not make two bands, and calls
+ * that get no threads, stay on the calling thread. Note the order of the arguments.
+ */
+OVRIN_API void ovrin_resize_lanczos(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                    int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
+
+/* One band of destination rows of a Lanczos picture. */
+typedef struct ovrin_lanczos_band {
+    int32_t src_w; /* source size, pixels */
+    int32_t src_h;
+    int32_t dst_w; /* destination size, pixels */
+    int32_t dst_h;
+    const uint8_t* src;
+    uint8_t* dst; /* the band's first destination row */
+    int32_t bytes_per_pixel;
+    int32_t first_row; /* the band's first destination row */
+    int32_t rows;      /* destination rows in the band */
+    const float* table;
+    const double* column_weights; /* 7 per destination column, shared by all bands */
+    const double* row_weights;    /* 7 per destination row, shared by all bands */
+} ovrin_lanczos_band;
+
+/*
+ * Band task; band points to an ovrin_lanczos_band. Writes nothing when src, dst or table is null or
+ * memory is missing.
+ */
+OVRIN_API void _resize_lanczos_tp(void* band);
 
 /*
  * ---- Thread pool -----------------------------------------------------------------------------

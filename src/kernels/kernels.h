@@ -67,13 +67,58 @@ struct QuarterKernels {
 // ratio.
 using BeginQuarterPlan = const QuarterKernels&(QuarterPlan& plan, const QuarterRowShape& shape);
 
-// dst[i] = row[taps[i]] for i in [0, count). Reads and writes nothing else.
-using CopyTaps4 = void(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count);
+// Bilinear rows of samples of N bytes. index and wx hold, for every destination sample, the source
+// sample and the weight of the one to its right, with 12 fractional bits; wy weighs the lower row.
+// Weights run from 1024 to 5119. For i in [0, count) and c in [0, N), with P(row, k) =
+// row[N*(index[i] + k) + c], all products and sums modulo 2^32:
+//
+//   both        dst = ((P(top, 0) * (4096 - wx) + P(top, 1) * wx) * (4096 - wy) +
+//                      (P(bottom, 0) * (4096 - wx) + P(bottom, 1) * wx) * wy) >> 24
+//   vertical    dst = (P(top, 0) * (4096 - wy) + P(bottom, 0) * wy) << 12 >> 24
+//   horizontal  dst = (P(row, 0) * (4096 - wx) + P(row, 1) * wx) << 12 >> 24
+//   copy        dst = P(row, 0)
+//
+// at dst[N*i + c]. Only the bytes named are read or written. No alignment is needed; count is at
+// most kCopyTaps.
+struct BilinearKernels {
+    void (*both)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const int32_t* index,
+                 const int32_t* wx, int32_t wy, int32_t count);
+    void (*vertical)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const int32_t* index,
+                     int32_t wy, int32_t count);
+    void (*horizontal)(uint8_t* dst, const uint8_t* row, const int32_t* index, const int32_t* wx,
+                       int32_t count);
+    void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
+};
 constexpr int32_t kCopyTaps = 1024;
+
+// One row of a seven-tap filter over interleaved components, or part of it.
+struct LanczosRow {
+    uint8_t* dst;
+    const uint8_t* cache;  // seven source rows; a tap row's pixel 0 is three left of column 0
+    int64_t cache_pitch;   // bytes
+    int32_t src_components;
+    int32_t dst_components;
+    const int32_t* index;          // per pixel: the first of its seven taps in a row
+    const double* column_weights;  // per pixel: seven
+    const double* row_weights;     // seven
+    int32_t count;
+};
+
+// For pixel x in [0, count), component k in [0, dst_components), with v the row weights and h the
+// pixel's column weights:
+//
+//   acc = 0; for r in [0, 7), for i in [0, 7), in this order:
+//       acc = fma(v[r] * h[i], cache[r][index[x] * src_components + i * dst_components + k], acc)
+//   dst = acc + 0.5, truncated, clamped to 0 ... 255
+//
+// in double precision, each operation rounded once: the order and the fusing are part of the
+// result.
+using LanczosRowKernel = void(const LanczosRow& row);
 
 struct Kernels {
     BeginQuarterPlan* begin_quarter_plan;
-    CopyTaps4* copy_taps4;
+    const BilinearKernels* bilinear;  // for samples of 1, 2 and 4 bytes
+    LanczosRowKernel* lanczos_row;
 };
 
 // The plain C++ kernels, which define what every other set must compute.

@@ -11,6 +11,8 @@ BeginQuarterPlan begin_quarter_plan_avx2;
 BeginQuarterPlan begin_quarter_plan_avx512;
 BeginQuarterPlan begin_quarter_plan_neon;
 
-CopyTaps4 copy_taps4_scalar;
+extern const BilinearKernels bilinear_scalar[3];
+
+LanczosRowKernel lanczos_row_scalar;
 
 }  // namespace ovrin
