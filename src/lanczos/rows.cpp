@@ -21,7 +21,7 @@ int64_t clamped(int64_t row, int32_t rows) {
 
 // Pixels with more components than the source's run past the last slot; they read zeros there.
 LanczosCache::LanczosCache(int32_t src_w, int32_t src_components, int32_t dst_components)
-    : pitch_((ptrdiff_t{src_w} + 2 * kLanczosMargin) * src_components),
+    : pitch_((src_w + ptrdiff_t{2} * kLanczosMargin) * src_components),
       data_(static_cast<uint8_t*>(
           calloc(static_cast<size_t>(pitch_ + dst_components), kLanczosTaps))) {}
 
