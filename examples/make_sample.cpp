@@ -92,7 +92,9 @@ public:
         paint(rect, [&](int x, int y) {
             Color sum = gray(0);
             for (int i = 0; i < kGrid * kGrid; ++i) {
-                sum = sum + shade(x + (i % kGrid + 0.5) / kGrid, y + (i / kGrid + 0.5) / kGrid);
+                const int column = i % kGrid;
+                const int row = i / kGrid;
+                sum = sum + shade(x + (column + 0.5) / kGrid, y + (row + 0.5) / kGrid);
             }
             return sum * (1.0 / (kGrid * kGrid));
         });

@@ -9,7 +9,7 @@ int main(void) {
     uint8_t* picture = calloc((size_t)w * h, 4); /* R, G, B, A per pixel */
     uint32_t* small = malloc((size_t)small_w * small_h * 4);
     if (picture == NULL || small == NULL) return 1;
-    for (int32_t i = 0; i < w * h; ++i) picture[4 * i] = (uint8_t)(255 * (i % w) / w);
+    for (int32_t i = 0; i < w * h; ++i) picture[(size_t)4 * i] = (uint8_t)(255 * (i % w) / w);
 
     ovrin_resize_rgba8888(picture, small, w, h, small_w, small_h);
 

@@ -32,7 +32,7 @@ bool are_small(const double* weights, int64_t sets) {
 // Destination pixels with more components than the source's run past the last slot; they read zeros
 // there.
 LanczosCache::LanczosCache(const LanczosRows& picture)
-    : pitch_((ptrdiff_t{picture.src_w} + 2 * kLanczosMargin) * picture.src_components),
+    : pitch_((picture.src_w + ptrdiff_t{2} * kLanczosMargin) * picture.src_components),
       data_(static_cast<uint8_t*>(
           calloc(static_cast<size_t>(pitch_ + picture.dst_components), kLanczosTaps))) {
     for (int64_t& row : rows_) row = -1;
