@@ -4,8 +4,8 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
-#include <cstdio>
 #include <exception>
+#include <iostream>
 #include <vector>
 
 #include "codecs.h"
@@ -92,7 +92,9 @@ public:
         paint(rect, [&](int x, int y) {
             Color sum = gray(0);
             for (int i = 0; i < kGrid * kGrid; ++i) {
-                sum = sum + shade(x + (i % kGrid + 0.5) / kGrid, y + (i / kGrid + 0.5) / kGrid);
+                const int column = i % kGrid;
+                const int row = i / kGrid;
+                sum = sum + shade(x + (column + 0.5) / kGrid, y + (row + 0.5) / kGrid);
             }
             return sum * (1.0 / (kGrid * kGrid));
         });
@@ -479,7 +481,7 @@ void draw_title(Canvas* canvas) {
 
 int main(int argc, char** argv) {
     if (argc != 2) {
-        fprintf(stderr, "Usage: make_sample OUT.png\n");
+        std::cerr << "Usage: make_sample OUT.png\n";
         return 2;
     }
     try {
@@ -491,7 +493,7 @@ int main(int argc, char** argv) {
         tool::encode_png(canvas.picture(), file.stream());
         file.commit();
     } catch (const std::exception& error) {
-        fprintf(stderr, "make_sample: %s\n", error.what());
+        std::cerr << "make_sample: " << error.what() << "\n";
         return 1;
     }
     return 0;
