@@ -452,7 +452,7 @@ TEST(KeepRatioRgba, EmptySourceClearsTheCanvas) {
             for (const bool by_height : {true, false}) {
                 std::vector<uint32_t> canvas(64, 7);
                 ovrin_resize_target target = letterbox(8, 8, 4, 4, 1, 1);
-                target.src_stride = 4;
+                target.src_stride = by_height ? 4 : 0;
                 target.dst = canvas.data();
                 way.resize(nullptr, by_height ? 4 : empty, by_height ? empty : 2000, &target);
                 EXPECT_EQ(canvas, std::vector<uint32_t>(64, 0));
