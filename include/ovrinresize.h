@@ -68,8 +68,8 @@ typedef struct ovrin_resize_target {
  * quarter and three quarters of the way across its source cell in each direction; each byte is
  * shifted right by 2 before it is added:
  *
- *     row1 = (j * src_h + (src_h >> 2)) / dst_h      row3 = (j * src_h + ((3 * src_h) >> 2)) /
- * dst_h
+ *     row1 = (j * src_h + (src_h >> 2)) / dst_h
+ *     row3 = (j * src_h + ((3 * src_h) >> 2)) / dst_h
  *
  * and columns likewise. The shift drops the two low bits of every sample, so 252 is the largest
  * result: a white source (255) gives 252. Enlarging is allowed; it repeats samples.
@@ -106,16 +106,15 @@ OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int3
  * [i * dst_h, (i + 1) * dst_h).
  */
 typedef struct ovrin_rgba_band {
-    int32_t
-        start_row;   /* first source row of the band; 0: the running state below is at its start */
-    int32_t row_q1;  /* next pending one-quarter row point, scaled coordinates */
-    int32_t row_q3;  /* next pending three-quarter row point */
-    int32_t row_acc; /* start_row * dst_h */
-    int32_t di_11;   /* next destination word for (one-quarter row, one-quarter column) */
-    int32_t di_13;   /* ... for (one-quarter row, three-quarter column) */
-    int32_t di_31;   /* ... for (three-quarter row, one-quarter column) */
-    int32_t di_33;   /* ... for (three-quarter row, three-quarter column) */
-    int32_t src_w;   /* source size, pixels */
+    int32_t start_row; /* first source row; when 0, the running state below is at its start */
+    int32_t row_q1;    /* next pending one-quarter row point, scaled coordinates */
+    int32_t row_q3;    /* next pending three-quarter row point */
+    int32_t row_acc;   /* start_row * dst_h */
+    int32_t di_11;     /* next destination word for (one-quarter row, one-quarter column) */
+    int32_t di_13;     /* ... for (one-quarter row, three-quarter column) */
+    int32_t di_31;     /* ... for (three-quarter row, one-quarter column) */
+    int32_t di_33;     /* ... for (three-quarter row, three-quarter column) */
+    int32_t src_w;     /* source size, pixels */
     int32_t src_h;
     int32_t src_stride; /* source row length, pixels */
     int32_t src_rows;   /* rows in the source buffer */
@@ -574,10 +573,11 @@ OVRIN_API void _resize_lanczos_tp(void* band);
 #define OVRIN_THREADPOOL_CAPACITY 2000
 
 typedef struct ovrin_threadpool_queue {
-    uint32_t head;                            /* index of the oldest entry */
-    uint32_t tail;                            /* index where the next entry goes */
-    uint32_t count;                           /* number of entries held */
-    void* entries[OVRIN_THREADPOOL_CAPACITY]; /* the ring; null where empty */
+    uint32_t head;  /* index of the oldest entry */
+    uint32_t tail;  /* index where the next entry goes */
+    uint32_t count; /* number of entries held */
+    /* the ring; null where empty */
+    void* entries[OVRIN_THREADPOOL_CAPACITY];
 } ovrin_threadpool_queue;
 
 typedef struct ovrin_threadpool_task {
@@ -586,17 +586,19 @@ typedef struct ovrin_threadpool_task {
 } ovrin_threadpool_task;
 
 typedef struct ovrin_threadpool {
-    ovrin_threadpool_queue pending;                         /* tasks waiting to be run */
-    ovrin_threadpool_queue free_slots;                      /* slots available for new tasks */
-    ovrin_threadpool_task tasks[OVRIN_THREADPOOL_CAPACITY]; /* the slots; queues point into them */
-    uint16_t thread_count;                                  /* workers started */
-    uint16_t stop;                                          /* 1 once teardown has begun */
-    pthread_t* threads;                                     /* one handle per worker */
-    pthread_mutex_t free_lock;                              /* guards free_slots */
-    pthread_mutex_t pending_lock;                           /* guards pending */
-    pthread_cond_t
-        slot_freed; /* submitters wait here; broadcast when free_slots gets its first entry */
-    pthread_cond_t task_ready; /* workers wait here; broadcast when pending gets its first entry */
+    ovrin_threadpool_queue pending;    /* tasks waiting to be run */
+    ovrin_threadpool_queue free_slots; /* slots available for new tasks */
+    /* the slots; queues point into them */
+    ovrin_threadpool_task tasks[OVRIN_THREADPOOL_CAPACITY];
+    uint16_t thread_count;        /* workers started */
+    uint16_t stop;                /* 1 once teardown has begun */
+    pthread_t* threads;           /* one handle per worker */
+    pthread_mutex_t free_lock;    /* guards free_slots */
+    pthread_mutex_t pending_lock; /* guards pending */
+    /* submitters wait here; broadcast when free_slots gets its first entry */
+    pthread_cond_t slot_freed;
+    /* workers wait here; broadcast when pending gets its first entry */
+    pthread_cond_t task_ready;
 } ovrin_threadpool;
 
 /*

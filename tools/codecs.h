@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 // One pair of functions per file type. Decoders take a whole file in memory and look at nothing but
-// its content; encoders write to a stream. All throw Error, without the name of the file.
+// its content; encoders write to a stream. Pictures are RGBA. All throw Error, without the name of
+// the file.
 #pragma once
 
 #include <cstddef>

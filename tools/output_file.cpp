@@ -50,7 +50,16 @@ mode_t default_mode() {
 
 }  // namespace
 
-OutputFile::OutputFile(const std::string& path) : path_(real_path(path)) {
+OutputFile::OutputFile(const std::string& path) : name_(path), path_(real_path(path)) {
+    concerning(name_, [this] { open(); });
+}
+
+void OutputFile::open() {
+    if (path_ == "-") {
+        if (isatty(STDOUT_FILENO) == 1) throw Error("standard output is a terminal");
+        stream_ = stdout;
+        return;
+    }
     struct stat existing = {};
     const bool exists = stat(path_.c_str(), &existing) == 0;
     if (exists && S_ISDIR(existing.st_mode)) throw Error(strerror(EISDIR));
@@ -85,10 +94,12 @@ OutputFile::~OutputFile() {
 }
 
 void OutputFile::commit() {
-    if (fflush(stream_) != 0 || ferror(stream_) != 0) throw Error(strerror(errno));
-    if (!temporary_.empty() && rename(temporary_.c_str(), path_.c_str()) != 0) {
-        throw Error(strerror(errno));
-    }
+    concerning(name_, [this] {
+        if (fflush(stream_) != 0 || ferror(stream_) != 0) throw Error(strerror(errno));
+        if (!temporary_.empty() && rename(temporary_.c_str(), path_.c_str()) != 0) {
+            throw Error(strerror(errno));
+        }
+    });
     doomed_file = nullptr;
     fclose(stream_);
     stream_ = nullptr;

@@ -10,8 +10,8 @@ namespace tool {
 // same folder and renamed by commit(). Without commit(), or when a signal ends the program, the
 // temporary file is removed and what stood under the final name stays as it was.
 //
-// What exists and is no regular file (a pipe, /dev/null) is written to directly. At most one object
-// at a time. Errors do not state the name.
+// What exists and is no regular file (a pipe, /dev/null) is written to directly, and so is standard
+// output, "-". At most one object at a time.
 class OutputFile {
 public:
     // Throws Error.
@@ -26,6 +26,9 @@ public:
     void commit();
 
 private:
+    void open();
+
+    std::string name_;  // as the user gave it
     std::string path_;
     std::string temporary_;  // empty when path_ itself is written to
     FILE* stream_ = nullptr;

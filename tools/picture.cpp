@@ -3,15 +3,31 @@
 
 namespace tool {
 
-std::vector<uint8_t> rgb_bytes(const Picture& picture) {
-    std::vector<uint8_t> rgb(picture.size.pixels() * 3);
-    const uint8_t* from = picture.bytes();
-    for (size_t i = 0; i < rgb.size(); i += 3, from += 4) {
-        rgb[i] = from[0];
-        rgb[i + 1] = from[1];
-        rgb[i + 2] = from[2];
+const char* name_of(PixelFormat format) {
+    switch (format) {
+        case PixelFormat::kRgba:
+            return "rgba";
+        case PixelFormat::kRgb:
+            return "rgb";
+        case PixelFormat::kI420:
+            return "i420";
+        case PixelFormat::kNv21:
+            return "nv21";
     }
-    return rgb;
+    return "";
 }
+
+bool has_chroma_planes(PixelFormat format) {
+    return format == PixelFormat::kI420 || format == PixelFormat::kNv21;
+}
+
+size_t picture_bytes(PixelFormat format, Size size) {
+    const Size chroma = {(size.width + 1) / 2, (size.height + 1) / 2};
+    if (has_chroma_planes(format)) return size.pixels() + 2 * chroma.pixels();
+    return size.pixels() * (format == PixelFormat::kRgb ? 3 : 4);
+}
+
+Picture::Picture(Size the_size, PixelFormat the_format)
+    : format(the_format), size(the_size), words((picture_bytes(format, size) + 3) / 4) {}
 
 }  // namespace tool

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <vector>
 
@@ -8,19 +9,30 @@
 
 namespace tool {
 
-// An RGBA picture: bytes R, G, B, A per pixel, rows packed. Words because the library writes words.
+// RGBA and RGB: bytes in that order. I420 and NV21: a plane of luma, then chroma at half the size,
+// rounded up; I420 has a plane of U and one of V, NV21 a plane of pairs, V before U.
+enum class PixelFormat { kRgba, kRgb, kI420, kNv21 };
+
+const char* name_of(PixelFormat format);
+
+// 4:2:0, that is I420 or NV21.
+bool has_chroma_planes(PixelFormat format);
+
+size_t picture_bytes(PixelFormat format, Size size);
+
+// A picture in memory, rows packed.
 struct Picture {
-    explicit Picture(Size the_size) : size(the_size), pixels(the_size.pixels()) {}
+    Picture() = default;  // empty
+    explicit Picture(Size the_size, PixelFormat the_format = PixelFormat::kRgba);
 
-    uint8_t* bytes() { return reinterpret_cast<uint8_t*>(pixels.data()); }
-    const uint8_t* bytes() const { return reinterpret_cast<const uint8_t*>(pixels.data()); }
+    uint8_t* bytes() { return reinterpret_cast<uint8_t*>(words.data()); }
+    const uint8_t* bytes() const { return reinterpret_cast<const uint8_t*>(words.data()); }
+    size_t byte_count() const { return picture_bytes(format, size); }
 
-    Size size;
-    std::vector<uint32_t> pixels;
-    bool has_alpha = false;  // false: A means nothing and is not written to files
+    PixelFormat format = PixelFormat::kRgba;
+    Size size = {};
+    std::vector<uint32_t> words;  // words because the library writes RGBA as words
+    bool has_alpha = false;       // of RGBA; false: A means nothing and image files leave it out
 };
-
-// The picture without A, three bytes per pixel.
-std::vector<uint8_t> rgb_bytes(const Picture& picture);
 
 }  // namespace tool

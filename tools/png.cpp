@@ -5,6 +5,7 @@
 #include <string>
 
 #include "codecs.h"
+#include "convert.h"
 #include "error.h"
 
 namespace tool {
@@ -52,7 +53,8 @@ void encode_png(const Picture& picture, FILE* out) {
         written = png_image_write_to_stdio(&image, out, 0, picture.bytes(), 0, nullptr);
     } else {
         image.format = PNG_FORMAT_RGB;
-        written = png_image_write_to_stdio(&image, out, 0, rgb_bytes(picture).data(), 0, nullptr);
+        written = png_image_write_to_stdio(
+            &image, out, 0, converted(picture, PixelFormat::kRgb).bytes(), 0, nullptr);
     }
     if (written == 0) throw image.error("cannot write PNG");
 }

@@ -4,9 +4,9 @@
 #include <cerrno>
 #include <cstring>
 #include <string>
-#include <vector>
 
 #include "codecs.h"
+#include "convert.h"
 #include "error.h"
 
 namespace tool {
@@ -88,8 +88,8 @@ Picture decode_ppm(const uint8_t* data, size_t size) {
 
 void encode_ppm(const Picture& picture, FILE* out) {
     fprintf(out, "P6\n%d %d\n255\n", picture.size.width, picture.size.height);
-    const std::vector<uint8_t> rgb = rgb_bytes(picture);
-    fwrite(rgb.data(), 1, rgb.size(), out);
+    const Picture rgb = converted(picture, PixelFormat::kRgb);
+    fwrite(rgb.bytes(), 1, rgb.byte_count(), out);
     if (ferror(out) != 0) throw Error(std::string("cannot write PPM: ") + strerror(errno));
 }
 

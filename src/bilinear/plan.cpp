@@ -44,6 +44,41 @@ int32_t edge_count(const int32_t* index, int32_t dst_size, int32_t src_size) {
     return 0;
 }
 
+BilinearGeometry geometry_of_target(const BilinearCall& call, const ovrin_resize_target& target) {
+    const BilinearLayout layout = bilinear_layout(target.format);
+    const bool planar = layout == BilinearLayout::kPlanar;
+    return {layout,
+            target.format,
+            target.src_width,
+            target.src_height,
+            target.src_stride,
+            call.src,
+            {planar ? target.src_u_plane : target.src_vu_plane, target.src_v_plane},
+            call.dst,
+            target.canvas_width,
+            target.canvas_height,
+            target.dst_x,
+            target.dst_y};
+}
+
+BilinearGeometry geometry_of_arguments(const BilinearCall& call) {
+    const BilinearLayout layout = bilinear_layout(call.format);
+    const Yuv420Source source =
+        contiguous_source(chroma_of(layout), call.src, call.src_w, call.src_h);
+    return {layout,
+            call.format,
+            call.src_w,
+            call.src_h,
+            call.src_w,
+            call.src,
+            {source.chroma_planes[0], source.chroma_planes[1]},
+            call.dst,
+            call.dst_w,
+            call.dst_h,
+            0,
+            0};
+}
+
 }  // namespace
 
 BilinearLayout bilinear_layout(int32_t format) {
@@ -66,33 +101,8 @@ Yuv420Layout BilinearGeometry::canvas_planes() const {
 }
 
 BilinearGeometry geometry_of(const BilinearCall& call) {
-    const ovrin_resize_target* target = call.target;
-    BilinearGeometry g = {};
-    g.format = target != nullptr ? target->format : call.format;
-    g.layout = bilinear_layout(g.format);
-    g.src = call.src;
-    g.canvas = call.dst;
-    if (target != nullptr) {
-        g.src_width = target->src_width;
-        g.src_height = target->src_height;
-        g.src_stride = target->src_stride;
-        const bool planar = g.layout == BilinearLayout::kPlanar;
-        g.src_chroma[0] = planar ? target->src_u_plane : target->src_vu_plane;
-        g.src_chroma[1] = target->src_v_plane;
-        g.canvas_width = target->canvas_width;
-        g.canvas_height = target->canvas_height;
-        g.dst_x = target->dst_x;
-        g.dst_y = target->dst_y;
-    } else {
-        g.src_width = g.src_stride = call.src_w;
-        g.src_height = call.src_h;
-        const Yuv420Layout source = {chroma_of(g.layout), call.src_w, call.src_h};
-        g.src_chroma[0] = call.src + source.chroma_offset(0);
-        g.src_chroma[1] = call.src + source.chroma_offset(1);
-        g.canvas_width = call.dst_w;
-        g.canvas_height = call.dst_h;
-    }
-    return g;
+    return call.target != nullptr ? geometry_of_target(call, *call.target)
+                                  : geometry_of_arguments(call);
 }
 
 BilinearTables::BilinearTables(int32_t w, int32_t h)

@@ -23,7 +23,7 @@ void store_scan_state(ovrin_rgba_band& band, const ScanState& state) {
     band.di_33 = state.bottom_right;
 }
 
-void add_rows(const ovrin_rgba_band& band, const RgbaRows& rows) {
+void add_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows) {
     const QuarterPlane plane = {
         band.src + band.src_offset,
         ptrdiff_t{rows.src_pixels} * kRgbaBytes,
@@ -53,7 +53,7 @@ void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, cons
 }
 
 void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
-    if (band.rows_to_do > 0 && band.src_w > 0) add_rows(band, rows);
+    if (band.rows_to_do > 0 && band.src_w > 0) add_rgba_band(band, rows);
     __atomic_store_n(&band.done, 1, __ATOMIC_RELEASE);
 }
 

@@ -2,65 +2,7 @@
 # SPDX-License-Identifier: Apache-2.0
 # The ovrinresize command as its users see it: files, messages, exit codes.
 # Usage: command_test.sh PATH_OF_OVRINRESIZE
-set -u
-tool=$(realpath "$1")
-folder=$(mktemp -d)
-trap 'rm -rf "$folder"' EXIT
-cd "$folder" || exit 1
-failures=0
-
-complain() {
-    echo "FAILED: $*" >&2
-    failures=$((failures + 1))
-}
-
-# Runs the tool; it must succeed and say nothing.
-works() {
-    "$tool" "$@" >stdout 2>stderr || complain "exit code $? of: $*: $(cat stderr)"
-    [ ! -s stdout ] && [ ! -s stderr ] || complain "output of: $*: $(cat stdout stderr)"
-}
-
-# fails CODE PATTERN ARGUMENT...: the tool must end with that exit code and one line on standard error
-# that matches; nothing on standard output, no new file, temporary ones included.
-fails() {
-    local code=$1 pattern=$2 before after status
-    shift 2
-    before=$(find . | sort)
-    "$tool" "$@" >"$folder.stdout" 2>"$folder.stderr"
-    status=$?
-    after=$(find . | sort)
-    [ "$status" = "$code" ] || complain "exit code $status, not $code, of: $*"
-    [ "$(wc -l <"$folder.stderr")" = 1 ] || complain "not one line from: $*: $(cat "$folder.stderr")"
-    grep -q -e "^ovrinresize: .*$pattern" "$folder.stderr" ||
-        complain "no '$pattern' from: $*: $(cat "$folder.stderr")"
-    [ ! -s "$folder.stdout" ] || complain "standard output of: $*"
-    [ "$before" = "$after" ] || complain "files left by: $*"
-    rm -f "$folder.stdout" "$folder.stderr"
-}
-
-hex() {
-    od -An -v -tx1 "$1" | tr -d ' \n'
-}
-
-# Width and height that a file's own header states.
-dimensions() {
-    case $1 in
-        *.png) hex "$1" | sed -E 's/^.{32}(.{8})(.{8}).*/\1 \2/' ;;
-        *.jpg | *.jpeg) hex "$1" | sed -E 's/.*ffc0....08(....)(....).*/\2 \1/' ;;
-        *.ppm) printf '%x %x' $(head -n 2 "$1" | tail -n 1) ;;
-    esac | { read -r width height; echo "$((16#$width))x$((16#$height))"; }
-}
-
-has_size() {
-    [ "$(dimensions "$1")" = "$2" ] || complain "$1 is $(dimensions "$1"), not $2"
-}
-
-# A PPM of 48 x 40 pixels.
-make_picture() {
-    printf 'P6\n48 40\n255\n'
-    awk 'BEGIN { for (i = 0; i < 48 * 40; ++i) print i % 48 * 5, int(i / 48) * 6, i % 251 }' |
-        while read -r r g b; do printf "\\x$(printf %x "$r")\\x$(printf %x "$g")\\x$(printf %x "$b")"; done
-}
+source "$(dirname "${BASH_SOURCE[0]}")/support.sh"
 
 make_picture >in.ppm
 
@@ -111,7 +53,9 @@ fails 2 'a picture has at most' in.ppm no.png --size 65535x65535
 for size in '' 10 10x x10 10x10x10 '10 x 10' axb 1e3x5 0x 10x10px; do
     fails 2 "--size.*'$size' is not a size" in.ppm no.png --size "$size"
 done
-fails 2 '--size is required' in.ppm no.png
+fails 2 '--size or --canvas is required' in.ppm no.png
+fails 2 '--canvas.*at least 1' in.ppm no.png --canvas 0x3
+fails 2 '--fit' in.ppm no.png --size 3x3 --fit tightly
 fails 2 'IN is required'
 fails 2 'OUT is required' in.ppm --size 3x3
 fails 2 'not expected' in.ppm no.png more.png --size 3x3
@@ -154,8 +98,8 @@ fails 1 'No such file' "$(printf 'two\nlines')" no.png --size 3x3
 
 # ---- Files that cannot be written ----
 
-fails 1 'must end in .png' in.ppm no.gif --size 3x3
-fails 1 'must end in .png' in.ppm no --size 3x3
+fails 1 'must end in one of: .png' in.ppm no.gif --size 3x3
+fails 1 'must end in one of: .png' in.ppm no --size 3x3
 fails 1 'absent/no.png: cannot be written' in.ppm absent/no.png --size 3x3
 fails 1 'cannot be written' in.ppm /proc/no.png --size 3x3
 mkdir folder.png
@@ -175,6 +119,25 @@ done
     exit "$failures"
 ) || failures=$((failures + 1))
 fails 1 'at most 65500\|65500 pixels' in.ppm no.jpg --size 65501x1
+
+# ---- Standard input and output ----
+
+works in.ppm expected.ppm --size 24x20
+"$tool" - - -s 24x20 <in.ppm >piped.ppm || complain "exit code $? of: - -"
+cmp -s expected.ppm piped.ppm || complain "standard input and output give another picture"
+"$tool" in.png - -s 24x20 >piped.png || complain "exit code $? of: in.png -"
+has_size piped.png 24x20
+"$tool" in.ppm - -s 300x300 >/dev/full 2>stderr && complain "success with a full standard output"
+grep -q '^ovrinresize: -: ' stderr || complain "full standard output gives: $(cat stderr)"
+
+# ---- What was done ----
+
+"$tool" in.ppm out.png -s 24x20 --verbose 2>stderr || complain "exit code $? of --verbose"
+grep -Eqx 'rgba 48x40 to 24x20: resized in [0-9]+\.[0-9]+ ms' stderr ||
+    complain "--verbose says: $(cat stderr)"
+"$tool" in.ppm out.png -c 96x40 -v 2>stderr || complain "exit code $? of -v"
+grep -Eqx 'rgba 48x40 to 48x40 on 96x40: resized in [0-9]+\.[0-9]+ ms' stderr ||
+    complain "-v says: $(cat stderr)"
 
 # ---- What stands under the name of the result ----
 
@@ -204,12 +167,11 @@ for flag in --help -h; do
     [ ! -s stderr ] || complain "$flag writes to standard error"
     awk 'length > 100 { exit 1 }' help || complain "$flag has lines over 100 columns"
 done
-for option in --size --engine --quality --help --version; do
-    grep -q -e "$option" help || complain "no $option in --help"
+for option in --size --canvas --fit --engine --format --input-size --quality --verbose --help --version; do
+    grep -q -e " $option " help || complain "no $option in --help"
 done
 for flag in --version -V; do
     "$tool" "$flag" | grep -Eq '^ovrinresize [0-9]+\.[0-9]+\.[0-9]+$' || complain "$flag"
 done
 
-[ "$failures" = 0 ] || exit 1
-echo "all passed"
+finish
