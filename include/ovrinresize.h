@@ -43,16 +43,16 @@ extern "C" {
  * dst_x and dst_y must not be negative.
  */
 typedef struct ovrin_resize_target {
-    void *reserved_head;         /* the caller's; neither read nor written */
-    const uint8_t *src_vu_plane; /* source chroma pairs: bilinear engine, formats 18 and 19 */
-    const uint8_t *src_u_plane;  /* source U plane: bilinear engine, format 2 */
-    const uint8_t *src_v_plane;  /* source V plane: bilinear engine, format 2 */
-    int32_t src_width;           /* source size, pixels; rewritten when an RGBA picture is clipped */
+    void* reserved_head;         /* the caller's; neither read nor written */
+    const uint8_t* src_vu_plane; /* source chroma pairs: bilinear engine, formats 18 and 19 */
+    const uint8_t* src_u_plane;  /* source U plane: bilinear engine, format 2 */
+    const uint8_t* src_v_plane;  /* source V plane: bilinear engine, format 2 */
+    int32_t src_width; /* source size, pixels; rewritten when an RGBA picture is clipped */
     int32_t src_height;
     int32_t src_stride;        /* source row length: pixels (RGBA8888), bytes (planes) */
     int32_t src_buffer_height; /* rows in the source buffer */
     int32_t format;            /* format code of the bilinear engine */
-    void *dst;                 /* the canvas: 32-bit pixels or planes */
+    void* dst;                 /* the canvas: 32-bit pixels or planes */
     int32_t dst_width;         /* size of the scaled picture, pixels; rewritten when an RGBA */
     int32_t dst_height;        /* picture is clipped */
     int32_t canvas_width;      /* size of the canvas, pixels */
@@ -68,7 +68,8 @@ typedef struct ovrin_resize_target {
  * quarter and three quarters of the way across its source cell in each direction; each byte is
  * shifted right by 2 before it is added:
  *
- *     row1 = (j * src_h + (src_h >> 2)) / dst_h      row3 = (j * src_h + ((3 * src_h) >> 2)) / dst_h
+ *     row1 = (j * src_h + (src_h >> 2)) / dst_h
+ *     row3 = (j * src_h + ((3 * src_h) >> 2)) / dst_h
  *
  * and columns likewise. The shift drops the two low bits of every sample, so 252 is the largest
  * result: a white source (255) gives 252. Enlarging is allowed; it repeats samples.
@@ -84,11 +85,11 @@ typedef struct ovrin_resize_target {
  * With a source size of 0 or less the destination is filled with 0; with a destination size of 0
  * or less nothing is written.
  */
-OVRIN_API void ovrin_resize_rgba8888(const uint8_t *src, uint32_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_rgba8888(const uint8_t* src, uint32_t* dst, int32_t src_w,
                                      int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /* As ovrin_resize_rgba8888, on the calling thread whatever the height. */
-OVRIN_API void ovrin_resize_rgba8888_sg(const uint8_t *src, uint32_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_rgba8888_sg(const uint8_t* src, uint32_t* dst, int32_t src_w,
                                         int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /*
@@ -96,7 +97,7 @@ OVRIN_API void ovrin_resize_rgba8888_sg(const uint8_t *src, uint32_t *dst, int32
  * thread instead when the picture makes fewer than two bands, when its byte offsets do not fit the
  * band record, or when memory or threads are missing.
  */
-OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t *src, uint32_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int32_t src_w,
                                          int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /*
@@ -105,7 +106,7 @@ OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t *src, uint32_t *dst, int3
  * [i * dst_h, (i + 1) * dst_h).
  */
 typedef struct ovrin_rgba_band {
-    int32_t start_row; /* first source row of the band; 0: the running state below is at its start */
+    int32_t start_row; /* first source row; when 0, the running state below is at its start */
     int32_t row_q1;    /* next pending one-quarter row point, scaled coordinates */
     int32_t row_q3;    /* next pending three-quarter row point */
     int32_t row_acc;   /* start_row * dst_h */
@@ -123,8 +124,8 @@ typedef struct ovrin_rgba_band {
     int32_t dst_skip;   /* canvas pixels to the right of the picture; 0 without a canvas */
     int32_t band_rows;  /* source rows in a band */
     int32_t src_offset; /* byte offset of the band's first source row from src */
-    const uint8_t *src; /* the whole source picture */
-    uint32_t *dst;      /* the whole destination picture */
+    const uint8_t* src; /* the whole source picture */
+    uint32_t* dst;      /* the whole destination picture */
     int32_t rows_to_do; /* source rows that this band processes */
     int32_t done;       /* 0 until the band's task has finished, then 1 (stored with release) */
 } ovrin_rgba_band;
@@ -135,14 +136,14 @@ typedef struct ovrin_rgba_band {
  * adds their bytes to src_offset. Writes no other field.
  */
 OVRIN_API void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w,
-                                             int32_t dst_h, ovrin_rgba_band *band);
+                                             int32_t dst_h, ovrin_rgba_band* band);
 
 /*
  * Band task; band points to an ovrin_rgba_band. Adds the samples of rows_to_do source rows to what
  * the destination holds (the caller clears it beforehand), then sets done. Bands that add into one
  * destination row must not run at the same time.
  */
-OVRIN_API void _resize_rgba8888_tp(void *band);
+OVRIN_API void _resize_rgba8888_tp(void* band);
 
 /*
  * ---- RGBA8888 in a canvas ----------------------------------------------------------------------
@@ -156,24 +157,25 @@ OVRIN_API void _resize_rgba8888_tp(void *band);
  * proportion: dst_width becomes canvas_width - dst_x, and the source width becomes
  * (int)(target->src_width * ((double)new_dst_width / old_dst_width)); both are written back into
  * the target, likewise for heights. Keep target->src_width and src_height equal to the arguments:
- * they are what is cut.
+ * they are what is cut. A rectangle that a negative position puts outside the canvas's memory is
+ * not drawn.
  *
  * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
  * dst_y), or dst_height is 0. Threads as ovrin_resize_rgba8888, by src_h.
  */
-OVRIN_API void ovrin_resize_rgba8888_keep_ratio(const uint8_t *src, int32_t src_w, int32_t src_h,
-                                                ovrin_resize_target *target);
+OVRIN_API void ovrin_resize_rgba8888_keep_ratio(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                                ovrin_resize_target* target);
 
 /* On the calling thread. A src_stride of 0 samples the first row for every destination row. */
-OVRIN_API void ovrin_resize_rgba_keep_ratio_sg(const uint8_t *src, int32_t src_w, int32_t src_h,
-                                               ovrin_resize_target *target);
+OVRIN_API void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                               ovrin_resize_target* target);
 
 /*
  * In bands. Returns at once when target is null. A src_stride of 0 or less counts as the source
  * width here. Falls back to the calling thread as ovrin_resize_rgba8888_tps does.
  */
-OVRIN_API void ovrin_resize_rgba_keep_ratio_tps(const uint8_t *src, int32_t src_w, int32_t src_h,
-                                                ovrin_resize_target *target);
+OVRIN_API void ovrin_resize_rgba_keep_ratio_tps(const uint8_t* src, int32_t src_w, int32_t src_h,
+                                                ovrin_resize_target* target);
 
 /*
  * As ovrin_resize_rgba8888_get_pos, for a picture in a canvas: destination indices count canvas
@@ -182,10 +184,10 @@ OVRIN_API void ovrin_resize_rgba_keep_ratio_tps(const uint8_t *src, int32_t src_
  */
 OVRIN_API void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t src_w, int32_t src_h, int32_t dst_w,
                                                         int32_t dst_h, int32_t canvas_w,
-                                                        int32_t canvas_h, ovrin_rgba_band *band);
+                                                        int32_t canvas_h, ovrin_rgba_band* band);
 
 /* As _resize_rgba8888_tp, for a picture in a canvas: band->dst is the first word of row dst_y. */
-OVRIN_API void _resize_rgba8888_keep_ratio_tp(void *band);
+OVRIN_API void _resize_rgba8888_keep_ratio_tp(void* band);
 
 /*
  * ---- RGB888 and nearest neighbour --------------------------------------------------------------
@@ -195,7 +197,7 @@ OVRIN_API void _resize_rgba8888_keep_ratio_tp(void *band);
  * As ovrin_resize_rgba8888_sg with three bytes per pixel, in any channel order; always on the
  * calling thread.
  */
-OVRIN_API void ovrin_resize_rgb888(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+OVRIN_API void ovrin_resize_rgb888(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                    int32_t dst_w, int32_t dst_h);
 
 /*
@@ -206,7 +208,7 @@ OVRIN_API void ovrin_resize_rgb888(const uint8_t *src, uint8_t *dst, int32_t src
  *
  * Returns without writing when a pointer is null or a size is 0 or less.
  */
-OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t *src, uint32_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst, int32_t src_w,
                                              int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /*
@@ -222,37 +224,37 @@ OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t *src, uint32_t *dst,
  * up to multiples of 4 in each direction, and then cut to its own size: where the destination's
  * width or height is not a multiple of 4, the chroma that is kept covers a little less of the
  * source than the luma. Such sizes need a work buffer of 2 * width * height bytes, both rounded up;
- * without memory for it nothing is written. A destination size of 0 or less writes nothing; a source
- * size of 0 or less fills the destination with 0, chroma included.
+ * without memory for it nothing is written. A destination size of 0 or less writes nothing; a
+ * source size of 0 or less fills the destination with 0, chroma included.
  *
  * The keep-ratio forms paint the target's canvas black (luma 0, chroma 128) and place the picture,
- * scaled to dst_width x dst_height, at (dst_x, dst_y). What does not fit into the canvas is cut off,
- * not rescaled. Chroma goes to half the position rounded up, so with an odd dst_x or dst_y it lies
- * one pixel further right or down than the luma; chroma that would pass the end of the canvas is
- * dropped. Source luma rows lie target->src_stride bytes apart, chroma rows half as many samples,
- * rounded up. The target is never written. Nothing is touched if canvas_width < dst_x,
+ * scaled to dst_width x dst_height, at (dst_x, dst_y). What does not fit into the canvas is cut
+ * off, not rescaled. Chroma goes to half the position rounded up, so with an odd dst_x or dst_y it
+ * lies one pixel further right or down than the luma; chroma that would pass the end of the canvas
+ * is dropped. Source luma rows lie target->src_stride bytes apart, chroma rows half as many
+ * samples, rounded up. The target is never written. Nothing is touched if canvas_width < dst_x,
  * canvas_height < dst_y or dst_height is 0.
  *
  * Wrappers and drivers divide the work as for RGBA8888.
  */
 
 /* I420 to I420, contiguous buffers. */
-OVRIN_API void ovrin_resize_yuv420(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+OVRIN_API void ovrin_resize_yuv420(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                    int32_t dst_w, int32_t dst_h);
-OVRIN_API void ovrin_resize_yuv420_sg(const uint8_t *src, uint8_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_yuv420_sg(const uint8_t* src, uint8_t* dst, int32_t src_w,
                                       int32_t src_h, int32_t dst_w, int32_t dst_h);
-OVRIN_API void ovrin_resize_yuv420_tps(const uint8_t *src, uint8_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_yuv420_tps(const uint8_t* src, uint8_t* dst, int32_t src_w,
                                        int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /* Three source planes to a contiguous I420 buffer. */
-OVRIN_API void ovrin_resize_y_u_v(const uint8_t *src_y, const uint8_t *src_u, const uint8_t *src_v,
-                                  uint8_t *dst, int32_t src_w, int32_t src_h, int32_t dst_w,
+OVRIN_API void ovrin_resize_y_u_v(const uint8_t* src_y, const uint8_t* src_u, const uint8_t* src_v,
+                                  uint8_t* dst, int32_t src_w, int32_t src_h, int32_t dst_w,
                                   int32_t dst_h);
 
 /* Three source planes into an I420 canvas. */
-OVRIN_API void ovrin_resize_y_u_v_keep_ratio(const uint8_t *src_y, const uint8_t *src_u,
-                                             const uint8_t *src_v, int32_t src_w, int32_t src_h,
-                                             const ovrin_resize_target *target);
+OVRIN_API void ovrin_resize_y_u_v_keep_ratio(const uint8_t* src_y, const uint8_t* src_u,
+                                             const uint8_t* src_v, int32_t src_w, int32_t src_h,
+                                             const ovrin_resize_target* target);
 
 /*
  * Both of these: a null target selects the contiguous destination; otherwise dst, dst_w and dst_h
@@ -262,14 +264,14 @@ OVRIN_API void ovrin_resize_y_u_v_keep_ratio(const uint8_t *src_y, const uint8_t
  * of 0 or less for src_w, and its second test compares canvas_height with dst_x, not dst_y: a
  * picture that starts below the canvas gives a black canvas.
  */
-OVRIN_API void ovrin_resize_y_u_v_sg(const uint8_t *src_y, const uint8_t *src_u,
-                                     const uint8_t *src_v, uint8_t *dst, int32_t src_w,
+OVRIN_API void ovrin_resize_y_u_v_sg(const uint8_t* src_y, const uint8_t* src_u,
+                                     const uint8_t* src_v, uint8_t* dst, int32_t src_w,
                                      int32_t src_h, int32_t dst_w, int32_t dst_h,
-                                     const ovrin_resize_target *target);
-OVRIN_API void ovrin_resize_y_u_v_tps(const uint8_t *src_y, const uint8_t *src_u,
-                                      const uint8_t *src_v, uint8_t *dst, int32_t src_w,
+                                     const ovrin_resize_target* target);
+OVRIN_API void ovrin_resize_y_u_v_tps(const uint8_t* src_y, const uint8_t* src_u,
+                                      const uint8_t* src_v, uint8_t* dst, int32_t src_w,
                                       int32_t src_h, int32_t dst_w, int32_t dst_h,
-                                      const ovrin_resize_target *target);
+                                      const ovrin_resize_target* target);
 
 /*
  * One band of a planar picture. Points, bases and indices as in ovrin_rgba_band, once for luma and
@@ -303,11 +305,11 @@ typedef struct ovrin_yuv_band {
     int32_t band_rows;     /* luma rows in a band */
     int32_t src_y_offset;  /* bytes from the luma plane to the band's first row */
     int32_t src_uv_offset; /* bytes from either chroma plane to the band's first row */
-    const uint8_t *src;    /* the whole source buffer, or its luma plane */
-    uint8_t *dst;          /* the destination buffer, or the canvas */
-    const uint8_t *src_u;  /* chroma planes of a source in three planes */
-    const uint8_t *src_v;
-    uint8_t *work;   /* work buffer shared by all bands; null when dst takes the samples itself */
+    const uint8_t* src;    /* the whole source buffer, or its luma plane */
+    uint8_t* dst;          /* the destination buffer, or the canvas */
+    const uint8_t* src_u;  /* chroma planes of a source in three planes */
+    const uint8_t* src_v;
+    uint8_t* work;   /* work buffer shared by all bands; null when dst takes the samples itself */
     int32_t y_rows;  /* luma rows that this band processes */
     int32_t uv_rows; /* chroma rows that this band processes */
     int32_t done;    /* 0 until the band's task has finished, then 1 (stored with release) */
@@ -315,12 +317,12 @@ typedef struct ovrin_yuv_band {
 
 /*
  * Moves a band record to the following band without touching pixels, and sets y_rows and uv_rows to
- * the rows of the band just walked. A band has band_rows luma rows; its chroma is a quarter of that,
- * rounded up, and then as many rows more as it takes to complete a destination row. Luma rows beyond
- * the source give y_rows 0, chroma rows beyond it are cut off. src_width is not used.
+ * the rows of the band just walked. A band has band_rows luma rows; its chroma is a quarter of
+ * that, rounded up, and then as many rows more as it takes to complete a destination row. Luma rows
+ * beyond the source give y_rows 0, chroma rows beyond it are cut off. src_width is not used.
  */
 OVRIN_API void ovrin_resize_yuv420_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
-                                           int32_t dst_height, ovrin_yuv_band *band);
+                                           int32_t dst_height, ovrin_yuv_band* band);
 
 /*
  * Band tasks; band points to an ovrin_yuv_band. They add to what the work buffer or destination
@@ -328,33 +330,33 @@ OVRIN_API void ovrin_resize_yuv420_get_pos(int32_t src_width, int32_t src_height
  * reads three planes and prefers the work buffer whenever there is one; the second reads one
  * contiguous buffer.
  */
-OVRIN_API void _resize_y_u_v_tp(void *band);
-OVRIN_API void _resize_yuv420_tp(void *band);
+OVRIN_API void _resize_y_u_v_tp(void* band);
+OVRIN_API void _resize_yuv420_tp(void* band);
 
 /* NV21 to NV21, contiguous buffers. */
-OVRIN_API void ovrin_resize_nv21(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+OVRIN_API void ovrin_resize_nv21(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                  int32_t dst_w, int32_t dst_h);
-OVRIN_API void ovrin_resize_nv21_sg(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+OVRIN_API void ovrin_resize_nv21_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                     int32_t dst_w, int32_t dst_h);
-OVRIN_API void ovrin_resize_nv21_tps(const uint8_t *src, uint8_t *dst, int32_t src_w, int32_t src_h,
+OVRIN_API void ovrin_resize_nv21_tps(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                      int32_t dst_w, int32_t dst_h);
 
 /* Luma and chroma plane apart, to a contiguous NV21 buffer. */
-OVRIN_API void ovrin_resize_y_nv21(const uint8_t *src_y, const uint8_t *src_vu, uint8_t *dst,
+OVRIN_API void ovrin_resize_y_nv21(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
                                    int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h);
 
 /* Luma and chroma plane apart, into an NV21 canvas. */
-OVRIN_API void ovrin_resize_y_nv21_keep_ratio(const uint8_t *src_y, const uint8_t *src_vu,
+OVRIN_API void ovrin_resize_y_nv21_keep_ratio(const uint8_t* src_y, const uint8_t* src_vu,
                                               int32_t src_w, int32_t src_h,
-                                              const ovrin_resize_target *target);
+                                              const ovrin_resize_target* target);
 
 /* As ovrin_resize_y_u_v_sg and ovrin_resize_y_u_v_tps, for NV21. */
-OVRIN_API void ovrin_resize_y_nv_sg(const uint8_t *src_y, const uint8_t *src_vu, uint8_t *dst,
+OVRIN_API void ovrin_resize_y_nv_sg(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
                                     int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
-                                    const ovrin_resize_target *target);
-OVRIN_API void ovrin_resize_y_nv_tps(const uint8_t *src_y, const uint8_t *src_vu, uint8_t *dst,
+                                    const ovrin_resize_target* target);
+OVRIN_API void ovrin_resize_y_nv_tps(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
                                      int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
-                                     const ovrin_resize_target *target);
+                                     const ovrin_resize_target* target);
 
 /* One band of an NV21 picture; as ovrin_yuv_band, with one plane of chroma pairs. */
 typedef struct ovrin_nv21_band {
@@ -383,10 +385,10 @@ typedef struct ovrin_nv21_band {
     int32_t band_rows;
     int32_t src_y_offset;
     int32_t src_vu_offset;
-    const uint8_t *src;
-    uint8_t *dst;
-    const uint8_t *src_vu; /* chroma plane of a source in two planes */
-    uint8_t *work;
+    const uint8_t* src;
+    uint8_t* dst;
+    const uint8_t* src_vu; /* chroma plane of a source in two planes */
+    uint8_t* work;
     int32_t y_rows;
     int32_t vu_rows;
     int32_t done;
@@ -397,11 +399,169 @@ typedef struct ovrin_nv21_band {
  * takes all chroma rows that are left, and the bands after it get none.
  */
 OVRIN_API void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
-                                         int32_t dst_height, ovrin_nv21_band *band);
+                                         int32_t dst_height, ovrin_nv21_band* band);
 
 /* Band tasks; band points to an ovrin_nv21_band. As _resize_yuv420_tp and _resize_y_u_v_tp. */
-OVRIN_API void _resize_nv21_tp(void *band);
-OVRIN_API void _resize_y_nv21_tp(void *band);
+OVRIN_API void _resize_nv21_tp(void* band);
+OVRIN_API void _resize_y_nv21_tp(void* band);
+
+/*
+ * ---- Bilinear engine ---------------------------------------------------------------------------
+ *
+ * Scales by any ratio, up or down. Format codes:
+ *
+ *     7, 8     four 8-bit channels per pixel, in any order
+ *     2        planar YUV 4:2:0: Y, then U, then V
+ *     18, 19   semi-planar YUV 4:2:0: Y, then chroma pairs in any order
+ *
+ * The canvas always holds its planes one behind the other; so does the source without a target.
+ * With a target the source's size, row length and chroma planes come from it, as do the format and
+ * the canvas; src_w, src_h and format are then only tested for 0 or ignored. The target's dst_width
+ * and dst_height are not read: dst_w x dst_h is the size of the scaled picture. Without a target
+ * the canvas is dst_w x dst_h. The target is never written.
+ *
+ * The canvas is cleared (0; chroma 128) and the picture placed at (dst_x, dst_y); what does not fit
+ * is cut off. Source indices are i * (source size / destination size) in single precision. Weights
+ * have 12 fractional bits and lie a quarter of a pixel further right and down, up to 5119 / 4096:
+ * sums may wrap, and then a dark sample beside a bright one can come out bright. In the columns
+ * that sample at source column src_width - 2 and later there is no horizontal blend, in the rows
+ * from src_height - 2 on no vertical one. A source one pixel wide or high is read one pixel beyond
+ * its end, and so is the right end of its last two rows when enlarging; buffers must allow that.
+ * Chroma takes the weights of the luma pixel at its even column and row.
+ *
+ * Nothing is written when a size is 0, a destination size is negative, the format is another one,
+ * or memory is missing.
+ */
+
+/* On the calling thread, interpolating. */
+OVRIN_API void ov_bilinear_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                              int32_t dst_w, int32_t dst_h, int32_t format,
+                              const ovrin_resize_target* target);
+
+/*
+ * As ov_bilinear_sg below 1024 destination rows. From 1024 on, in bands of destination rows on four
+ * worker threads and the calling one, and without interpolation: each sample is the top left one of
+ * the four that ov_bilinear_sg would blend.
+ */
+OVRIN_API void ov_bilinear(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                           int32_t dst_w, int32_t dst_h, int32_t format,
+                           const ovrin_resize_target* target);
+
+/*
+ * For large reductions: halves the picture through ov_bilinear while the remaining ratio is 4 or
+ * more, then makes the last pass to dst. Every pass has the same format and target; with a target
+ * that means the same source geometry and canvas, so callers that want the halving pass null.
+ * Without memory for the two intermediate pictures it makes a single pass.
+ */
+OVRIN_API void ov_bilinear_ex(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                              int32_t dst_w, int32_t dst_h, int32_t format,
+                              const ovrin_resize_target* target);
+
+/* One band of destination rows of a bilinear picture. */
+typedef struct ovrin_bilinear_band {
+    const ovrin_resize_target* target; /* the caller's, or null */
+    int32_t src_width;                 /* source size, pixels */
+    int32_t src_height;
+    int32_t dst_w; /* size of the scaled picture inside the canvas */
+    int32_t dst_h;
+    const uint8_t* src;
+    uint8_t* dst; /* the canvas */
+    int32_t format;
+    void* reserved_pointer;    /* null */
+    const int32_t* col_weight; /* per destination column and row: weight of the next sample, 12 */
+    const int32_t* row_weight; /* fractional bits, and index of the sample; shared by all bands */
+    const int32_t* col_index;
+    const int32_t* row_index;
+    int32_t first_row; /* destination rows [first_row, end_row) */
+    int32_t end_row;
+    int32_t reserved;     /* 0 */
+    int32_t canvas_width; /* pixels */
+    int32_t src_pitch;    /* bytes from one source row to the next */
+    int32_t bpp;          /* bytes per pixel of the first plane */
+    int32_t edge_cols;    /* columns without horizontal blend */
+    int32_t edge_rows;    /* rows without vertical blend; 0 in all bands but the last */
+} ovrin_bilinear_band;
+
+/* Band task; band points to an ovrin_bilinear_band. Writes the band's rows; the canvas is cleared.
+ */
+OVRIN_API void _ov_bilinear_tp(void* band);
+
+/*
+ * ---- Lanczos engine ----------------------------------------------------------------------------
+ *
+ * A seven-tap filter with the three-lobe kernel sinc(x) * sinc(x / 3), stretched when reducing,
+ * still over seven taps. Sums are formed in double precision by fused multiply-adds in a fixed
+ * order, so results are the same on every processor. Rows and columns beyond the picture repeat its
+ * border.
+ */
+
+/* A picture of interleaved 8-bit components. */
+typedef struct lanczos_image {
+    int32_t width; /* pixels */
+    int32_t height;
+    int32_t stride; /* bytes from one row to the next; of a source: width * bytes_per_pixel */
+    int32_t bytes_per_pixel;
+    uint8_t* data; /* only read in a source */
+} lanczos_image;
+
+/*
+ * The kernel at distances 0, 0.00025, 0.0005 ... below 4 source pixels: 16000 floats. The caller
+ * releases the table with free(). Null when memory is missing.
+ */
+OVRIN_API float* create_lanczos_lookup(void);
+
+/* 1 when image is not null, its pointer is not null and its four numbers are above 0; otherwise 0.
+ */
+OVRIN_API int32_t checkOvImage(const lanczos_image* image);
+
+/*
+ * Resizes src into dst, on the calling thread; the pictures say to what size. Both should have the
+ * same bytes_per_pixel. Writes nothing when checkOvImage fails for either or memory is missing.
+ */
+OVRIN_API void OvTransformLanczos(const lanczos_image* src, const lanczos_image* dst);
+
+/* As OvTransformLanczos, for packed pictures. */
+OVRIN_API void ov_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst,
+                          int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
+
+/*
+ * Resizes a luma plane and, right behind it, a chroma plane of the same width and height in pairs:
+ * src_h rows of src_w * 2 bytes are read behind the source luma, dst_h rows of dst_w * 2 bytes
+ * written behind the destination luma. NV21's own chroma plane has only a quarter as many pairs;
+ * give buffers of that larger size.
+ */
+OVRIN_API void ov_lanczos_nv(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst,
+                             int32_t dst_w, int32_t dst_h);
+
+/*
+ * As ov_lanczos for pixels of 4 bytes (other sizes are not placed right), in bands of destination
+ * rows on four worker threads and the calling one; pictures that do not make two bands, and calls
+ * that get no threads, stay on the calling thread. Note the order of the arguments.
+ */
+OVRIN_API void ovrin_resize_lanczos(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                    int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
+
+/* One band of destination rows of a Lanczos picture. */
+typedef struct ovrin_lanczos_band {
+    int32_t src_w; /* source size, pixels */
+    int32_t src_h;
+    int32_t dst_w; /* destination size, pixels */
+    int32_t dst_h;
+    const uint8_t* src;
+    uint8_t* dst; /* the band's first destination row */
+    int32_t bytes_per_pixel;
+    int32_t first_row; /* the band's first destination row */
+    int32_t rows;      /* destination rows in the band */
+    const float* table;
+    const double* column_weights; /* 7 per destination column, shared by all bands */
+    const double* row_weights;    /* 7 per destination row, shared by all bands */
+} ovrin_lanczos_band;
+
+/*
+ * Band task; band points to an ovrin_lanczos_band. Writes nothing when src, dst or table is null or
+ * memory is missing.
+ */
+OVRIN_API void _resize_lanczos_tp(void* band);
 
 /*
  * ---- Thread pool -----------------------------------------------------------------------------
@@ -416,64 +576,68 @@ typedef struct ovrin_threadpool_queue {
     uint32_t head;  /* index of the oldest entry */
     uint32_t tail;  /* index where the next entry goes */
     uint32_t count; /* number of entries held */
-    void *entries[OVRIN_THREADPOOL_CAPACITY]; /* the ring; null where empty */
+    /* the ring; null where empty */
+    void* entries[OVRIN_THREADPOOL_CAPACITY];
 } ovrin_threadpool_queue;
 
 typedef struct ovrin_threadpool_task {
-    void (*function)(void *);
-    void *argument;
+    void (*function)(void*);
+    void* argument;
 } ovrin_threadpool_task;
 
 typedef struct ovrin_threadpool {
     ovrin_threadpool_queue pending;    /* tasks waiting to be run */
     ovrin_threadpool_queue free_slots; /* slots available for new tasks */
-    ovrin_threadpool_task tasks[OVRIN_THREADPOOL_CAPACITY]; /* the slots; queues point into them */
-    uint16_t thread_count;       /* workers started */
-    uint16_t stop;               /* 1 once teardown has begun */
-    pthread_t *threads;          /* one handle per worker */
-    pthread_mutex_t free_lock;   /* guards free_slots */
+    /* the slots; queues point into them */
+    ovrin_threadpool_task tasks[OVRIN_THREADPOOL_CAPACITY];
+    uint16_t thread_count;        /* workers started */
+    uint16_t stop;                /* 1 once teardown has begun */
+    pthread_t* threads;           /* one handle per worker */
+    pthread_mutex_t free_lock;    /* guards free_slots */
     pthread_mutex_t pending_lock; /* guards pending */
-    pthread_cond_t slot_freed;   /* submitters wait here; broadcast when free_slots gets its first entry */
-    pthread_cond_t task_ready;   /* workers wait here; broadcast when pending gets its first entry */
+    /* submitters wait here; broadcast when free_slots gets its first entry */
+    pthread_cond_t slot_freed;
+    /* workers wait here; broadcast when pending gets its first entry */
+    pthread_cond_t task_ready;
 } ovrin_threadpool;
 
 /*
  * Makes a pool of n worker threads. With n below 1 the pool has no workers: tasks are kept, not
  * run. Null when memory or a thread is missing, or when n is above 65535.
  */
-OVRIN_API ovrin_threadpool *ovrin_threadpool_init(int32_t n);
+OVRIN_API ovrin_threadpool* ovrin_threadpool_init(int32_t n);
 
 /*
  * Queues function(argument). With wait non-zero it blocks while no slot is free.
  * Returns 1 when queued, -2 when no slot is free and wait is 0, -1 on error (a null pool included).
  */
-OVRIN_API int32_t ovrin_threadpool_add_task(ovrin_threadpool *pool, void (*function)(void *),
-                                            void *argument, int32_t wait);
+OVRIN_API int32_t ovrin_threadpool_add_task(ovrin_threadpool* pool, void (*function)(void*),
+                                            void* argument, int32_t wait);
 
 /*
  * Ends the pool; tasks that are queued still run. With sync non-zero the call returns when all
  * have run and the pool is released; with 0 a thread of its own does that in the background. The
  * pool must not be null and must not be used afterwards.
  */
-OVRIN_API void ovrin_threadpool_free(ovrin_threadpool *pool, int32_t sync);
+OVRIN_API void ovrin_threadpool_free(ovrin_threadpool* pool, int32_t sync);
 
 /* Blocks until a task is queued and returns its slot; null once the pool stops and is empty. */
-OVRIN_API ovrin_threadpool_task *ovrin_threadpool_task_get_task(ovrin_threadpool *pool);
+OVRIN_API ovrin_threadpool_task* ovrin_threadpool_task_get_task(ovrin_threadpool* pool);
 
 /* Clears a slot. */
-OVRIN_API void ovrin_threadpool_task_init(ovrin_threadpool_task *task);
+OVRIN_API void ovrin_threadpool_task_init(ovrin_threadpool_task* task);
 
 /* Appends entry. Returns 0, or -1 when the queue is full or its next position is occupied. */
-OVRIN_API int32_t ovrin_threadpool_queue_enqueue(ovrin_threadpool_queue *queue, void *entry);
+OVRIN_API int32_t ovrin_threadpool_queue_enqueue(ovrin_threadpool_queue* queue, void* entry);
 
 /* Takes the oldest entry; null when the queue is null or empty. */
-OVRIN_API void *ovrin_threadpool_queue_dequeue(ovrin_threadpool_queue *queue);
+OVRIN_API void* ovrin_threadpool_queue_dequeue(ovrin_threadpool_queue* queue);
 
 /* 1 when the queue holds nothing, otherwise 0. */
-OVRIN_API int32_t ovrin_threadpool_queue_is_empty(const ovrin_threadpool_queue *queue);
+OVRIN_API int32_t ovrin_threadpool_queue_is_empty(const ovrin_threadpool_queue* queue);
 
 /* The number of entries held. */
-OVRIN_API uint32_t ovrin_threadpool_queue_getsize(const ovrin_threadpool_queue *queue);
+OVRIN_API uint32_t ovrin_threadpool_queue_getsize(const ovrin_threadpool_queue* queue);
 
 /* ---- Utility --------------------------------------------------------------------------------- */
 

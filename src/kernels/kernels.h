@@ -19,28 +19,31 @@ struct QuarterRowShape {
     int32_t source_samples;  // in a source row; taps are below this
     int32_t source_extent;   // source_extent / target_extent is the ratio of the two rows
     int32_t target_extent;
-    int32_t target_samples;  // still to be planned
 };
 
 constexpr int32_t kPlanBytes = 32 * 1024;
 constexpr int32_t kPlanTaps = kPlanBytes / static_cast<int32_t>(sizeof(Tap));
 
 // Where a strip of a target row takes its samples: made once per call and strip, in fixed storage
-// on the stack, and used for every row of the strip. Each set encodes the taps in its own way.
+// on the stack, and used for every row of the strip. Kernels encode the taps in their own ways.
 struct QuarterPlan {
     int32_t sample_bytes;
     int32_t samples;   // in the strip
     int32_t capacity;  // most samples that the strip can take; at least 1
-    int32_t windows;   // vector sets: source vectors that a target vector is gathered from; 0: taps
+    int32_t windows;   // vector kernels: source vectors that a target vector is gathered from
+    int64_t row_bytes;
     union {
         alignas(64) Tap taps[kPlanTaps];
         uint8_t bytes[kPlanBytes];
     };
 };
 
-// The quarter-point row kernels. begin starts an empty plan; append takes the taps of the next
-// `count` samples, in order, until capacity is reached. Then, for every sample i of the strip and
-// every byte c of a sample of N bytes:
+// Samples are appended in blocks of this many; only the last block of a strip may be shorter.
+constexpr int32_t kTapBlock = 256;
+
+// Row kernels that share a way of encoding a plan. append takes the taps of the next samples, in
+// order, until capacity is reached. Then, for every sample i of the strip and every byte c of a
+// sample of N bytes:
 //
 //   store_pair  dst[N*i + c]  = quarters(top, i, c) + quarters(bottom, i, c)
 //   add_pair    dst[N*i + c] += quarters(top, i, c) + quarters(bottom, i, c)
@@ -52,7 +55,6 @@ struct QuarterPlan {
 // Reads only bytes of the source_samples of each row; writes only bytes of the strip. No alignment
 // is needed; dst overlaps no source.
 struct QuarterKernels {
-    void (*begin)(QuarterPlan& plan, const QuarterRowShape& shape);
     void (*append)(QuarterPlan& plan, const Tap* taps, int32_t count);
     void (*store_pair)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom,
                        const QuarterPlan& plan);
@@ -61,19 +63,78 @@ struct QuarterKernels {
     void (*add_row)(uint8_t* dst, const uint8_t* row, const QuarterPlan& plan);
 };
 
-// dst[i] = row[taps[i]] for i in [0, count). Reads and writes nothing else.
-using CopyTaps4 = void(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count);
+// Starts an empty plan and returns the kernels to use with it: what is fastest depends on the
+// ratio.
+using BeginQuarterPlan = const QuarterKernels&(QuarterPlan& plan, const QuarterRowShape& shape);
+
+// Bilinear rows of samples of N bytes. index and wx hold, for every destination sample, the source
+// sample and the weight of the one to its right, with 12 fractional bits; wy weighs the lower row.
+// Weights run from 1024 to 5119. For i in [0, count) and c in [0, N), with P(row, k) =
+// row[N*(index[i] + k) + c], all products and sums modulo 2^32:
+//
+//   both        dst = ((P(top, 0) * (4096 - wx) + P(top, 1) * wx) * (4096 - wy) +
+//                      (P(bottom, 0) * (4096 - wx) + P(bottom, 1) * wx) * wy) >> 24
+//   vertical    dst = (P(top, 0) * (4096 - wy) + P(bottom, 0) * wy) << 12 >> 24
+//   horizontal  dst = (P(row, 0) * (4096 - wx) + P(row, 1) * wx) << 12 >> 24
+//   copy        dst = P(row, 0)
+//
+// at dst[N*i + c]. Only the bytes named are read or written. No alignment is needed; count is at
+// most kCopyTaps.
+struct BilinearKernels {
+    void (*both)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const int32_t* index,
+                 const int32_t* wx, int32_t wy, int32_t count);
+    void (*vertical)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const int32_t* index,
+                     int32_t wy, int32_t count);
+    void (*horizontal)(uint8_t* dst, const uint8_t* row, const int32_t* index, const int32_t* wx,
+                       int32_t count);
+    void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
+};
 constexpr int32_t kCopyTaps = 1024;
 
+// One row of a seven-tap filter over interleaved components, or part of it.
+struct LanczosRow {
+    uint8_t* dst;
+    const uint8_t* cache;  // seven source rows; a tap row's pixel 0 is three left of column 0
+    int64_t cache_pitch;   // bytes
+    int32_t src_components;
+    int32_t dst_components;
+    const int32_t* index;          // per pixel: the first of its seven taps in a row
+    const double* column_weights;  // per pixel: seven
+    const double* row_weights;     // seven
+    int32_t count;
+};
+
+// For pixel x in [0, count), component k in [0, dst_components), with v the row weights and h the
+// pixel's column weights:
+//
+//   acc = 0; for r in [0, 7), for i in [0, 7), in this order:
+//       acc = fma(v[r] * h[i], cache[r][index[x] * src_components + i * dst_components + k], acc)
+//   dst = acc + 0.5, truncated, clamped to 0 ... 255
+//
+// in double precision, each operation rounded once: the order and the fusing are part of the
+// result.
+using LanczosRowKernel = void(const LanczosRow& row);
+
 struct Kernels {
-    QuarterKernels quarter[4];  // for samples of 1, 2, 3 and 4 bytes
-    CopyTaps4* copy_taps4;
+    BeginQuarterPlan* begin_quarter_plan;
+    const BilinearKernels* bilinear;  // for samples of 1, 2 and 4 bytes
+    LanczosRowKernel* lanczos_row;
 };
 
 // The plain C++ kernels, which define what every other set must compute.
 extern const Kernels scalar_kernels;
 
-// The set in use on this processor.
+// The set in use: the best that this processor has.
 const Kernels& kernels();
+
+// For tests and benchmarks of the library's objects: all sets that this processor can run, the
+// scalar one first, and the choice of one of them for all calls from now on.
+struct NamedKernels {
+    const char* name;
+    const Kernels* kernels;
+};
+constexpr int32_t kMostSets = 4;
+int32_t available_kernels(NamedKernels sets[kMostSets]);
+void force_kernels(const Kernels& set);
 
 }  // namespace ovrin

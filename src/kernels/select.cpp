@@ -1,10 +1,75 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kernels/kernels.h"
+#include "kernels/cpu.h"
+#include "kernels/sets.h"
+
+// Builds for tests may cap the choice: 0 scalar, 1 AVX2, 2 AVX-512.
+#ifndef OVRIN_MOST_KERNELS
+#define OVRIN_MOST_KERNELS 2
+#endif
 
 namespace ovrin {
 
+const Kernels scalar_kernels = {begin_quarter_plan_scalar, bilinear_scalar, lanczos_row_scalar};
+
+namespace {
+
+#if defined(__x86_64__)
+
+constexpr Kernels kAvx2Kernels = {begin_quarter_plan_avx2, bilinear_scalar, lanczos_row_scalar};
+constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, bilinear_scalar, lanczos_row_scalar};
+
+const Kernels* best_kernels() {
+    const CpuFeatures cpu = cpu_features();
+    if (cpu.avx512_vbmi && OVRIN_MOST_KERNELS >= 2) return &kAvx512Kernels;
+    if (cpu.avx2 && OVRIN_MOST_KERNELS >= 1) return &kAvx2Kernels;
+    return &scalar_kernels;
+}
+
+#elif defined(__aarch64__)
+
+constexpr Kernels kNeonKernels = {begin_quarter_plan_neon, bilinear_scalar, lanczos_row_scalar};
+
+const Kernels* best_kernels() {
+    return OVRIN_MOST_KERNELS >= 1 ? &kNeonKernels : &scalar_kernels;
+}
+
+#else
+
+const Kernels* best_kernels() {
+    return &scalar_kernels;
+}
+
+#endif
+
+// Every thread that finds it empty stores the same pointer to a constant table.
+const Kernels* chosen = nullptr;
+
+}  // namespace
+
 const Kernels& kernels() {
-    return scalar_kernels;
+    const Kernels* set = __atomic_load_n(&chosen, __ATOMIC_RELAXED);
+    if (set == nullptr) {
+        set = best_kernels();
+        __atomic_store_n(&chosen, set, __ATOMIC_RELAXED);
+    }
+    return *set;
+}
+
+void force_kernels(const Kernels& set) {
+    __atomic_store_n(&chosen, &set, __ATOMIC_RELAXED);
+}
+
+int32_t available_kernels(NamedKernels sets[kMostSets]) {
+    int32_t count = 0;
+    sets[count++] = {"scalar", &scalar_kernels};
+#if defined(__x86_64__)
+    const CpuFeatures cpu = cpu_features();
+    if (cpu.avx2) sets[count++] = {"avx2", &kAvx2Kernels};
+    if (cpu.avx512_vbmi) sets[count++] = {"avx512", &kAvx512Kernels};
+#elif defined(__aarch64__)
+    sets[count++] = {"neon", &kNeonKernels};
+#endif
+    return count;
 }
 
 }  // namespace ovrin

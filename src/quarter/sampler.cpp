@@ -9,7 +9,8 @@ namespace ovrin {
 
 namespace {
 
-using PairKernel = decltype(QuarterKernels::store_pair);
+// Whether target rows are stored or added to what is there.
+enum class Write { kStore, kAdd };
 
 // Where the next samples of a source row go: those of the left columns and those of the right ones.
 struct RowTarget {
@@ -57,28 +58,27 @@ struct Columns {
 
 // One strip of the plane: its columns, planned, and where they start.
 struct Strip {
-    const QuarterKernels& kernel;
-    PairKernel pair;
+    const QuarterKernels& kernels;
     const QuarterPlan& plan;
     Columns columns;
+    Write write;
 };
 
-constexpr int32_t kTapBlock = 256;
-
 // Plans as many of the columns as one strip takes.
-void plan_strip(const QuarterPlane& plane, int32_t samples_left, const QuarterKernels& kernel,
-                Columns& columns, QuarterPlan& plan) {
-    kernel.begin(plan, {plane.sample_bytes, plane.src_samples, plane.src_columns, plane.dst_columns,
-                        samples_left});
+const QuarterKernels& plan_strip(const QuarterPlane& plane, int32_t samples_left, Columns& columns,
+                                 QuarterPlan& plan) {
+    const QuarterKernels& strip_kernels = kernels().begin_quarter_plan(
+        plan, {plane.sample_bytes, plane.src_samples, plane.src_columns, plane.dst_columns});
     const int32_t samples = samples_left < plan.capacity ? samples_left : plan.capacity;
     Tap taps[kTapBlock];
     for (int32_t planned = 0; planned < samples;) {
         const int32_t rest = samples - planned;
         const int32_t count = rest < kTapBlock ? rest : kTapBlock;
         for (int32_t i = 0; i < count; ++i) taps[i] = columns.next();
-        kernel.append(plan, taps, count);
+        strip_kernels.append(plan, taps, count);
         planned += count;
     }
+    return strip_kernels;
 }
 
 void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const QuarterPlan& plan) {
@@ -92,7 +92,7 @@ void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const Quar
 
 void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
     if (target.left == target.right) {
-        strip.kernel.add_row(target.left, row, strip.plan);
+        strip.kernels.add_row(target.left, row, strip.plan);
         return;
     }
     // Only a record that no walk has made sends the columns' samples to two places.
@@ -107,6 +107,8 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     const auto row = [&](const QuarterPoints& points) {
         return plane.src + points.cell() * plane.src_pitch;
     };
+    const auto pair =
+        strip.write == Write::kStore ? strip.kernels.store_pair : strip.kernels.add_pair;
     while (scan.has_top() || scan.has_bottom()) {
         const bool both = scan.has_pair();
         // On one source row the bottom half goes first: it closes the row that is open.
@@ -114,7 +116,7 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            strip.pair(scan.top_target.left, row(scan.top), row(scan.bottom), strip.plan);
+            pair(scan.top_target.left, row(scan.top), row(scan.bottom), strip.plan);
         } else if (take_top) {
             add_row(strip, scan.top_target, row(scan.top));
         } else {
@@ -131,16 +133,16 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     }
 }
 
-void scan_plane(const QuarterPlane& plane, RowScan scan, const QuarterKernels& kernel,
-                PairKernel pair) {
+void scan_plane(const QuarterPlane& plane, RowScan scan, Write write) {
     Columns columns = {
         {quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns},
         {three_quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns}};
     QuarterPlan plan;
     for (int32_t done = 0; done < plane.samples; done += plan.samples) {
         const Columns first = columns;
-        plan_strip(plane, plane.samples - done, kernel, columns, plan);
-        scan_strip(plane, scan, {kernel, pair, plan, first});
+        const QuarterKernels& strip_kernels =
+            plan_strip(plane, plane.samples - done, columns, plan);
+        scan_strip(plane, scan, {strip_kernels, plan, first, write});
         const ptrdiff_t strip_bytes = ptrdiff_t{plan.samples} * plane.sample_bytes;
         scan.top_target.move(strip_bytes);
         scan.bottom_target.move(strip_bytes);
@@ -170,8 +172,7 @@ void sample_plane(const QuarterPlane& plane) {
         target,
         plane.src_rows,
     };
-    const QuarterKernels& kernel = kernels().quarter[plane.sample_bytes - 1];
-    scan_plane(plane, scan, kernel, kernel.store_pair);
+    scan_plane(plane, scan, Write::kStore);
 }
 
 void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
@@ -186,8 +187,7 @@ void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
         {at(state.bottom_left), at(state.bottom_right)},
         rows,
     };
-    const QuarterKernels& kernel = kernels().quarter[plane.sample_bytes - 1];
-    scan_plane(plane, scan, kernel, kernel.add_pair);
+    scan_plane(plane, scan, Write::kAdd);
 }
 
 }  // namespace ovrin

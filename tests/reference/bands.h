@@ -1,21 +1,31 @@
 // SPDX-License-Identifier: Apache-2.0
+// How a picture is cut into bands.
 #pragma once
 
 #include <cstdint>
 
 namespace reference {
 
-// Rows in a band: the ratio of the source's rows to the destination's, doubled until it passes 31.
-inline int32_t band_height(int32_t src_h, int32_t dst_h) {
-    int32_t ratio = src_h / dst_h;
+// Source rows in a band: the height ratio, doubled until it passes 31, so that a whole ratio puts
+// every cut on a destination row.
+inline int64_t band_height(int64_t src_h, int64_t dst_h) {
+    const int64_t ratio = dst_h == 0 ? 0 : src_h / dst_h;
     if (ratio <= 0) return 32;
-    while (ratio <= 31) ratio *= 2;
-    return ratio;
+    int64_t rows = ratio;
+    while (rows <= 31) rows *= 2;
+    return rows;
 }
 
-// Bands that `rows` rows make, halves counting as one.
-inline int32_t band_count(int32_t rows, int32_t height) {
-    return (rows + (height >> 1)) / height;
+// The number of whole bands nearest to src_h.
+inline int64_t band_count(int64_t src_h, int64_t dst_h) {
+    const int64_t rows = band_height(src_h, dst_h);
+    return (src_h + (rows >> 1)) / rows;
+}
+
+// The same where destination rows are cut, as the engines do.
+inline int64_t destination_band_count(int64_t src_h, int64_t dst_h) {
+    const int64_t rows = band_height(src_h, dst_h);
+    return (dst_h + (rows >> 1)) / rows;
 }
 
 }  // namespace reference

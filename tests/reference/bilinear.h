@@ -292,7 +292,7 @@ inline void bilinear_single(const BilinearGeometry& g, int32_t src_w, int32_t sr
 
 inline void bilinear(const BilinearGeometry& g, int32_t src_w, int32_t src_h, int32_t dst_w,
                      int32_t dst_h, BilinearSource& src, std::vector<uint8_t>& canvas) {
-    const bool banded = dst_h > 1023 && band_count(dst_h, band_height(src_h, dst_h)) > 1;
+    const bool banded = dst_h > 1023 && destination_band_count(src_h, dst_h) > 1;
     bilinear_picture(banded ? Sampling::kPoint : Sampling::kBlend, g, src_w, src_h, dst_w, dst_h,
                      src, canvas);
 }

@@ -193,8 +193,8 @@ inline std::vector<uint8_t> lanczos_nv(const uint8_t* src, int32_t src_w, int32_
 // The threaded entry: bands are placed, and the destination is cleared, as if pixels had 4 bytes.
 inline std::vector<uint8_t> resize_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h,
                                            int32_t dst_w, int32_t dst_h, int32_t bpp) {
-    const int32_t height = band_height(src_h, dst_h);
-    const int32_t count = band_count(dst_h, height);
+    const auto height = static_cast<int32_t>(band_height(src_h, dst_h));
+    const auto count = static_cast<int32_t>(destination_band_count(src_h, dst_h));
     if (count < 2) return lanczos(src, src_w, src_h, dst_w, dst_h, bpp);
     std::vector<uint8_t> dst(static_cast<size_t>(int64_t{dst_w} * dst_h * 4));
     for (int32_t band = 0; band < count; ++band) {

@@ -1,16 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kernels/kernels.h"
+#include "kernels/sets.h"
 
 namespace ovrin {
 
 namespace {
-
-void begin(QuarterPlan& plan, const QuarterRowShape& shape) {
-    plan.sample_bytes = shape.sample_bytes;
-    plan.samples = 0;
-    plan.capacity = kPlanTaps;
-    plan.windows = 0;
-}
 
 void append(QuarterPlan& plan, const Tap* taps, int32_t count) {
     for (int32_t i = 0; i < count; ++i) plan.taps[plan.samples + i] = taps[i];
@@ -60,18 +53,21 @@ void add_row(uint8_t* dst, const uint8_t* row, const QuarterPlan& plan) {
 
 template <int N>
 constexpr QuarterKernels quarter_kernels() {
-    return {begin, append, store_pair<N>, add_pair<N>, add_row<N>};
+    return {append, store_pair<N>, add_pair<N>, add_row<N>};
 }
 
-void copy_taps4(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count) {
-    for (int32_t i = 0; i < count; ++i) dst[i] = row[taps[i]];
-}
+constexpr QuarterKernels kQuarterKernels[] = {quarter_kernels<1>(), quarter_kernels<2>(),
+                                              quarter_kernels<3>(), quarter_kernels<4>()};
 
 }  // namespace
 
-constexpr Kernels scalar_kernels = {
-    {quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>()},
-    copy_taps4,
-};
+const QuarterKernels& begin_quarter_plan_scalar(QuarterPlan& plan, const QuarterRowShape& shape) {
+    plan.sample_bytes = shape.sample_bytes;
+    plan.samples = 0;
+    plan.capacity = kPlanTaps;
+    plan.windows = 0;
+    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
+    return kQuarterKernels[shape.sample_bytes - 1];
+}
 
 }  // namespace ovrin

@@ -1,0 +1,57 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kernels/cpu.h"
+
+#if defined(__x86_64__)
+#include <cpuid.h>
+#include <stdint.h>
+#endif
+
+namespace ovrin {
+
+#if defined(__x86_64__)
+
+namespace {
+
+struct CpuidLeaf {
+    unsigned eax = 0, ebx = 0, ecx = 0, edx = 0;
+
+    explicit CpuidLeaf(unsigned leaf) { __get_cpuid_count(leaf, 0, &eax, &ebx, &ecx, &edx); }
+};
+
+constexpr bool has(unsigned flags, unsigned wanted) {
+    return (flags & wanted) == wanted;
+}
+
+// Register state that the operating system saves when it switches threads.
+unsigned saved_state() {
+    unsigned low, high;
+    __asm__ volatile("xgetbv" : "=a"(low), "=d"(high) : "c"(0));
+    return low;
+}
+
+constexpr unsigned kYmmState = 0x06;
+constexpr unsigned kZmmState = 0xE6;
+
+}  // namespace
+
+CpuFeatures cpu_features() {
+    const CpuidLeaf basic(1);
+    if (!has(basic.ecx, bit_OSXSAVE | bit_AVX | bit_FMA)) return {false, false};
+    const CpuidLeaf extended(7);
+    const unsigned state = saved_state();
+    const bool avx2 = has(extended.ebx, bit_AVX2) && has(state, kYmmState);
+    const bool avx512 =
+        has(extended.ebx, bit_AVX512F | bit_AVX512BW | bit_AVX512DQ | bit_AVX512VL) &&
+        has(extended.ecx, bit_AVX512VBMI) && has(state, kZmmState);
+    return {avx2, avx2 && avx512};
+}
+
+#else
+
+CpuFeatures cpu_features() {
+    return {false, false};
+}
+
+#endif
+
+}  // namespace ovrin

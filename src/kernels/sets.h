@@ -1,0 +1,18 @@
+// SPDX-License-Identifier: Apache-2.0
+// What each instruction set's files give to the tables in select.cpp.
+#pragma once
+
+#include "kernels/kernels.h"
+
+namespace ovrin {
+
+BeginQuarterPlan begin_quarter_plan_scalar;
+BeginQuarterPlan begin_quarter_plan_avx2;
+BeginQuarterPlan begin_quarter_plan_avx512;
+BeginQuarterPlan begin_quarter_plan_neon;
+
+extern const BilinearKernels bilinear_scalar[3];
+
+LanczosRowKernel lanczos_row_scalar;
+
+}  // namespace ovrin

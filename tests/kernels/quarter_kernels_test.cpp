@@ -1,0 +1,176 @@
+// SPDX-License-Identifier: Apache-2.0
+// Every instruction set's row kernels against the scalar ones, which other tests compare with the
+// definition.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <memory>
+
+#include "kernels/kernels.h"
+#include "reference/quarter.h"
+#include "support/compare.h"
+#include "support/guarded_buffer.h"
+#include "support/random.h"
+
+using namespace ovrin;
+using namespace ovrin_test;
+
+namespace {
+
+struct Row {
+    int32_t sample_bytes;
+    int32_t source_samples;
+    int32_t samples;
+    int32_t unit;  // what the ratio counts per sample: 1, or the bytes of an interleaved pair
+};
+
+std::vector<Tap> taps_of(const Row& row) {
+    const int64_t source = int64_t{row.source_samples} * row.unit;
+    const int64_t target = int64_t{row.samples} * row.unit;
+    std::vector<Tap> taps;
+    for (int32_t k = 0; k < row.samples; ++k) {
+        taps.push_back({static_cast<int32_t>(reference::near_cell(k, source, target)),
+                        static_cast<int32_t>(reference::far_cell(k, source, target))});
+    }
+    return taps;
+}
+
+// One strip of a row, planned by one set.
+struct Planned {
+    QuarterPlan plan;
+    const QuarterKernels* kernels;
+};
+
+std::unique_ptr<Planned> plan_with(const Kernels& set, const Row& row, const Tap* taps,
+                                   int32_t count) {
+    auto planned = std::make_unique<Planned>();
+    planned->kernels = &set.begin_quarter_plan(
+        planned->plan, {row.sample_bytes, row.source_samples, row.source_samples * row.unit,
+                        row.samples * row.unit});
+    const int32_t strip = std::min(count, planned->plan.capacity);
+    for (int32_t done = 0; done < strip; done += kTapBlock) {
+        planned->kernels->append(planned->plan, taps + done, std::min(strip - done, kTapBlock));
+    }
+    return planned;
+}
+
+enum class Kernel { kStorePair, kAddPair, kAddRow };
+
+void run(const Planned& planned, Kernel kernel, uint8_t* dst, const uint8_t* top,
+         const uint8_t* bottom) {
+    switch (kernel) {
+        case Kernel::kStorePair:
+            return planned.kernels->store_pair(dst, top, bottom, planned.plan);
+        case Kernel::kAddPair:
+            return planned.kernels->add_pair(dst, top, bottom, planned.plan);
+        case Kernel::kAddRow:
+            return planned.kernels->add_row(dst, top, planned.plan);
+    }
+}
+
+// Compares the strips of a whole row; returns whether the set has kernels of its own for it.
+bool check_row(const NamedKernels& set, const Row& row, Random& random) {
+    const std::vector<Tap> taps = taps_of(row);
+    const size_t row_bytes =
+        static_cast<size_t>(row.source_samples) * static_cast<size_t>(row.sample_bytes);
+    bool differs = false;
+    for (int32_t done = 0; done < row.samples;) {
+        const auto tested = plan_with(*set.kernels, row, taps.data() + done, row.samples - done);
+        const int32_t strip = tested->plan.samples;
+        for (const Kernel kernel : {Kernel::kStorePair, Kernel::kAddPair, Kernel::kAddRow}) {
+            const Flush flush = random.pick({Flush::kEnd, Flush::kStart});
+            const GuardedBuffer<uint8_t> top(random.bytes(row_bytes), flush);
+            const GuardedBuffer<uint8_t> bottom(random.bytes(row_bytes), flush);
+            const auto before = random.bytes(static_cast<size_t>(strip * row.sample_bytes));
+            GuardedBuffer<uint8_t> actual(before, flush);
+            run(*tested, kernel, actual.data(), top.data(), bottom.data());
+            std::vector<uint8_t> expected(before);
+            for (int32_t at = 0; at < strip;) {
+                const auto scalar =
+                    plan_with(scalar_kernels, row, taps.data() + done + at, strip - at);
+                run(*scalar, kernel, expected.data() + at * row.sample_bytes, top.data(),
+                    bottom.data());
+                at += scalar->plan.samples;
+                differs |= scalar->kernels != tested->kernels;
+            }
+            EXPECT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()))
+                << set.name << " kernel " << static_cast<int>(kernel) << ": " << row.source_samples
+                << " to " << row.samples << " samples of " << row.sample_bytes
+                << " bytes, strip at " << done;
+            EXPECT_TRUE(actual.intact());
+        }
+        done += strip;
+    }
+    return differs;
+}
+
+class VectorQuarterKernels : public ::testing::Test {
+protected:
+    void SetUp() override {
+        NamedKernels sets[kMostSets];
+        const int32_t count = available_kernels(sets);
+        vector_sets_.assign(sets + 1, sets + count);
+        if (vector_sets_.empty()) GTEST_SKIP() << "this processor has no vector set";
+    }
+
+    std::vector<NamedKernels> vector_sets_;
+};
+
+}  // namespace
+
+TEST_F(VectorQuarterKernels, RandomRowsEqualTheScalarOnes) {
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(31);
+        SCOPED_TRACE(random.trace());
+        int own = 0;
+        const int count = rounds(3000);
+        for (int i = 0; i < count && !HasFailure(); ++i) {
+            const int32_t n = random.between(1, 4);
+            own += check_row(set, {n, random.awkward_size(), random.awkward_size(), 1}, random);
+        }
+        // Otherwise only scalar kernels would have been compared with themselves.
+        EXPECT_GT(own, count / 4) << set.name;
+    }
+}
+
+TEST_F(VectorQuarterKernels, EveryRatioUpToTenOfLongRows) {
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(32);
+        SCOPED_TRACE(random.trace());
+        for (int32_t tenths = 1; tenths <= 100 && !HasFailure(); ++tenths) {
+            for (const int32_t n : {1, 2, 3, 4}) {
+                const int32_t samples = random.between(257, 700);
+                const int32_t source = std::max(1, samples * tenths / 10 + random.between(-3, 3));
+                check_row(set, {n, source, samples, n == 2 ? 2 : 1}, random);
+            }
+        }
+    }
+}
+
+TEST_F(VectorQuarterKernels, RowsOfSeveralStrips) {
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(33);
+        for (const int32_t n : {1, 2, 3, 4}) {
+            for (const int32_t source : {7000, 21013, 60001}) {
+                EXPECT_TRUE(check_row(set, {n, source, 20011, 1}, random)) << set.name;
+            }
+        }
+    }
+}
+
+TEST_F(VectorQuarterKernels, ExtremeSamples) {
+    for (const NamedKernels& set : vector_sets_) {
+        for (const int value : {0x00, 0xFF, 0x03, 0xFC}) {
+            const Row row = {1, 301, 200, 1};
+            const std::vector<Tap> taps = taps_of(row);
+            const auto planned = plan_with(*set.kernels, row, taps.data(), row.samples);
+            const std::vector<uint8_t> source(301, static_cast<uint8_t>(value));
+            std::vector<uint8_t> dst(200, 1);
+            run(*planned, Kernel::kStorePair, dst.data(), source.data(), source.data());
+            EXPECT_EQ(dst, std::vector<uint8_t>(200, static_cast<uint8_t>(value / 4 * 4)));
+            // Bytes wrap on their own.
+            run(*planned, Kernel::kAddPair, dst.data(), source.data(), source.data());
+            EXPECT_EQ(dst, std::vector<uint8_t>(200, static_cast<uint8_t>(value / 4 * 8)));
+        }
+    }
+}
