@@ -3,11 +3,11 @@
 // Compile with contraction off: only the sum over the taps is fused, and it says so.
 #pragma once
 
+#include <algorithm>
 #include <array>
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
-#include <cstring>
 #include <vector>
 
 #include "reference/bands.h"
@@ -140,14 +140,15 @@ struct LanczosSizes {
     int32_t dst_bpp;
 };
 
-// Rows [first, first + count) of the result; dst points to the first of them.
-inline void lanczos_rows_of(const LanczosSizes& s, const uint8_t* src, int32_t first, int32_t count,
-                            uint8_t* dst, int64_t dst_stride, LanczosStep* step = fused_step) {
+// A packed picture.
+inline std::vector<uint8_t> lanczos(const LanczosSizes& s, const uint8_t* src,
+                                    LanczosStep* step = fused_step) {
     static const std::vector<float> table = lanczos_table();
     const LanczosAxis rows = lanczos_rows(table, s.src_h, s.dst_h);
     const LanczosAxis columns = lanczos_columns(table, s.src_w, s.dst_w);
     const int64_t slot_bytes = int64_t{s.src_w + 6} * s.src_bpp;
-    for (int32_t y = first; y < first + count; ++y) {
+    std::vector<uint8_t> dst;
+    for (int32_t y = 0; y < s.dst_h; ++y) {
         const LanczosTaps& v = rows.taps[static_cast<size_t>(y)];
         const std::vector<uint8_t> cache =
             row_cache(src, s.src_w, s.src_h, s.src_bpp, rows.at[static_cast<size_t>(y)]);
@@ -164,20 +165,16 @@ inline void lanczos_rows_of(const LanczosSizes& s, const uint8_t* src, int32_t f
                         sum = step(weight, cache.at(static_cast<size_t>(offset)), sum);
                     }
                 }
-                dst[(y - first) * dst_stride + int64_t{x} * s.dst_bpp + k] = clip_to_byte(sum);
+                dst.push_back(clip_to_byte(sum));
             }
         }
     }
+    return dst;
 }
 
-// A packed picture.
 inline std::vector<uint8_t> lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, int32_t dst_w,
                                     int32_t dst_h, int32_t bpp, LanczosStep* step = fused_step) {
-    const int64_t stride = int64_t{dst_w} * bpp;
-    std::vector<uint8_t> dst(static_cast<size_t>(stride * dst_h));
-    lanczos_rows_of({src_w, src_h, dst_w, dst_h, bpp, bpp}, src, 0, dst_h, dst.data(), stride,
-                    step);
-    return dst;
+    return lanczos({src_w, src_h, dst_w, dst_h, bpp, bpp}, src, step);
 }
 
 // A luma plane and, behind it, pairs at full luma size on both sides.
@@ -190,18 +187,20 @@ inline std::vector<uint8_t> lanczos_nv(const uint8_t* src, int32_t src_w, int32_
     return dst;
 }
 
-// The threaded entry: bands are placed, and the destination is cleared, as if pixels had 4 bytes.
+// The threaded entry: the same picture, but with two bands or more the destination is cleared, and
+// the bands are placed in it, as if pixels had 4 bytes.
 inline std::vector<uint8_t> resize_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h,
                                            int32_t dst_w, int32_t dst_h, int32_t bpp) {
-    const auto height = static_cast<int32_t>(band_height(src_h, dst_h));
-    const auto count = static_cast<int32_t>(destination_band_count(src_h, dst_h));
-    if (count < 2) return lanczos(src, src_w, src_h, dst_w, dst_h, bpp);
+    const std::vector<uint8_t> picture = lanczos(src, src_w, src_h, dst_w, dst_h, bpp);
+    const int64_t height = band_height(src_h, dst_h);
+    const int64_t count = destination_band_count(src_h, dst_h);
+    if (count < 2) return picture;
     std::vector<uint8_t> dst(static_cast<size_t>(int64_t{dst_w} * dst_h * 4));
-    for (int32_t band = 0; band < count; ++band) {
-        const int32_t first = band * height;
-        const int32_t rows = band == count - 1 ? dst_h - first : height;
-        lanczos_rows_of({src_w, src_h, dst_w, dst_h, bpp, bpp}, src, first, rows,
-                        dst.data() + int64_t{dst_w} * first * 4, int64_t{dst_w} * bpp);
+    for (int64_t band = 0; band < count; ++band) {
+        const int64_t first = band * height;
+        const int64_t end = band == count - 1 ? dst_h : first + height;
+        std::copy(picture.begin() + first * dst_w * bpp, picture.begin() + end * dst_w * bpp,
+                  dst.begin() + first * dst_w * 4);
     }
     return dst;
 }
