@@ -536,7 +536,8 @@ OVRIN_API void ov_lanczos_nv(const uint8_t* src, int32_t src_w, int32_t src_h, u
 /*
  * As ov_lanczos for pixels of 4 bytes (other sizes are not placed right), in bands of destination
  * rows on four worker threads and the calling one; pictures that do not make two bands, and calls
- * that get no threads, stay on the calling thread. Note the order of the arguments.
+ * that get no threads, stay on the calling thread. A null src clears the destination where there
+ * are bands and writes nothing where there are none. Note the order of the arguments.
  */
 OVRIN_API void ovrin_resize_lanczos(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                     int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
