@@ -336,7 +336,7 @@ TEST(Lanczos, RowsMayFallJustShortOfASourceRow) {
     Random random(101);
     SCOPED_TRACE(random.trace());
     for (const auto& [src, dst] :
-         {std::pair<int32_t, int32_t>{18, 66}, {14, 110}, {3, 147}, {2, 98}, {49, 98 * 7}}) {
+         {std::pair<int32_t, int32_t>{18, 66}, {14, 110}, {3, 147}, {2, 98}}) {
         int short_of = 0;
         for (int32_t y = 0; y < dst; ++y) {
             const double p = static_cast<double>(src) / dst * y;
