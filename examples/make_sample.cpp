@@ -4,8 +4,8 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
-#include <cstdio>
 #include <exception>
+#include <iostream>
 #include <vector>
 
 #include "codecs.h"
@@ -481,7 +481,7 @@ void draw_title(Canvas* canvas) {
 
 int main(int argc, char** argv) {
     if (argc != 2) {
-        fprintf(stderr, "Usage: make_sample OUT.png\n");
+        std::cerr << "Usage: make_sample OUT.png\n";
         return 2;
     }
     try {
@@ -493,7 +493,7 @@ int main(int argc, char** argv) {
         tool::encode_png(canvas.picture(), file.stream());
         file.commit();
     } catch (const std::exception& error) {
-        fprintf(stderr, "make_sample: %s\n", error.what());
+        std::cerr << "make_sample: " << error.what() << "\n";
         return 1;
     }
     return 0;

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <utility>
 
 namespace tool {
 
@@ -60,24 +61,25 @@ Picture chroma_rearranged(const Picture& from, PixelFormat format) {
     return to;
 }
 
-// The mean colour of the 2 x 2 pixels of a chroma sample, or of those that exist.
 struct Mean {
     int r, g, b;
 };
 
+// The mean colour of the 2 x 2 pixels of a chroma sample. The last column and row stand in for
+// those that a picture of odd size lacks.
 Mean mean_color(const Picture& rgba, size_t x, size_t y) {
     const size_t width = static_cast<size_t>(rgba.size.width);
     const size_t height = static_cast<size_t>(rgba.size.height);
-    int sum[3] = {};
-    int count = 0;
-    for (size_t row = 2 * y; row < std::min(2 * y + 2, height); ++row) {
-        for (size_t column = 2 * x; column < std::min(2 * x + 2, width); ++column, ++count) {
-            const uint8_t* const pixel = rgba.bytes() + (row * width + column) * 4;
-            for (int channel = 0; channel < 3; ++channel) sum[channel] += pixel[channel];
-        }
-    }
-    const auto mean = [count](int total) { return (total + count / 2) / count; };
-    return {mean(sum[0]), mean(sum[1]), mean(sum[2])};
+    const uint8_t* const top = rgba.bytes() + 2 * y * width * 4;
+    const uint8_t* const bottom = rgba.bytes() + std::min(2 * y + 1, height - 1) * width * 4;
+    const size_t left = 2 * x * 4;
+    const size_t right = std::min(2 * x + 1, width - 1) * 4;
+    const auto mean = [&](size_t channel) {
+        return (top[left + channel] + top[right + channel] + bottom[left + channel] +
+                bottom[right + channel] + 2) >>
+               2;
+    };
+    return {mean(0), mean(1), mean(2)};
 }
 
 Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
@@ -140,6 +142,16 @@ Picture rgba_to_rgb(const Picture& rgba) {
     return rgb;
 }
 
+Picture to_rgba(const Picture& picture) {
+    if (has_chroma_planes(picture.format)) return yuv_to_rgba(picture);
+    return picture.format == PixelFormat::kRgb ? rgb_to_rgba(picture) : picture;
+}
+
+Picture from_rgba(Picture rgba, PixelFormat format) {
+    if (has_chroma_planes(format)) return rgba_to_yuv(rgba, format);
+    return format == PixelFormat::kRgb ? rgba_to_rgb(rgba) : std::move(rgba);
+}
+
 }  // namespace
 
 Picture converted(const Picture& picture, PixelFormat format) {
@@ -147,16 +159,7 @@ Picture converted(const Picture& picture, PixelFormat format) {
     if (has_chroma_planes(picture.format) && has_chroma_planes(format)) {
         return chroma_rearranged(picture, format);
     }
-    switch (picture.format) {
-        case PixelFormat::kRgb:
-            return converted(rgb_to_rgba(picture), format);
-        case PixelFormat::kI420:
-        case PixelFormat::kNv21:
-            return converted(yuv_to_rgba(picture), format);
-        case PixelFormat::kRgba:
-            break;
-    }
-    return format == PixelFormat::kRgb ? rgba_to_rgb(picture) : rgba_to_yuv(picture, format);
+    return from_rgba(to_rgba(picture), format);
 }
 
 }  // namespace tool

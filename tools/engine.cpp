@@ -27,37 +27,45 @@ void resize_whole(const Picture& source, Picture* result) {
     }
 }
 
-void resize_on_canvas(const Picture& source, const Placement& placement, Picture* result) {
-    const Size size = source.size;
-    const uint8_t* const luma = source.bytes();
-    const uint8_t* const chroma = luma + size.pixels();
-    const size_t u_bytes = Size{(size.width + 1) / 2, (size.height + 1) / 2}.pixels();
-
+ovrin_resize_target target_of(Size source, const Placement& placement, void* canvas) {
     ovrin_resize_target target = {};
-    target.src_width = target.src_stride = size.width;
-    target.src_height = target.src_buffer_height = size.height;
-    target.dst = result->words.data();
+    target.src_width = target.src_stride = source.width;
+    target.src_height = target.src_buffer_height = source.height;
+    target.dst = canvas;
     target.dst_width = placement.picture.width;
     target.dst_height = placement.picture.height;
     target.canvas_width = placement.result.width;
     target.canvas_height = placement.result.height;
     target.dst_x = placement.x;
     target.dst_y = placement.y;
-    switch (source.format) {
-        case PixelFormat::kRgba:
-            return ovrin_resize_rgba8888_keep_ratio(luma, size.width, size.height, &target);
-        case PixelFormat::kI420:
-            return ovrin_resize_y_u_v_keep_ratio(luma, chroma, chroma + u_bytes, size.width,
-                                                 size.height, &target);
-        case PixelFormat::kNv21:
-            return ovrin_resize_y_nv21_keep_ratio(luma, chroma, size.width, size.height, &target);
-        case PixelFormat::kRgb: {
-            // The library places no RGB; RGBA gives the same bytes.
-            Picture canvas(placement.result);
-            resize_on_canvas(converted(source, PixelFormat::kRgba), placement, &canvas);
-            *result = converted(canvas, PixelFormat::kRgb);
-        }
+    return target;
+}
+
+void place_rgba(const Picture& source, const Placement& placement, Picture* canvas) {
+    ovrin_resize_target target = target_of(source.size, placement, canvas->words.data());
+    ovrin_resize_rgba8888_keep_ratio(source.bytes(), source.size.width, source.size.height,
+                                     &target);
+}
+
+void place_yuv(const Picture& source, const Placement& placement, Picture* canvas) {
+    const ovrin_resize_target target = target_of(source.size, placement, canvas->bytes());
+    const auto [width, height] = source.size;
+    const uint8_t* const luma = source.bytes();
+    const uint8_t* const chroma = luma + source.size.pixels();
+    if (source.format == PixelFormat::kNv21) {
+        return ovrin_resize_y_nv21_keep_ratio(luma, chroma, width, height, &target);
     }
+    const uint8_t* const v = chroma + Size{(width + 1) / 2, (height + 1) / 2}.pixels();
+    ovrin_resize_y_u_v_keep_ratio(luma, chroma, v, width, height, &target);
+}
+
+void resize_on_canvas(const Picture& source, const Placement& placement, Picture* canvas) {
+    if (has_chroma_planes(source.format)) return place_yuv(source, placement, canvas);
+    if (source.format == PixelFormat::kRgba) return place_rgba(source, placement, canvas);
+    // The library places no RGB; RGBA gives the same bytes.
+    Picture rgba(placement.result);
+    place_rgba(converted(source, PixelFormat::kRgba), placement, &rgba);
+    *canvas = converted(rgba, PixelFormat::kRgb);
 }
 
 }  // namespace

@@ -33,7 +33,7 @@ public:
 
 private:
     struct Close {
-        void operator()(FILE* file) const { fclose(file); }
+        void operator()(FILE* file) const { static_cast<void>(fclose(file)); }
     };
 
     std::unique_ptr<FILE, Close> file_;

@@ -5,6 +5,8 @@
 #include <cstdio>
 #include <exception>
 #include <initializer_list>
+#include <iomanip>
+#include <iostream>
 #include <memory>
 #include <new>
 #include <optional>
@@ -188,14 +190,15 @@ private:
 };
 
 void report(const Source& source, const Placement& placement, int64_t frames, double milliseconds) {
-    const std::string canvas = placement.on_canvas ? " on " + to_string(placement.result) : "";
-    fprintf(stderr, "%s %s to %s%s: ", name_of(source.kind().format),
-            to_string(source.size()).c_str(), to_string(placement.picture).c_str(), canvas.c_str());
+    std::cerr << name_of(source.kind().format) << " " << to_string(source.size()) << " to "
+              << to_string(placement.picture);
+    if (placement.on_canvas) std::cerr << " on " << to_string(placement.result);
+    std::cerr << ": " << std::fixed << std::setprecision(2);
     if (frames == 1) {
-        fprintf(stderr, "resized in %.2f ms\n", milliseconds);
+        std::cerr << "resized in " << milliseconds << " ms\n";
     } else {
-        fprintf(stderr, "%lld frames resized in %.2f ms each\n", static_cast<long long>(frames),
-                milliseconds / static_cast<double>(frames));
+        std::cerr << frames << " frames resized in " << milliseconds / static_cast<double>(frames)
+                  << " ms each\n";
     }
 }
 
@@ -237,18 +240,18 @@ void run(const Options& options) {
 }
 
 // One line whatever the message holds: it may quote names and arguments.
-ExitCode fail(ExitCode code, std::string message) {
-    for (char& letter : message) {
-        if (letter == '\n') letter = ' ';
-        if (static_cast<unsigned char>(letter) < ' ' || letter == 127) letter = '?';
+ExitCode fail(ExitCode code, const char* message) {
+    static_cast<void>(fputs("ovrinresize: ", stderr));
+    for (; *message != '\0'; ++message) {
+        const auto letter = static_cast<unsigned char>(*message);
+        const bool is_control = letter < ' ' || letter == 127;
+        static_cast<void>(fputc(is_control ? ' ' : letter, stderr));
     }
-    fprintf(stderr, "ovrinresize: %s\n", message.c_str());
+    static_cast<void>(fputc('\n', stderr));
     return code;
 }
 
-}  // namespace
-
-int main(int argc, char** argv) {
+int command(int argc, char** argv) {
     CLI::App app("Resize pictures and video frames.", "ovrinresize");
     Options options;
     try {
@@ -258,12 +261,18 @@ int main(int argc, char** argv) {
     } catch (const CLI::Error& error) {
         return fail(kWrongUsage, error.what());
     }
+    run(options);
+    return kDone;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
     try {
-        run(options);
+        return command(argc, argv);
     } catch (const std::bad_alloc&) {
         return fail(kFailed, "not enough memory");
     } catch (const std::exception& error) {
         return fail(kFailed, error.what());
     }
-    return kDone;
 }

@@ -19,19 +19,27 @@ namespace {
 // The name that a signal handler has to remove; null when there is none.
 const char* volatile doomed_file = nullptr;
 
+// The handler is taken away when it is called, so the second signal ends the program.
 void remove_and_die(int signal_number) {
     if (doomed_file != nullptr) unlink(doomed_file);
-    signal(signal_number, SIG_DFL);
-    raise(signal_number);
+    static_cast<void>(raise(signal_number));
 }
 
 void remove_on_signals(const char* name) {
     doomed_file = name;
-    signal(SIGXFSZ, SIG_IGN);  // a file past its size limit is an error to report like any other
+    struct sigaction removing = {};
+    removing.sa_handler = remove_and_die;
+    removing.sa_flags = static_cast<int>(SA_RESETHAND);
     for (const int number : {SIGHUP, SIGINT, SIGTERM}) {
-        // A signal that was ignored from the start, as under nohup, stays ignored.
-        if (signal(number, remove_and_die) == SIG_IGN) signal(number, SIG_IGN);
+        struct sigaction previous = {};
+        sigaction(number, nullptr, &previous);
+        // What was ignored from the start, as under nohup, stays ignored.
+        if (previous.sa_handler != SIG_IGN) sigaction(number, &removing, nullptr);
     }
+    // A file past its size limit is an error to report like any other.
+    struct sigaction ignoring = {};
+    ignoring.sa_handler = SIG_IGN;
+    sigaction(SIGXFSZ, &ignoring, nullptr);
 }
 
 // A link's own name shall survive, so the file is replaced where it really lies.
@@ -86,7 +94,7 @@ void OutputFile::open() {
 
 OutputFile::~OutputFile() {
     if (stream_ == nullptr) return;
-    fclose(stream_);
+    static_cast<void>(fclose(stream_));
     if (!temporary_.empty()) {
         unlink(temporary_.c_str());
         doomed_file = nullptr;
@@ -101,7 +109,7 @@ void OutputFile::commit() {
         }
     });
     doomed_file = nullptr;
-    fclose(stream_);
+    static_cast<void>(fclose(stream_));
     stream_ = nullptr;
 }
 

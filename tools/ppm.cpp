@@ -87,10 +87,13 @@ Picture decode_ppm(const uint8_t* data, size_t size) {
 }
 
 void encode_ppm(const Picture& picture, FILE* out) {
-    fprintf(out, "P6\n%d %d\n255\n", picture.size.width, picture.size.height);
+    const std::string header = "P6\n" + std::to_string(picture.size.width) + " " +
+                               std::to_string(picture.size.height) + "\n255\n";
     const Picture rgb = converted(picture, PixelFormat::kRgb);
-    fwrite(rgb.bytes(), 1, rgb.byte_count(), out);
-    if (ferror(out) != 0) throw Error(std::string("cannot write PPM: ") + strerror(errno));
+    if (fwrite(header.data(), 1, header.size(), out) != header.size() ||
+        fwrite(rgb.bytes(), 1, rgb.byte_count(), out) != rgb.byte_count()) {
+        throw Error(std::string("cannot write PPM: ") + strerror(errno));
+    }
 }
 
 }  // namespace tool

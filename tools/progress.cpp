@@ -4,7 +4,8 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <cstdio>
+#include <iomanip>
+#include <iostream>
 #include <string>
 
 namespace tool {
@@ -13,15 +14,16 @@ namespace {
 
 constexpr std::chrono::milliseconds kPatience(500);
 constexpr std::chrono::milliseconds kInterval(100);
+constexpr char kEraseToEnd[] = "\033[K";
 
 std::string bar(double part) {
     if (part < 0) return "";
     constexpr int kCells = 30;
     const double done = std::min(part, 1.0);
     const auto cells = static_cast<size_t>(done * kCells);
-    char percent[16];
-    snprintf(percent, sizeof(percent), "%3d%%  ", static_cast<int>(done * 100));
-    return "[" + std::string(cells, '#') + std::string(kCells - cells, '-') + "] " + percent;
+    const std::string percent = std::to_string(static_cast<int>(done * 100));
+    return "[" + std::string(cells, '#') + std::string(kCells - cells, '-') + "] " + percent +
+           "%  ";
 }
 
 }  // namespace
@@ -32,7 +34,7 @@ Progress::Progress()
       next_update_(start_ + kPatience) {}
 
 Progress::~Progress() {
-    if (is_visible_) fputs("\r\033[K", stderr);
+    if (is_visible_) std::cerr << '\r' << kEraseToEnd << std::flush;
 }
 
 void Progress::update(int64_t frames, double part) {
@@ -41,8 +43,9 @@ void Progress::update(int64_t frames, double part) {
     next_update_ = now + kInterval;
     is_visible_ = true;
     const double seconds = std::chrono::duration<double>(now - start_).count();
-    fprintf(stderr, "\r%s%lld frames, %.1f per second\033[K", bar(part).c_str(),
-            static_cast<long long>(frames), static_cast<double>(frames) / seconds);
+    std::cerr << '\r' << bar(part) << frames << " frames, " << std::fixed << std::setprecision(1)
+              << static_cast<double>(frames) / seconds << " per second" << kEraseToEnd
+              << std::flush;
 }
 
 }  // namespace tool

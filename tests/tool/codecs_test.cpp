@@ -29,8 +29,8 @@ Bytes written(const std::function<void(FILE*)>& write) {
     size_t size = 0;
     FILE* const stream = open_memstream(&data, &size);
     write(stream);
-    fclose(stream);
-    const Bytes bytes(data, data + size);
+    static_cast<void>(fclose(stream));
+    Bytes bytes(data, data + size);
     free(data);
     return bytes;
 }
@@ -260,6 +260,6 @@ TEST(Codecs, UnwritableStreamsAreReported) {
             },
             tool::Error)
             << codec.name;
-        fclose(full);
+        static_cast<void>(fclose(full));
     }
 }

@@ -3,9 +3,11 @@
 // canvas.
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
+#include <unistd.h>
 
 #include <cstdio>
-#include <cstdlib>
+#include <filesystem>
+#include <fstream>
 #include <string>
 #include <vector>
 
@@ -22,42 +24,24 @@ std::string size_text(int32_t width, int32_t height) {
     return std::to_string(width) + "x" + std::to_string(height);
 }
 
-// A folder for one frame, removed at the end.
-class Folder {
-public:
-    Folder() {
-        char name[] = "/tmp/ovrinresize_test.XXXXXX";
-        path_ = mkdtemp(name);
-    }
-    ~Folder() {
-        remove((path_ + "/frame").c_str());
-        remove(path_.c_str());
-    }
-    Folder(const Folder&) = delete;
-    Folder& operator=(const Folder&) = delete;
-
-    std::string frame() const { return path_ + "/frame"; }
-
-private:
-    std::string path_;
-};
-
 // Sends one raw frame through the command and returns what it writes to standard output.
 Bytes through_command(const Bytes& frame, const std::string& format, const std::string& input_size,
                       const std::string& options) {
-    const Folder folder;
-    FILE* const file = fopen(folder.frame().c_str(), "wb");
-    fwrite(frame.data(), 1, frame.size(), file);
-    fclose(file);
-    const std::string command = OVRINRESIZE_TOOL " " + folder.frame() + " - --format " + format +
+    const std::string path = ::testing::TempDir() + "ovrinresize_frame." + std::to_string(getpid());
+    std::ofstream(path, std::ios::binary)
+        .write(reinterpret_cast<const char*>(frame.data()),
+               static_cast<std::streamsize>(frame.size()));
+    const std::string command = OVRINRESIZE_TOOL " '" + path + "' - --format " + format +
                                 " --input-size " + input_size + " " + options;
-    FILE* const pipe = popen(command.c_str(), "r");
+    // The command line holds nothing from outside.
+    FILE* const pipe = popen(command.c_str(), "r");  // NOLINT(cert-env33-c)
     Bytes result;
     uint8_t buffer[4096];
     for (size_t got; (got = fread(buffer, 1, sizeof(buffer), pipe)) > 0;) {
         result.insert(result.end(), buffer, buffer + got);
     }
     EXPECT_EQ(pclose(pipe), 0) << command;
+    std::filesystem::remove(path);
     return result;
 }
 
