@@ -137,8 +137,11 @@ void declare_resizing(CLI::App* app, Options* options) {
         "contain: the largest picture that fits into the size and keeps\n"
         "its proportions (the default with --canvas)");
     add_choice<Engine, Engine>(app, "-e,--engine", "NAME", &options->engine,
-                               {{"quarter", Engine::kQuarter}, {"nearest", Engine::kNearest}},
-                               "Resampler: quarter (the default) or nearest");
+                               {{"quarter", Engine::kQuarter},
+                                {"bilinear", Engine::kBilinear},
+                                {"lanczos", Engine::kLanczos},
+                                {"nearest", Engine::kNearest}},
+                               "Resampler: quarter (the default), bilinear, lanczos or nearest");
 }
 
 void declare(CLI::App* app, Options* options) {
