@@ -2,6 +2,7 @@
 // Random source pictures in buffers that hold exactly what the picture covers.
 #pragma once
 
+#include <gtest/gtest.h>
 #include <cstddef>
 #include <cstdint>
 #include <vector>
