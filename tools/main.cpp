@@ -196,7 +196,7 @@ void report(const Source& source, const Placement& placement, int64_t frames, do
     std::cerr << name_of(source.kind().format) << " " << to_string(source.size()) << " to "
               << to_string(placement.picture);
     if (placement.on_canvas) std::cerr << " on " << to_string(placement.result);
-    std::cerr << ": " << std::fixed << std::setprecision(2);
+    std::cerr << ": " << std::fixed << std::setprecision(3);
     if (frames == 1) {
         std::cerr << "resized in " << milliseconds << " ms\n";
     } else {
