@@ -330,6 +330,38 @@ TEST(Lanczos, RowPositionsRoundTwice) {
     for (int i = 0; i < 2; ++i) check({64, kSrc, 64, kDst, 1}, random);
 }
 
+// 18 / 66 * 55 is 15, but its double falls just short: row 55 looks at row 14 and a fraction of
+// nearly 1.
+TEST(Lanczos, RowsMayFallJustShortOfASourceRow) {
+    Random random(101);
+    SCOPED_TRACE(random.trace());
+    for (const auto& [src, dst] :
+         {std::pair<int32_t, int32_t>{18, 66}, {14, 110}, {3, 147}, {2, 98}}) {
+        int short_of = 0;
+        for (int32_t y = 0; y < dst; ++y) {
+            const double p = static_cast<double>(src) / dst * y;
+            short_of += static_cast<int32_t>(p) < src * y / dst;
+        }
+        EXPECT_GE(short_of, 1) << src << " to " << dst;
+        check({32, src, 32, dst, 1}, random);
+    }
+}
+
+// Rows that lie a last bit away from a source row have one large weight and tiny ones, whose sum
+// depends on the order of its terms. The columns' mean of two bytes makes the last bit decide.
+TEST(Lanczos, WeightsAreAddedInOrder) {
+    Random random(102);
+    SCOPED_TRACE(random.trace());
+    for (int i = 0; i < rounds(200) && !HasFatalFailure(); ++i) {
+        const std::vector<uint8_t> pair = random.bytes(8);
+        std::vector<uint8_t> src;
+        for (size_t k = 0; k < 8 * 84 * 4; ++k) src.push_back(pair[k / 4 % 8 / 4 * 4 + k % 4]);
+        const auto expected = reference::lanczos(src.data(), 8, 84, 16, 44, 4);
+        const auto dst = draw(src, 8, 84, 16, 44, 4);
+        ASSERT_TRUE(same_bytes(dst.data(), expected.data(), expected.size()));
+    }
+}
+
 // Columns add the ratio up, which drifts away from the products that rows use.
 TEST(Lanczos, ColumnPositionsAreARunningSum) {
     constexpr int32_t kSrc = 120, kDst = 112;
