@@ -86,14 +86,8 @@ int32_t bilinear_format(PixelFormat format) {
     }
 }
 
-// On the calling thread at any height: in bands the engine would not interpolate.
+// On the calling thread at any height: in bands the engine would not interpolate. Not for RGB.
 void resize_bilinear(const Picture& source, Picture* result) {
-    if (source.format == PixelFormat::kRgb) {
-        Picture rgba(result->size);
-        resize_bilinear(converted(source, PixelFormat::kRgba), &rgba);
-        *result = converted(rgba, PixelFormat::kRgb);
-        return;
-    }
     // The engine may read a row and a sample past the end, which then count; they repeat the end.
     const size_t words = source.words.size();
     std::vector<uint32_t> padded(source.words);
@@ -101,6 +95,13 @@ void resize_bilinear(const Picture& source, Picture* result) {
     ov_bilinear_sg(reinterpret_cast<const uint8_t*>(padded.data()), result->bytes(),
                    source.size.width, source.size.height, result->size.width, result->size.height,
                    bilinear_format(source.format), nullptr);
+}
+
+// The engine knows no RGB; RGBA gives the same bytes.
+void resize_rgb_bilinear(const Picture& source, Picture* result) {
+    Picture rgba(result->size);
+    resize_bilinear(converted(source, PixelFormat::kRgba), &rgba);
+    *result = converted(rgba, PixelFormat::kRgb);
 }
 
 // Planes one by one: the library's own function for Y and VU wants more chroma than a frame has.
@@ -163,6 +164,7 @@ void resize(Engine engine, const Picture& source, const Placement& placement, Pi
             if (placement.on_canvas) return resize_on_canvas(source, placement, result);
             return resize_whole(source, result);
         case Engine::kBilinear:
+            if (source.format == PixelFormat::kRgb) return resize_rgb_bilinear(source, result);
             return resize_bilinear(source, result);
         case Engine::kLanczos:
             return resize_lanczos(source, result);
