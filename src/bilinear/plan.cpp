@@ -135,12 +135,14 @@ BilinearExtent extent_of(const BilinearGeometry& geometry, const BilinearTables&
     BilinearExtent extent = {tables.dst_w, tables.dst_h,
                              edge_count(tables.col_index, tables.dst_w, geometry.src_width),
                              edge_count(tables.row_index, tables.dst_h, geometry.src_height)};
-    if (geometry.canvas_width < int64_t{extent.columns} + geometry.dst_x) {
-        extent.columns = geometry.canvas_width - geometry.dst_x;
+    const int64_t room_right = int64_t{geometry.canvas_width} - geometry.dst_x;
+    const int64_t room_below = int64_t{geometry.canvas_height} - geometry.dst_y;
+    if (room_right < extent.columns) {
+        extent.columns = room_right < 0 ? 0 : static_cast<int32_t>(room_right);
         extent.edge_cols = 0;
     }
-    if (geometry.canvas_height < int64_t{extent.rows} + geometry.dst_y) {
-        extent.rows = geometry.canvas_height - geometry.dst_y;
+    if (room_below < extent.rows) {
+        extent.rows = room_below < 0 ? 0 : static_cast<int32_t>(room_below);
         extent.edge_cols = 0;
     }
     return extent;

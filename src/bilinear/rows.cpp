@@ -70,63 +70,51 @@ void for_each_plane(const BilinearGeometry& g, const Function& function) {
     for (int32_t i = 0; i < planes; ++i) function(chroma_plane(g, i));
 }
 
-// Columns of a plane, as kernels want them: source sample and weight of each destination sample.
-struct ColumnStrip {
-    int32_t first;  // destination sample
-    int32_t count;
-    int32_t index[kCopyTaps];
-    int32_t weight[kCopyTaps];
-};
-
-void load_strip(ColumnStrip& strip, const Plane& plane, const BilinearAxes& axes, int32_t first,
-                int32_t end) {
-    strip.first = first;
-    strip.count = end - first < kCopyTaps ? end - first : kCopyTaps;
-    for (int32_t i = 0; i < strip.count; ++i) {
-        const int32_t c = (first + i) * plane.subsampling;
-        strip.index[i] = plane.column(axes.col_index[c]);
-        strip.weight[i] = axes.col_weight[c];
-    }
+int32_t strip_length(int32_t first, int32_t end) {
+    return end - first < kBilinearColumns ? end - first : kBilinearColumns;
 }
 
-// Calls function(strip) for the samples [first, end) of a plane's rows.
+// Calls function(columns, first sample) for the samples [first, end) of a plane's rows.
 template <class Function>
 void for_each_strip(const Plane& plane, const BilinearAxes& axes, int32_t first, int32_t end,
                     const Function& function) {
-    ColumnStrip strip;
-    for (; first < end; first += strip.count) {
-        load_strip(strip, plane, axes, first, end);
-        function(strip);
+    BilinearColumns columns;
+    for (; first < end; first += columns.count) {
+        columns.count = strip_length(first, end);
+        for (int32_t i = 0; i < columns.count; ++i) {
+            const int32_t c = (first + i) * plane.subsampling;
+            columns.index[i] = plane.column(axes.col_index[c]);
+            columns.weight[i] = axes.col_weight[c];
+        }
+        function(columns, first);
     }
 }
 
 void blend_plane(const Plane& plane, const BilinearAxes& axes, const BilinearExtent& extent) {
-    const BilinearKernels& kernel = kernels().bilinear[plane.sample_bytes >> 1];
+    const BilinearBlend& blend = kernels().bilinear_blend[plane.sample_bytes >> 1];
+    const BilinearEdges& edges = kernels().bilinear_edges[plane.sample_bytes >> 1];
     const int32_t all = plane.samples(extent.columns);
     const int32_t blended = plane.samples(extent.columns - extent.edge_cols);
     const int32_t first_edge_row =
         extent.rows > extent.edge_rows ? extent.rows - extent.edge_rows : 0;
-    const auto dst = [&](int32_t r, const ColumnStrip& strip) {
-        return plane.dst_row(r) + ptrdiff_t{strip.first} * plane.sample_bytes;
+    const auto dst = [&](int32_t r, int32_t first) {
+        return plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes;
     };
-    for_each_strip(plane, axes, 0, blended, [&](const ColumnStrip& s) {
+    const auto src = [&](int32_t r) { return plane.src_row(axes.row_index[r]); };
+    for_each_strip(plane, axes, 0, blended, [&](BilinearColumns& s, int32_t first) {
+        blend.prepare(s);
         for (int32_t r = 0; r < first_edge_row; r += plane.subsampling) {
-            const uint8_t* top = plane.src_row(axes.row_index[r]);
-            kernel.both(dst(r, s), top, top + plane.src_pitch, s.index, s.weight,
-                        axes.row_weight[r], s.count);
+            blend.both(dst(r, first), src(r), src(r) + plane.src_pitch, axes.row_weight[r], s);
         }
     });
-    for_each_strip(plane, axes, blended, all, [&](const ColumnStrip& s) {
+    for_each_strip(plane, axes, blended, all, [&](BilinearColumns& s, int32_t first) {
         for (int32_t r = 0; r < first_edge_row; r += plane.subsampling) {
-            const uint8_t* top = plane.src_row(axes.row_index[r]);
-            kernel.vertical(dst(r, s), top, top + plane.edge_pitch, s.index, axes.row_weight[r],
-                            s.count);
+            edges.vertical(dst(r, first), src(r), src(r) + plane.edge_pitch, axes.row_weight[r], s);
         }
     });
-    for_each_strip(plane, axes, 0, all, [&](const ColumnStrip& s) {
+    for_each_strip(plane, axes, 0, all, [&](BilinearColumns& s, int32_t first) {
         for (int32_t r = plane.first_row(first_edge_row); r < extent.rows; r += plane.subsampling) {
-            kernel.horizontal(dst(r, s), plane.src_row(axes.row_index[r]), s.index, s.weight,
-                              s.count);
+            edges.horizontal(dst(r, first), src(r), s);
         }
     });
 }
@@ -141,13 +129,14 @@ void blend_rows(const BilinearGeometry& geometry, const BilinearAxes& axes,
 void copy_rows(const BilinearGeometry& geometry, const BilinearAxes& axes, int32_t columns,
                int32_t first_row, int32_t end_row) {
     for_each_plane(geometry, [&](const Plane& plane) {
-        const BilinearKernels& kernel = kernels().bilinear[plane.sample_bytes >> 1];
-        for_each_strip(plane, axes, 0, plane.samples(columns), [&](const ColumnStrip& strip) {
-            for (int32_t r = plane.first_row(first_row); r < end_row; r += plane.subsampling) {
-                kernel.copy(plane.dst_row(r) + ptrdiff_t{strip.first} * plane.sample_bytes,
-                            plane.src_row(axes.row_index[r]), strip.index, strip.count);
-            }
-        });
+        const auto copy = kernels().bilinear_edges[plane.sample_bytes >> 1].copy;
+        for_each_strip(
+            plane, axes, 0, plane.samples(columns), [&](const BilinearColumns& s, int32_t first) {
+                for (int32_t r = plane.first_row(first_row); r < end_row; r += plane.subsampling) {
+                    copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
+                         plane.src_row(axes.row_index[r]), s.index, s.count);
+                }
+            });
     });
 }
 

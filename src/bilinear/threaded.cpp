@@ -19,6 +19,10 @@ BilinearGeometry geometry_of_band(const ovrin_bilinear_band& band) {
     return g;
 }
 
+int64_t src_row_bytes(const BilinearGeometry& geometry) {
+    return int64_t{geometry.src_stride} * bytes_per_pixel(geometry.layout);
+}
+
 ovrin_bilinear_band template_band(const BilinearCall& call, const BilinearGeometry& geometry,
                                   const BilinearTables& tables, const BilinearExtent& extent) {
     ovrin_bilinear_band band = {};
@@ -36,7 +40,7 @@ ovrin_bilinear_band template_band(const BilinearCall& call, const BilinearGeomet
     band.row_index = tables.row_index;
     band.canvas_width = geometry.canvas_width;
     band.bpp = bytes_per_pixel(geometry.layout);
-    band.src_pitch = static_cast<int32_t>(int64_t{geometry.src_stride} * band.bpp);
+    band.src_pitch = static_cast<int32_t>(src_row_bytes(geometry));
     band.edge_cols = extent.edge_cols;
     return band;
 }
@@ -56,8 +60,8 @@ void fill_bands(ovrin_bilinear_band* bands, int32_t count, int32_t height,
 enum class Outcome { kDone, kUseSingleThread };
 
 // Takes the pool over.
-Outcome resize_on(ovrin_threadpool* pool, const BilinearCall& call, int32_t count, int32_t height) {
-    const BilinearGeometry geometry = geometry_of(call);
+Outcome resize_on(ovrin_threadpool* pool, const BilinearCall& call,
+                  const BilinearGeometry& geometry, int32_t count, int32_t height) {
     BilinearTables tables(call.dst_w, call.dst_h);
     if (!is_supported(geometry) || !tables.ready()) {
         ovrin_threadpool_free(pool, 1);
@@ -83,9 +87,12 @@ Outcome resize_in_bands(const BilinearCall& call) {
     const int32_t height = band_height(call.src_h, call.dst_h);
     const int32_t count = band_count(call.dst_h, height);
     if (count < 2 || call.dst_h < kThreadedRows) return Outcome::kUseSingleThread;
+    const BilinearGeometry geometry = geometry_of(call);
+    // A band record holds the source's row length in 32 bits.
+    if (src_row_bytes(geometry) > INT32_MAX) return Outcome::kUseSingleThread;
     ovrin_threadpool* pool = ovrin_threadpool_init(kBandThreads);
     if (pool == nullptr) return Outcome::kUseSingleThread;
-    return resize_on(pool, call, count, height);
+    return resize_on(pool, call, geometry, count, height);
 }
 
 }  // namespace

@@ -27,20 +27,22 @@ struct LanczosRows {
 // Seven source rows with their first and last pixels repeated three times on either side.
 class LanczosCache {
 public:
-    LanczosCache(int32_t src_w, int32_t src_components, int32_t dst_components);
+    explicit LanczosCache(const LanczosRows& picture);
     ~LanczosCache() { free(data_); }
     LanczosCache(const LanczosCache&) = delete;
     LanczosCache& operator=(const LanczosCache&) = delete;
 
     bool ready() const { return data_ != nullptr; }
-    void load(const LanczosRows& picture, int64_t middle_row);
 
-    const uint8_t* data() const { return data_; }
-    ptrdiff_t pitch() const { return pitch_; }
+    // Points taps[k] to source row middle_row - 3 + k, or the nearest one that exists.
+    void load(const LanczosRows& picture, int64_t middle_row, const uint8_t* taps[kLanczosTaps]);
 
 private:
+    void copy_row(const LanczosRows& picture, int32_t slot, int64_t row);
+
     ptrdiff_t pitch_;
     uint8_t* data_;
+    int64_t rows_[kLanczosTaps];  // the source row in each slot; negative: none
 };
 
 // Computes destination rows [first, end).

@@ -24,8 +24,8 @@ struct LanczosCall {
 };
 
 bool is_empty(const LanczosCall& call) {
-    return call.src == nullptr || call.dst == nullptr || call.src_w < 1 || call.src_h < 1 ||
-           call.dst_w < 1 || call.dst_h < 1 || call.bytes_per_pixel < 1;
+    return call.dst == nullptr || call.src_w < 1 || call.src_h < 1 || call.dst_w < 1 ||
+           call.dst_h < 1 || call.bytes_per_pixel < 1;
 }
 
 void fill_bands(ovrin_lanczos_band* bands, int32_t count, int32_t height, const LanczosCall& call,
@@ -82,14 +82,22 @@ using namespace ovrin;
 void _resize_lanczos_tp(void* band) {
     const auto& record = *static_cast<const ovrin_lanczos_band*>(band);
     if (record.dst == nullptr || record.src == nullptr || record.table == nullptr) return;
-    LanczosCache cache(record.src_w, record.bytes_per_pixel, record.bytes_per_pixel);
-    if (!cache.ready()) return;
     const ptrdiff_t pixel = record.bytes_per_pixel;
-    filter_rows(
-        {record.src, record.src_w, record.src_h, record.src_w * pixel, record.bytes_per_pixel,
-         record.dst, record.dst_w, record.dst_h, record.dst_w * pixel, record.bytes_per_pixel,
-         record.column_weights, record.row_weights},
-        cache, record.first_row, record.first_row + record.rows);
+    const LanczosRows picture = {record.src,
+                                 record.src_w,
+                                 record.src_h,
+                                 record.src_w * pixel,
+                                 record.bytes_per_pixel,
+                                 record.dst,
+                                 record.dst_w,
+                                 record.dst_h,
+                                 record.dst_w * pixel,
+                                 record.bytes_per_pixel,
+                                 record.column_weights,
+                                 record.row_weights};
+    LanczosCache cache(picture);
+    if (!cache.ready()) return;
+    filter_rows(picture, cache, record.first_row, record.first_row + record.rows);
 }
 
 void ovrin_resize_lanczos(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,

@@ -28,14 +28,17 @@ int32_t checkOvImage(const lanczos_image* image) {
 
 void OvTransformLanczos(const lanczos_image* src, const lanczos_image* dst) {
     if (checkOvImage(src) == 0 || checkOvImage(dst) == 0) return;
+    // Shorter rows would be read past the picture's end.
+    if (src->stride < int64_t{src->width} * src->bytes_per_pixel) return;
     LanczosPlan plan(dst->width, dst->height);
-    LanczosCache cache(src->width, src->bytes_per_pixel, dst->bytes_per_pixel);
+    const LanczosRows picture = {
+        src->data,           src->width,      src->height, src->stride, src->bytes_per_pixel,
+        dst->data,           dst->width,      dst->height, dst->stride, dst->bytes_per_pixel,
+        plan.columns.data(), plan.rows.data()};
+    LanczosCache cache(picture);
     if (!plan.ready() || !cache.ready()) return;
     plan.fill(src->width, src->height, dst->width, dst->height);
-    filter_rows({src->data, src->width, src->height, src->stride, src->bytes_per_pixel, dst->data,
-                 dst->width, dst->height, dst->stride, dst->bytes_per_pixel, plan.columns.data(),
-                 plan.rows.data()},
-                cache, 0, dst->height);
+    filter_rows(picture, cache, 0, dst->height);
 }
 
 void ov_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst, int32_t dst_w,
@@ -47,6 +50,7 @@ void ov_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst, 
 
 void ov_lanczos_nv(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst, int32_t dst_w,
                    int32_t dst_h) {
+    if (src == nullptr || dst == nullptr) return;
     ov_lanczos(src, src_w, src_h, dst, dst_w, dst_h, 1);
     ov_lanczos(src + int64_t{src_w} * src_h, src_w, src_h, dst + int64_t{dst_w} * dst_h, dst_w,
                dst_h, 2);

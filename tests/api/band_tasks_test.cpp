@@ -423,6 +423,7 @@ TEST(BandTasks, ChromaThatStartsBeyondThePlaneIsSkipped) {
         auto yuv = whole_picture<ovrin_yuv_band>(s);
         yuv.y_rows = 0;
         yuv.uv_start_row = start;
+        yuv.uv_top_point = yuv.uv_bottom_point = 0;  // the very next row would hold samples
         yuv.uv_rows = 3;
         yuv.dst = target.data();
         run_task(_resize_y_u_v_tp, yuv, target, before);
@@ -430,6 +431,7 @@ TEST(BandTasks, ChromaThatStartsBeyondThePlaneIsSkipped) {
         auto nv21 = whole_picture<ovrin_nv21_band>(s);
         nv21.y_rows = 0;
         nv21.vu_start_row = start;
+        nv21.vu_top_point = nv21.vu_bottom_point = 0;
         nv21.vu_rows = 3;
         nv21.dst = target.data();
         run_task(_resize_nv21_tp, nv21, target, before);

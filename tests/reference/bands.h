@@ -22,4 +22,10 @@ inline int64_t band_count(int64_t src_h, int64_t dst_h) {
     return (src_h + (rows >> 1)) / rows;
 }
 
+// The same where destination rows are cut, as the engines do.
+inline int64_t destination_band_count(int64_t src_h, int64_t dst_h) {
+    const int64_t rows = band_height(src_h, dst_h);
+    return (dst_h + (rows >> 1)) / rows;
+}
+
 }  // namespace reference
