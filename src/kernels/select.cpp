@@ -2,11 +2,6 @@
 #include "kernels/cpu.h"
 #include "kernels/sets.h"
 
-// Builds for tests may cap the choice: 0 scalar, 1 AVX2, 2 AVX-512.
-#ifndef OVRIN_MOST_KERNELS
-#define OVRIN_MOST_KERNELS 2
-#endif
-
 namespace ovrin {
 
 const Kernels scalar_kernels = {begin_quarter_plan_scalar, bilinear_blend_scalar,
@@ -23,8 +18,8 @@ constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, bilinear_blend_av
 
 const Kernels* best_kernels() {
     const CpuFeatures cpu = cpu_features();
-    if (cpu.avx512_vbmi && OVRIN_MOST_KERNELS >= 2) return &kAvx512Kernels;
-    if (cpu.avx2 && OVRIN_MOST_KERNELS >= 1) return &kAvx2Kernels;
+    if (cpu.avx512_vbmi) return &kAvx512Kernels;
+    if (cpu.avx2) return &kAvx2Kernels;
     return &scalar_kernels;
 }
 
@@ -34,7 +29,7 @@ constexpr Kernels kNeonKernels = {begin_quarter_plan_neon, bilinear_blend_neon,
                                   bilinear_edges_scalar, lanczos_row_neon};
 
 const Kernels* best_kernels() {
-    return OVRIN_MOST_KERNELS >= 1 ? &kNeonKernels : &scalar_kernels;
+    return &kNeonKernels;
 }
 
 #else
