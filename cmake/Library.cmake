@@ -3,12 +3,24 @@
 find_package(Threads REQUIRED)
 
 add_library(ovrinresize_objects OBJECT
+  src/bilinear/plan.cpp
+  src/bilinear/progressive.cpp
+  src/bilinear/rows.cpp
+  src/bilinear/single.cpp
+  src/bilinear/threaded.cpp
   src/dispatch/band_schedule.cpp
+  src/dispatch/helping_run.cpp
   src/dispatch/sleep.cpp
   src/dispatch/wrappers.cpp
+  src/kernels/bilinear_scalar.cpp
   src/kernels/cpu.cpp
-  src/kernels/scalar.cpp
+  src/kernels/lanczos_scalar.cpp
+  src/kernels/quarter_scalar.cpp
   src/kernels/select.cpp
+  src/lanczos/rows.cpp
+  src/lanczos/threaded.cpp
+  src/lanczos/transform.cpp
+  src/lanczos/weights.cpp
   src/layout.cpp
   src/nv21/nv21.cpp
   src/nv21/nv21_bands.cpp
@@ -26,11 +38,13 @@ add_library(ovrinresize_objects OBJECT
   src/yuv420/place.cpp
   src/yuv420/resize.cpp)
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
-  target_sources(ovrinresize_objects PRIVATE src/kernels/quarter_neon.cpp)
+  target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
+    src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp)
   # Otherwise atomics may call helpers of the compiler's run-time library.
   target_compile_options(ovrinresize_objects PRIVATE -mno-outline-atomics)
 elseif(CMAKE_SYSTEM_PROCESSOR MATCHES "x86_64|AMD64")
-  set(avx2_sources src/kernels/quarter_avx2.cpp)
+  set(avx2_sources src/kernels/bilinear_avx2.cpp src/kernels/lanczos_avx2.cpp
+    src/kernels/quarter_avx2.cpp)
   set(avx512_sources src/kernels/quarter_avx512.cpp)
   target_sources(ovrinresize_objects PRIVATE ${avx2_sources} ${avx512_sources})
   set_source_files_properties(${avx2_sources} PROPERTIES COMPILE_OPTIONS "-mavx2;-mfma")
@@ -44,10 +58,9 @@ set_target_properties(ovrinresize_objects PROPERTIES
 target_include_directories(ovrinresize_objects
   PUBLIC ${PROJECT_SOURCE_DIR}/include
   PRIVATE ${PROJECT_SOURCE_DIR}/src)
-# No C++ run-time library: no exceptions, no RTTI, no guarded statics. Floating point rounds where
-# the source says so: a contracted multiply-add would change bytes from one processor to the next.
+# No C++ run-time library: no exceptions, no RTTI, no guarded statics.
 target_compile_options(ovrinresize_objects PRIVATE
-  -fno-exceptions -fno-rtti -fno-threadsafe-statics -ffp-contract=off)
+  -fno-exceptions -fno-rtti -fno-threadsafe-statics)
 target_link_libraries(ovrinresize_objects PRIVATE ovrinresize_warnings Threads::Threads)
 
 # The version script lists the functions that the public header declares, and nothing else.

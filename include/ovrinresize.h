@@ -68,8 +68,8 @@ typedef struct ovrin_resize_target {
  * quarter and three quarters of the way across its source cell in each direction; each byte is
  * shifted right by 2 before it is added:
  *
- *     row1 = (j * src_h + (src_h >> 2)) / dst_h      row3 = (j * src_h + ((3 * src_h) >> 2)) /
- * dst_h
+ *     row1 = (j * src_h + (src_h >> 2)) / dst_h
+ *     row3 = (j * src_h + ((3 * src_h) >> 2)) / dst_h
  *
  * and columns likewise. The shift drops the two low bits of every sample, so 252 is the largest
  * result: a white source (255) gives 252. Enlarging is allowed; it repeats samples.
@@ -106,16 +106,15 @@ OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int3
  * [i * dst_h, (i + 1) * dst_h).
  */
 typedef struct ovrin_rgba_band {
-    int32_t
-        start_row;   /* first source row of the band; 0: the running state below is at its start */
-    int32_t row_q1;  /* next pending one-quarter row point, scaled coordinates */
-    int32_t row_q3;  /* next pending three-quarter row point */
-    int32_t row_acc; /* start_row * dst_h */
-    int32_t di_11;   /* next destination word for (one-quarter row, one-quarter column) */
-    int32_t di_13;   /* ... for (one-quarter row, three-quarter column) */
-    int32_t di_31;   /* ... for (three-quarter row, one-quarter column) */
-    int32_t di_33;   /* ... for (three-quarter row, three-quarter column) */
-    int32_t src_w;   /* source size, pixels */
+    int32_t start_row; /* first source row; when 0, the running state below is at its start */
+    int32_t row_q1;    /* next pending one-quarter row point, scaled coordinates */
+    int32_t row_q3;    /* next pending three-quarter row point */
+    int32_t row_acc;   /* start_row * dst_h */
+    int32_t di_11;     /* next destination word for (one-quarter row, one-quarter column) */
+    int32_t di_13;     /* ... for (one-quarter row, three-quarter column) */
+    int32_t di_31;     /* ... for (three-quarter row, one-quarter column) */
+    int32_t di_33;     /* ... for (three-quarter row, three-quarter column) */
+    int32_t src_w;     /* source size, pixels */
     int32_t src_h;
     int32_t src_stride; /* source row length, pixels */
     int32_t src_rows;   /* rows in the source buffer */
@@ -158,7 +157,8 @@ OVRIN_API void _resize_rgba8888_tp(void* band);
  * proportion: dst_width becomes canvas_width - dst_x, and the source width becomes
  * (int)(target->src_width * ((double)new_dst_width / old_dst_width)); both are written back into
  * the target, likewise for heights. Keep target->src_width and src_height equal to the arguments:
- * they are what is cut.
+ * they are what is cut. A rectangle that a negative position puts outside the canvas's memory is
+ * not drawn.
  *
  * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
  * dst_y), or dst_height is 0. Threads as ovrin_resize_rgba8888, by src_h.
@@ -406,6 +406,215 @@ OVRIN_API void _resize_nv21_tp(void* band);
 OVRIN_API void _resize_y_nv21_tp(void* band);
 
 /*
+ * ---- Bilinear engine ---------------------------------------------------------------------------
+ *
+ * Shrinks or enlarges by any ratio with 12-bit fixed-point weights. Format codes:
+ *
+ *     2        planar 4:2:0: a Y plane, then U, then V
+ *     7, 8     four 8-bit channels per pixel, all treated alike
+ *     18, 19   semi-planar 4:2:0: a Y plane, then one plane of two-byte chroma pairs
+ *
+ * Chroma planes have (height + 1) / 2 rows; a row of U or V has (width + 1) / 2 bytes, a row of
+ * pairs twice that. With any other code nothing is written. The two codes of a pair do the same;
+ * which channel comes first makes no difference.
+ *
+ * Output column i lies at source position i * src_width / dst_w, whose whole part is its left
+ * source column; the weight of the column to the right of that is the fraction plus one quarter.
+ * Rows likewise. What follows from this, and is meant:
+ *
+ *  - Equal sizes do not copy: pixels are blended with their right and lower neighbours.
+ *  - A weight may reach 1.25. Results are neither rounded nor limited to 0 ... 255, they wrap:
+ *    beside a much brighter sample a dark one can come out bright.
+ *  - From the first column that lies on the last but one source column, columns are blended with
+ *    their lower neighbours only; rows likewise, with their right neighbours only. When columns
+ *    step over the last but one, as in many reductions, none is.
+ *  - Chroma takes the weights of its luma pixel. The columns of U and V round up.
+ *  - Samples just outside the picture are read and can reach the result: those one column to the
+ *    right, one row below and, in U and V, two rows below. Behind every source plane src_stride + 1
+ *    samples (pixels, bytes or pairs) must be readable, whatever they hold.
+ *
+ * The whole canvas is cleared first: 0, chroma 128. Only sizes of 0 are tested for; those of the
+ * source must not be negative.
+ */
+
+/*
+ * Resizes src (src_w x src_h pixels) into dst (dst_w x dst_h pixels) on the calling thread.
+ *
+ * With a target record, dst is its canvas and dst_w x dst_h the rectangle at (dst_x, dst_y) to be
+ * filled. The record gives the source's size and row length (src_width, src_height, src_stride),
+ * its chroma planes, the format code and the canvas's size; format is ignored, src_w and src_h are
+ * only tested for 0. Its dst, dst_width and dst_height are not used. A rectangle that overhangs the
+ * canvas is cut to fit. The last columns are then blended in both directions, whichever side was
+ * cut; the number of rows at the bottom that are not stays what it was before the cut.
+ *
+ * A size of 0, a negative dst_w or dst_h, an unknown format code or missing memory: nothing is
+ * written.
+ */
+OVRIN_API void ov_bilinear_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                              int32_t dst_w, int32_t dst_h, int32_t format,
+                              const ovrin_resize_target* target);
+
+/*
+ * As ov_bilinear_sg, except that results of 1024 rows or more are cut into bands, which four worker
+ * threads and the calling thread share, and that bands do not interpolate: every sample is the top
+ * left of the four that ov_bilinear_sg would blend. Tall results therefore look like those of a
+ * point sampler; call ov_bilinear_sg to have them interpolated.
+ *
+ * When threads, or memory for the bands, are missing, or src_stride * 4 does not fit 32 bits, it
+ * does what ov_bilinear_sg does, whatever the height.
+ */
+OVRIN_API void ov_bilinear(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                           int32_t dst_w, int32_t dst_h, int32_t format,
+                           const ovrin_resize_target* target);
+
+/*
+ * As ov_bilinear, for large reductions: a picture that shrinks to a quarter or less in both
+ * directions is halved first, repeatedly, until what is left is a reduction by about 2, so that
+ * more of its samples count. Smaller reductions and enlargements are one ov_bilinear call, and so
+ * is a reduction for which there is no memory.
+ *
+ * A target record is meant for that single call. It is handed to every pass as it is; halving
+ * passes then read and draw the record's sizes, not those of their own pictures.
+ */
+OVRIN_API void ov_bilinear_ex(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                              int32_t dst_w, int32_t dst_h, int32_t format,
+                              const ovrin_resize_target* target);
+
+/*
+ * One band of destination rows. The tables hold, for each column or row of the output rectangle,
+ * the source column or row, and the weight of the next one with 12 fractional bits; bands share
+ * them.
+ */
+typedef struct ovrin_bilinear_band {
+    const ovrin_resize_target* target; /* or null */
+    int32_t src_width;                 /* source size, pixels */
+    int32_t src_height;
+    int32_t dst_w; /* the part of the output rectangle that lies in the canvas, pixels */
+    int32_t dst_h;
+    const uint8_t* src; /* the whole source picture */
+    uint8_t* dst;       /* the whole canvas */
+    int32_t format;
+    void* reserved_pointer; /* null */
+    const int32_t* col_weight;
+    const int32_t* row_weight;
+    const int32_t* col_index;
+    const int32_t* row_index;
+    int32_t first_row; /* the band's rows are [first_row, end_row) of the output rectangle */
+    int32_t end_row;
+    int32_t reserved;     /* 0 */
+    int32_t canvas_width; /* canvas row length, pixels */
+    int32_t src_pitch;    /* source row length of the pixels or luma, bytes */
+    int32_t bpp;          /* bytes per pixel: 4, or 1 for the luma of YUV */
+    int32_t edge_cols;    /* columns at the right that have no right neighbour */
+    int32_t edge_rows;    /* rows at the bottom of the last band that have no lower one; else 0 */
+} ovrin_bilinear_band;
+
+/*
+ * Band task; band points to an ovrin_bilinear_band. Stores the samples of the band's rows; the rest
+ * of the canvas stays as it is. Of a target it takes src_stride, format, the canvas's size, dst_x,
+ * dst_y and the chroma planes. With an unknown format code it does nothing.
+ */
+OVRIN_API void _ov_bilinear_tp(void* band);
+
+/*
+ * ---- Lanczos engine ----------------------------------------------------------------------------
+ *
+ * Shrinks or enlarges pictures of interleaved 8-bit components with a seven-tap Lanczos filter of
+ * three lobes in each direction, in double precision. The sharpest resampler here and by far the
+ * slowest. Samples beyond the borders are those on the border; results are rounded and limited to
+ * 0 ... 255; equal sizes copy.
+ *
+ * Reductions widen the filter but keep its seven taps, so strong ones skip samples.
+ */
+
+/*
+ * The filter's weights at distances of i / 4000 source pixels: 16000 floats, 0 from entry 12001 on.
+ * The caller releases the table with free(). Null when there is no memory.
+ */
+OVRIN_API float* create_lanczos_lookup(void);
+
+/*
+ * A picture of interleaved 8-bit components. A source is not written; rows of either may be longer
+ * than their pixels.
+ */
+typedef struct lanczos_image {
+    int32_t width;           /* pixels in a row */
+    int32_t height;          /* rows */
+    int32_t stride;          /* bytes from one row to the next */
+    int32_t bytes_per_pixel; /* components: 1 for a grey or Y plane, 2 for VU, 3 or 4 for colour */
+    uint8_t* data;           /* the first byte */
+} lanczos_image;
+
+/* 1 when image and its data are not null and its four numbers are above 0, otherwise 0. */
+OVRIN_API int32_t checkOvImage(const lanczos_image* image);
+
+/*
+ * Resizes src into dst, on the calling thread. Nothing is written when checkOvImage rejects either,
+ * when the source's rows are shorter than their pixels, or when there is no memory.
+ *
+ * Both should have the same bytes_per_pixel. The filter steps from one source pixel to the next by
+ * those of the destination: with others the result is not a picture.
+ */
+OVRIN_API void OvTransformLanczos(const lanczos_image* src, const lanczos_image* dst);
+
+/*
+ * As OvTransformLanczos, for packed pictures of bytes_per_pixel components. Nothing is written when
+ * a pointer is null, a size is below 1, or a row of either has more than 2^31 - 1 bytes.
+ */
+OVRIN_API void ov_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst,
+                          int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
+
+/*
+ * Resizes a Y plane and the VU pairs behind it, one pair per pixel. Unlike NV21, which has a pair
+ * for every four pixels, the second plane has the full height, and rows of twice the width: 3 * w *
+ * h bytes in all, for source and destination alike. A plain NV21 buffer is too short on both sides.
+ *
+ * Nothing is written when a pointer is null or a size is below 1.
+ */
+OVRIN_API void ov_lanczos_nv(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst,
+                             int32_t dst_w, int32_t dst_h);
+
+/*
+ * As ov_lanczos, for pictures of 4 bytes per pixel, in bands that four worker threads and the
+ * calling thread share; mind the order of the arguments. Gives the same bytes. Runs on the calling
+ * thread when the result makes fewer than two bands, as one of less than 48 rows does, or when
+ * threads or memory for the bands are missing.
+ *
+ * dst needs room for dst_w * dst_h * 4 bytes, because bands are placed and cleared as for 4 bytes
+ * per pixel, whatever bytes_per_pixel says. With fewer, each band's rows are packed at the start of
+ * its place, and the rest of that is 0; more than 4 must not be passed. In bands, a null src
+ * leaves dst cleared, and a band for whose work there is no memory stays so.
+ * Nothing is written when dst is null, a size is below 1 or there is no memory for the weights.
+ */
+OVRIN_API void ovrin_resize_lanczos(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
+                                    int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
+
+/*
+ * One band of destination rows. Weights are seven per column or row of the whole destination; bands
+ * share them.
+ */
+typedef struct ovrin_lanczos_band {
+    int32_t src_w; /* source size, pixels */
+    int32_t src_h;
+    int32_t dst_w; /* size of the whole destination, pixels */
+    int32_t dst_h;
+    const uint8_t* src;      /* the whole source picture */
+    uint8_t* dst;            /* the band's first row */
+    int32_t bytes_per_pixel; /* components */
+    int32_t first_row;       /* the band's first destination row */
+    int32_t rows;            /* destination rows in the band */
+    const float* table;      /* what create_lanczos_lookup gave; only tested for null */
+    const double* column_weights;
+    const double* row_weights;
+} ovrin_lanczos_band;
+
+/*
+ * Band task; band points to an ovrin_lanczos_band. Stores the band's rows. Does nothing when src,
+ * dst or table is null, a size or bytes_per_pixel is below 1, or there is no memory.
+ */
+OVRIN_API void _resize_lanczos_tp(void* band);
+
+/*
  * ---- Thread pool -----------------------------------------------------------------------------
  *
  * A fixed number of workers runs tasks in the order of their submission. All memory is obtained
@@ -415,10 +624,11 @@ OVRIN_API void _resize_y_nv21_tp(void* band);
 #define OVRIN_THREADPOOL_CAPACITY 2000
 
 typedef struct ovrin_threadpool_queue {
-    uint32_t head;                            /* index of the oldest entry */
-    uint32_t tail;                            /* index where the next entry goes */
-    uint32_t count;                           /* number of entries held */
-    void* entries[OVRIN_THREADPOOL_CAPACITY]; /* the ring; null where empty */
+    uint32_t head;  /* index of the oldest entry */
+    uint32_t tail;  /* index where the next entry goes */
+    uint32_t count; /* number of entries held */
+    /* the ring; null where empty */
+    void* entries[OVRIN_THREADPOOL_CAPACITY];
 } ovrin_threadpool_queue;
 
 typedef struct ovrin_threadpool_task {
@@ -427,17 +637,19 @@ typedef struct ovrin_threadpool_task {
 } ovrin_threadpool_task;
 
 typedef struct ovrin_threadpool {
-    ovrin_threadpool_queue pending;                         /* tasks waiting to be run */
-    ovrin_threadpool_queue free_slots;                      /* slots available for new tasks */
-    ovrin_threadpool_task tasks[OVRIN_THREADPOOL_CAPACITY]; /* the slots; queues point into them */
-    uint16_t thread_count;                                  /* workers started */
-    uint16_t stop;                                          /* 1 once teardown has begun */
-    pthread_t* threads;                                     /* one handle per worker */
-    pthread_mutex_t free_lock;                              /* guards free_slots */
-    pthread_mutex_t pending_lock;                           /* guards pending */
-    pthread_cond_t
-        slot_freed; /* submitters wait here; broadcast when free_slots gets its first entry */
-    pthread_cond_t task_ready; /* workers wait here; broadcast when pending gets its first entry */
+    ovrin_threadpool_queue pending;    /* tasks waiting to be run */
+    ovrin_threadpool_queue free_slots; /* slots available for new tasks */
+    /* the slots; queues point into them */
+    ovrin_threadpool_task tasks[OVRIN_THREADPOOL_CAPACITY];
+    uint16_t thread_count;        /* workers started */
+    uint16_t stop;                /* 1 once teardown has begun */
+    pthread_t* threads;           /* one handle per worker */
+    pthread_mutex_t free_lock;    /* guards free_slots */
+    pthread_mutex_t pending_lock; /* guards pending */
+    /* submitters wait here; broadcast when free_slots gets its first entry */
+    pthread_cond_t slot_freed;
+    /* workers wait here; broadcast when pending gets its first entry */
+    pthread_cond_t task_ready;
 } ovrin_threadpool;
 
 /*

@@ -77,3 +77,23 @@ static_assert(sizeof(ovrin_nv21_band) == 152, "");
 // The library reads and writes the running state of either record as one block.
 static_assert(sizeof(ovrin::BandState) == offsetof(ovrin_yuv_band, src_width), "");
 static_assert(sizeof(ovrin::BandState) == offsetof(ovrin_nv21_band, src_width), "");
+
+static_assert(offsetof(ovrin_bilinear_band, target) == 0, "");
+static_assert(offsetof(ovrin_bilinear_band, src_width) == 8, "");
+static_assert(offsetof(ovrin_bilinear_band, src) == 24, "");
+static_assert(offsetof(ovrin_bilinear_band, format) == 40, "");
+static_assert(offsetof(ovrin_bilinear_band, col_weight) == 56, "");
+static_assert(offsetof(ovrin_bilinear_band, first_row) == 88, "");
+static_assert(offsetof(ovrin_bilinear_band, canvas_width) == 100, "");
+static_assert(offsetof(ovrin_bilinear_band, edge_rows) == 116, "");
+static_assert(sizeof(ovrin_bilinear_band) == 120, "");
+
+static_assert(offsetof(lanczos_image, data) == 16, "");
+static_assert(sizeof(lanczos_image) == 24, "");
+
+static_assert(offsetof(ovrin_lanczos_band, src) == 16, "");
+static_assert(offsetof(ovrin_lanczos_band, bytes_per_pixel) == 32, "");
+static_assert(offsetof(ovrin_lanczos_band, rows) == 40, "");
+static_assert(offsetof(ovrin_lanczos_band, table) == 48, "");
+static_assert(offsetof(ovrin_lanczos_band, row_weights) == 64, "");
+static_assert(sizeof(ovrin_lanczos_band) == 72, "");

@@ -67,13 +67,79 @@ struct QuarterKernels {
 // ratio.
 using BeginQuarterPlan = const QuarterKernels&(QuarterPlan& plan, const QuarterRowShape& shape);
 
-// dst[i] = row[taps[i]] for i in [0, count). Reads and writes nothing else.
-using CopyTaps4 = void(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count);
-constexpr int32_t kCopyTaps = 1024;
+// Columns of a bilinear row, or of a strip of it: for every destination sample the source sample to
+// its left and the weight of the one to its right, with 12 fractional bits, 1024 to 5119.
+constexpr int32_t kBilinearColumns = 512;
+constexpr int32_t kBilinearLanes = kBilinearColumns;
+struct BilinearColumns {
+    int32_t count;
+    int32_t index[kBilinearColumns];
+    int32_t weight[kBilinearColumns];
+    // How vector kernels gather four bytes at a time; set by prepare. No lanes: not at all.
+    int32_t lanes;
+    int32_t lane_base[kBilinearLanes];
+    alignas(64) uint8_t lane_shuffle[kBilinearLanes][16];
+    alignas(64) int32_t lane_weights[kBilinearLanes][4];
+};
+
+// Bilinear rows of samples of N bytes. prepare is called once for columns whose index and weight
+// are set; then, with wx and index those of column i, wy the weight of the lower row, and P(row, k)
+// = row[N*(index + k) + c], for i in [0, count) and c in [0, N), all modulo 2^32:
+//
+//   both        dst = ((P(top, 0) * (4096 - wx) + P(top, 1) * wx) * (4096 - wy) +
+//                      (P(bottom, 0) * (4096 - wx) + P(bottom, 1) * wx) * wy) >> 24
+//   vertical    dst = (P(top, 0) * (4096 - wy) + P(bottom, 0) * wy) << 12 >> 24
+//   horizontal  dst = (P(row, 0) * (4096 - wx) + P(row, 1) * wx) << 12 >> 24
+//   copy        dst = P(row, 0)
+//
+// at dst[N*i + c]. Of the rows only bytes from the first to the last of those named are read; only
+// the bytes named are written. No alignment is needed.
+struct BilinearBlend {
+    void (*prepare)(BilinearColumns& columns);
+    void (*both)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
+                 const BilinearColumns& columns);
+};
+struct BilinearEdges {
+    void (*vertical)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
+                     const BilinearColumns& columns);
+    void (*horizontal)(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns);
+    void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
+};
+
+// One row of a seven-tap filter over interleaved components, or part of it.
+struct LanczosRow {
+    uint8_t* dst;
+    const uint8_t* taps[7];  // source rows; pixel 0 of each lies three left of column 0
+    int32_t src_components;
+    int32_t dst_components;
+    const int32_t* index;          // per pixel: the first of its seven taps in a row
+    const double* column_weights;  // per pixel: seven
+    const double* row_weights;     // seven
+    int32_t count;
+    bool has_small_weights;  // see kSmallWeights
+};
+
+// Weights of which no seven add up to more than this in absolute value leave room for shortcuts
+// that do not change a byte. Those of the kernel add up to 1.55 at most, others may come from a
+// caller.
+constexpr double kSmallWeights = 1.9;
+
+// For pixel x in [0, count), component k in [0, dst_components), with v the row weights and h the
+// pixel's column weights:
+//
+//   acc = 0; for r in [0, 7), for i in [0, 7), in this order:
+//       acc = fma(v[r] * h[i], taps[r][index[x] * src_components + i * dst_components + k], acc)
+//   dst = acc + 0.5, truncated, clamped to 0 ... 255
+//
+// in double precision, each operation rounded once: the order and the fusing are part of the
+// result.
+using LanczosRowKernel = void(const LanczosRow& row);
 
 struct Kernels {
     BeginQuarterPlan* begin_quarter_plan;
-    CopyTaps4* copy_taps4;
+    const BilinearBlend* bilinear_blend;  // these two for samples of 1, 2 and 4 bytes
+    const BilinearEdges* bilinear_edges;
+    LanczosRowKernel* lanczos_row;
 };
 
 // The plain C++ kernels, which define what every other set must compute.

@@ -9,14 +9,17 @@
 
 namespace ovrin {
 
-const Kernels scalar_kernels = {begin_quarter_plan_scalar, copy_taps4_scalar};
+const Kernels scalar_kernels = {begin_quarter_plan_scalar, bilinear_blend_scalar,
+                                bilinear_edges_scalar, lanczos_row_scalar};
 
 namespace {
 
 #if defined(__x86_64__)
 
-constexpr Kernels kAvx2Kernels = {begin_quarter_plan_avx2, copy_taps4_scalar};
-constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, copy_taps4_scalar};
+constexpr Kernels kAvx2Kernels = {begin_quarter_plan_avx2, bilinear_blend_avx2,
+                                  bilinear_edges_scalar, lanczos_row_avx2};
+constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, bilinear_blend_avx2,
+                                    bilinear_edges_scalar, lanczos_row_avx2};
 
 const Kernels* best_kernels() {
     const CpuFeatures cpu = cpu_features();
@@ -27,7 +30,8 @@ const Kernels* best_kernels() {
 
 #elif defined(__aarch64__)
 
-constexpr Kernels kNeonKernels = {begin_quarter_plan_neon, copy_taps4_scalar};
+constexpr Kernels kNeonKernels = {begin_quarter_plan_neon, bilinear_blend_neon,
+                                  bilinear_edges_scalar, lanczos_row_neon};
 
 const Kernels* best_kernels() {
     return OVRIN_MOST_KERNELS >= 1 ? &kNeonKernels : &scalar_kernels;

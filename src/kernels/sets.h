@@ -11,6 +11,13 @@ BeginQuarterPlan begin_quarter_plan_avx2;
 BeginQuarterPlan begin_quarter_plan_avx512;
 BeginQuarterPlan begin_quarter_plan_neon;
 
-CopyTaps4 copy_taps4_scalar;
+extern const BilinearBlend bilinear_blend_scalar[3];
+extern const BilinearBlend bilinear_blend_avx2[3];
+extern const BilinearBlend bilinear_blend_neon[3];
+extern const BilinearEdges bilinear_edges_scalar[3];
+
+LanczosRowKernel lanczos_row_scalar;
+LanczosRowKernel lanczos_row_avx2;
+LanczosRowKernel lanczos_row_neon;
 
 }  // namespace ovrin

@@ -10,6 +10,8 @@ namespace ovrin {
 
 namespace {
 
+constexpr int32_t kStripColumns = 1024;
+
 // Where one axis is sampled. Positions pass through single precision, which rounds those above
 // 2^24; they never decrease.
 struct NearestAxis {
@@ -53,13 +55,15 @@ void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst, int32_t s
     const NearestAxis rows(src_h, dst_h);
     const int32_t width = columns.kept(dst_w);
     const int32_t height = rows.kept(dst_h);
-    int32_t taps[kCopyTaps];
-    for (int32_t x = 0; x < width; x += kCopyTaps) {
-        const int32_t count = width - x < kCopyTaps ? width - x : kCopyTaps;
+    const auto copy = kernels().bilinear_edges[2].copy;
+    int32_t taps[kStripColumns];
+    for (int32_t x = 0; x < width; x += kStripColumns) {
+        const int32_t count = width - x < kStripColumns ? width - x : kStripColumns;
         for (int32_t i = 0; i < count; ++i) taps[i] = static_cast<int32_t>(columns.at(x + i));
         for (int32_t j = 0; j < height; ++j) {
-            kernels().copy_taps4(dst + ptrdiff_t{j} * dst_w + x,
-                                 src + ptrdiff_t{src_w} * rows.at(j), taps, count);
+            copy(reinterpret_cast<uint8_t*>(dst + ptrdiff_t{j} * dst_w + x),
+                 reinterpret_cast<const uint8_t*>(src + ptrdiff_t{src_w} * rows.at(j)), taps,
+                 count);
         }
     }
 }

@@ -23,19 +23,7 @@ void store_scan_state(ovrin_rgba_band& band, const ScanState& state) {
     band.di_33 = state.bottom_right;
 }
 
-}  // namespace
-
-void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, const RgbaRows& rows) {
-    ScanState state = scan_state(band, src_h);
-    const int32_t walked = band.band_rows > 0 ? band.band_rows : 0;
-    walk_rows(state, {src_h, dst_h, rows.dst_pixels}, walked);
-    store_scan_state(band, state);
-    band.start_row = wrapping_add(band.start_row, walked);
-    band.src_offset = wrapping_add(band.src_offset, int64_t{walked} * rows.src_pixels * kRgbaBytes);
-    band.rows_to_do = src_h >= band.start_row ? walked : 0;
-}
-
-void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
+void add_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows) {
     const QuarterPlane plane = {
         band.src + band.src_offset,
         ptrdiff_t{rows.src_pixels} * kRgbaBytes,
@@ -50,6 +38,22 @@ void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
         kRgbaBytes,
     };
     add_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes);
+}
+
+}  // namespace
+
+void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, const RgbaRows& rows) {
+    ScanState state = scan_state(band, src_h);
+    const int32_t walked = band.band_rows > 0 ? band.band_rows : 0;
+    walk_rows(state, {src_h, dst_h, rows.dst_pixels}, walked);
+    store_scan_state(band, state);
+    band.start_row = wrapping_add(band.start_row, walked);
+    band.src_offset = wrapping_add(band.src_offset, int64_t{walked} * rows.src_pixels * kRgbaBytes);
+    band.rows_to_do = src_h >= band.start_row ? walked : 0;
+}
+
+void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
+    if (band.rows_to_do > 0 && band.src_w > 0) add_rgba_band(band, rows);
     __atomic_store_n(&band.done, 1, __ATOMIC_RELEASE);
 }
 

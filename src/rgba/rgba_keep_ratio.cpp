@@ -50,6 +50,16 @@ uint32_t* first_picture_row(const ovrin_resize_target& target) {
     return static_cast<uint32_t*>(target.dst) + ptrdiff_t{target.canvas_width} * target.dst_y;
 }
 
+// Positions are not checked one by one; a negative one, which centring a picture larger than its
+// canvas easily gives, can still move the clipped picture out of the canvas's memory.
+bool lies_in_canvas(const ovrin_resize_target& target) {
+    const int64_t width = target.canvas_width;
+    if (width < target.dst_width) return false;
+    const int64_t first = width * target.dst_y + target.dst_x;
+    const int64_t last_row = first + width * (int64_t{target.dst_height} - 1);
+    return first >= 0 && last_row + target.dst_width <= width * target.canvas_height;
+}
+
 void clear_canvas(const ovrin_resize_target& target) {
     if (target.canvas_width < 1 || target.canvas_height < 1) return;
     memset(target.dst, 0,
@@ -96,6 +106,7 @@ bool resize_in_bands(const uint8_t* src, const SourceSize& size,
                      const ovrin_resize_target& target) {
     const int32_t count = band_count(size.height, band_height(size.height, target.dst_height));
     if (count < 2 || target.dst_width < 1 || target.dst_height < 1) return false;
+    if (!lies_in_canvas(target)) return false;
     if (!fits_band_record(size, target)) return false;
     BandedRun<CanvasBands> bands(first_band(src, size, target), count);
     if (!bands.ready()) return false;
@@ -120,6 +131,7 @@ void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t 
     if (is_rejected(*target)) return;
     const SourceSize size = clip_to_canvas(*target, src_w, src_h);
     clear_canvas(*target);
+    if (!lies_in_canvas(*target)) return;
     sample_plane({
         src,
         ptrdiff_t{target->src_stride} * kRgbaBytes,

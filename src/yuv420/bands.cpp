@@ -40,7 +40,7 @@ int32_t least_chroma_rows(int32_t band_rows) {
 
 void add_yuv420_band(const BandWork& work, const BandState& state) {
     const Yuv420Layout picture = {work.source.chroma, work.width, work.height};
-    if (!has_grid(picture)) return;
+    if (!has_grid(picture) || work.source.width < 1 || work.source.height < 1) return;
     const Yuv420Layout grid = grid_of(picture);
     if (work.luma_rows >= 1) {
         QuarterPlane plane = luma_plane(work.source, picture, grid, work.target);
@@ -49,7 +49,8 @@ void add_yuv420_band(const BandWork& work, const BandState& state) {
         if (state.luma.start_row == 0) start_points(scan, plane.src_rows);
         add_band(plane, scan, work.luma_rows, 1);
     }
-    if (half_rounded_up(work.source.height) <= state.chroma.start_row) return;
+    const int32_t chroma_rows = half_rounded_up(work.source.height);
+    if (work.chroma_rows < 1 || chroma_rows <= state.chroma.start_row) return;
     for (int32_t i = 0; i < work.source.chroma.planes; ++i) {
         QuarterPlane plane = chroma_plane(work.source, grid, work.target, i);
         plane.src += work.chroma_offset;

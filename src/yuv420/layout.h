@@ -51,12 +51,15 @@ struct Yuv420Source {
     }
 };
 
+// An empty picture has no planes; its pointer may be null.
 inline Yuv420Source contiguous_source(ChromaLayout chroma, const uint8_t* picture, int32_t width,
                                       int32_t height) {
     const Yuv420Layout layout = {chroma, width, height};
-    return {chroma,  width,
-            height,  width,
-            picture, {picture + layout.chroma_offset(0), picture + layout.chroma_offset(1)}};
+    Yuv420Source source = {chroma, width, height, width, picture, {nullptr, nullptr}};
+    if (layout.is_empty()) return source;
+    source.chroma_planes[0] = picture + layout.chroma_offset(0);
+    if (chroma.planes > 1) source.chroma_planes[1] = picture + layout.chroma_offset(1);
+    return source;
 }
 
 // Chroma is sampled on a grid: the destination size rounded up to multiples of 4. A destination

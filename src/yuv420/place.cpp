@@ -58,13 +58,15 @@ void cut_out(const uint8_t* grid_base, const Yuv420Layout& picture, uint8_t* dst
     }
 }
 
+void paint_black(uint8_t* base, const Yuv420Layout& picture) {
+    if (picture.is_empty()) return;
+    const size_t luma = static_cast<size_t>(picture.luma_plane());
+    memset(base, kBlackLuma, luma);
+    memset(base + luma, kBlackChroma, static_cast<size_t>(picture.bytes()) - luma);
+}
+
 void paint_canvas(ChromaLayout chroma, const ovrin_resize_target& target) {
-    const Yuv420Layout canvas = canvas_of(chroma, target);
-    if (canvas.is_empty()) return;
-    auto* bytes = static_cast<uint8_t*>(target.dst);
-    memset(bytes, kBlackLuma, static_cast<size_t>(canvas.luma_plane()));
-    memset(bytes + canvas.luma_plane(), kBlackChroma,
-           static_cast<size_t>(canvas.bytes() - canvas.luma_plane()));
+    paint_black(static_cast<uint8_t*>(target.dst), canvas_of(chroma, target));
 }
 
 void place_in_canvas(const uint8_t* grid_base, const Yuv420Layout& picture,

@@ -18,4 +18,7 @@ void place_in_canvas(const uint8_t* grid_base, const Yuv420Layout& picture,
 // Paints the canvas black.
 void paint_canvas(ChromaLayout chroma, const ovrin_resize_target& target);
 
+// Fills a contiguous picture with black.
+void paint_black(uint8_t* base, const Yuv420Layout& picture);
+
 }  // namespace ovrin

@@ -23,20 +23,29 @@ through_cmake() {
     run "$build/consumer"
 }
 
+# through_pkg_config PREFIX SOURCE
 through_pkg_config() {
     local prefix=$1 flags
     export PKG_CONFIG_LIBDIR=$prefix/$libdir/pkgconfig
     flags=$(pkg-config --cflags --libs ovrinresize)
     # shellcheck disable=SC2086 # a list of flags
-    "$CC" -std=c99 -Wall -Wextra -Werror "$here/consumer/consumer.c" -o "$tree/pkg-config-consumer" \
+    "$CC" -std=c99 -Wall -Wextra -Werror "$2" -o "$tree/pkg-config-consumer" \
         $flags -Wl,-rpath,"$prefix/$libdir"
     run "$tree/pkg-config-consumer"
+}
+
+# Cross builds have no tool.
+installed_tool() {
+    local tool=$1/bin/ovrinresize
+    if [[ -x $tool ]]; then run "$tool" --version; fi
 }
 
 check() {
     echo "in $1"
     through_cmake "$1"
-    through_pkg_config "$1"
+    through_pkg_config "$1" "$here/consumer/consumer.c"
+    through_pkg_config "$1" "$SOURCE_DIR/examples/shrink.c"
+    installed_tool "$1"
 }
 
 rm -rf "$tree"

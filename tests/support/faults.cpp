@@ -25,6 +25,7 @@ namespace {
 constexpr int kKinds = 5;
 
 std::atomic<int> call_count[kKinds];
+std::atomic<size_t> largest{0};
 std::atomic<int> failing_kind{-1};
 std::atomic<int> failing_call{0};
 std::atomic<bool> failing_later{false};
@@ -48,6 +49,12 @@ bool refuses(faults::Kind kind) {
     return true;
 }
 
+void ask(size_t size) {
+    size_t before = largest;
+    while (before < size && !largest.compare_exchange_weak(before, size)) {
+    }
+}
+
 void* remember(void* block) {
     const std::lock_guard<std::mutex> lock(blocks_mutex);
     if (block != nullptr) blocks().insert(block);
@@ -64,10 +71,12 @@ int block_count() {
 extern "C" {
 
 void* __wrap_malloc(size_t size) {
+    ask(size);
     return refuses(faults::Kind::kMalloc) ? nullptr : remember(__real_malloc(size));
 }
 
 void* __wrap_calloc(size_t count, size_t size) {
+    ask(count * size);
     return refuses(faults::Kind::kCalloc) ? nullptr : remember(__real_calloc(count, size));
 }
 
@@ -107,6 +116,7 @@ const char* name(Kind kind) {
 void reset() {
     failing_kind = -1;
     failed = false;
+    largest = 0;
     for (std::atomic<int>& count : call_count) count = 0;
 }
 
@@ -119,6 +129,10 @@ void fail(Kind kind, int nth, bool and_all_later) {
 
 int calls(Kind kind) {
     return call_count[index_of(kind)];
+}
+
+size_t largest_block() {
+    return largest;
 }
 
 bool has_failed() {

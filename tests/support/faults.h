@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <cstddef>
+
 namespace faults {
 
 // What the library asks of the system and may be refused.
@@ -17,6 +19,10 @@ void reset();
 void fail(Kind kind, int nth, bool and_all_later = false);
 
 int calls(Kind kind);
+
+// Bytes of the largest block asked for, malloc and calloc alike.
+size_t largest_block();
+
 bool has_failed();
 
 // Blocks that the program's own objects obtained and have not released, waiting up to `seconds` for

@@ -54,9 +54,9 @@ private:
 // because an emulator or a sanitizer makes each one slow.
 inline int rounds(int count) {
     const char* text = getenv("OVRIN_TEST_DIVISOR");
-    const int divisor = text == nullptr ? 1 : atoi(text);
-    const int result = divisor > 1 ? count / divisor : count;
-    return result < 2 ? 2 : result;
+    const int64_t divisor = text == nullptr ? 1 : strtoll(text, nullptr, 10);
+    const int64_t result = divisor > 1 ? count / divisor : count;
+    return result < 2 ? 2 : static_cast<int>(result);
 }
 
 }  // namespace ovrin_test

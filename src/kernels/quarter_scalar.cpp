@@ -70,8 +70,4 @@ const QuarterKernels& begin_quarter_plan_scalar(QuarterPlan& plan, const Quarter
     return kQuarterKernels[shape.sample_bytes - 1];
 }
 
-void copy_taps4_scalar(uint32_t* dst, const uint32_t* row, const int32_t* taps, int32_t count) {
-    for (int32_t i = 0; i < count; ++i) dst[i] = row[taps[i]];
-}
-
 }  // namespace ovrin

@@ -1,0 +1,74 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "kernels/sets.h"
+
+namespace ovrin {
+
+namespace {
+
+constexpr uint32_t kOne = 4096;  // a weight of 1
+
+uint32_t blend(uint32_t first, uint32_t second, int32_t weight) {
+    const uint32_t w = static_cast<uint32_t>(weight);
+    return first * (kOne - w) + second * w;
+}
+
+// Byte c of column i, blended with the sample to its right.
+template <int N>
+uint32_t blend_right(const uint8_t* row, const BilinearColumns& columns, int32_t i, int c) {
+    const uint8_t* sample = row + int64_t{N} * columns.index[i] + c;
+    return blend(sample[0], sample[N], columns.weight[i]);
+}
+
+void prepare(BilinearColumns& columns) {
+    columns.lanes = 0;
+}
+
+template <int N>
+void both(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
+          const BilinearColumns& columns) {
+    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
+        for (int c = 0; c < N; ++c) {
+            const uint32_t upper = blend_right<N>(top, columns, i, c);
+            const uint32_t lower = blend_right<N>(bottom, columns, i, c);
+            dst[c] = static_cast<uint8_t>(blend(upper, lower, wy) >> 24);
+        }
+    }
+}
+
+template <int N>
+void vertical(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
+              const BilinearColumns& columns) {
+    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
+        for (int c = 0; c < N; ++c) {
+            const int64_t sample = int64_t{N} * columns.index[i] + c;
+            dst[c] = static_cast<uint8_t>(blend(top[sample], bottom[sample], wy) << 12 >> 24);
+        }
+    }
+}
+
+template <int N>
+void horizontal(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
+        for (int c = 0; c < N; ++c) {
+            dst[c] = static_cast<uint8_t>(blend_right<N>(row, columns, i, c) << 12 >> 24);
+        }
+    }
+}
+
+template <int N>
+void copy(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count) {
+    for (int32_t i = 0; i < count; ++i, dst += N) {
+        for (int c = 0; c < N; ++c) dst[c] = row[int64_t{N} * index[i] + c];
+    }
+}
+
+}  // namespace
+
+const BilinearBlend bilinear_blend_scalar[3] = {
+    {prepare, both<1>}, {prepare, both<2>}, {prepare, both<4>}};
+
+const BilinearEdges bilinear_edges_scalar[3] = {{vertical<1>, horizontal<1>, copy<1>},
+                                                {vertical<2>, horizontal<2>, copy<2>},
+                                                {vertical<4>, horizontal<4>, copy<4>}};
+
+}  // namespace ovrin

@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: Apache-2.0
+// Destination rows of a Lanczos picture.
+#pragma once
+
+#include <stddef.h>
+#include <stdint.h>
+
+#include "lanczos/weights.h"
+
+namespace ovrin {
+
+struct LanczosRows {
+    const uint8_t* src;
+    int32_t src_w;
+    int32_t src_h;
+    ptrdiff_t src_pitch;  // bytes
+    int32_t src_components;
+    uint8_t* dst;  // the first of the rows
+    int32_t dst_w;
+    int32_t dst_h;
+    ptrdiff_t dst_pitch;
+    int32_t dst_components;
+    const double* column_weights;
+    const double* row_weights;
+};
+
+// Seven source rows with their first and last pixels repeated three times on either side.
+class LanczosCache {
+public:
+    explicit LanczosCache(const LanczosRows& picture);
+    ~LanczosCache() { free(data_); }
+    LanczosCache(const LanczosCache&) = delete;
+    LanczosCache& operator=(const LanczosCache&) = delete;
+
+    bool ready() const { return data_ != nullptr; }
+
+    // Points taps[k] to source row middle_row - 3 + k, or the nearest one that exists.
+    void load(const LanczosRows& picture, int64_t middle_row, const uint8_t* taps[kLanczosTaps]);
+
+private:
+    void copy_row(const LanczosRows& picture, int32_t slot, int64_t row);
+
+    ptrdiff_t pitch_;
+    uint8_t* data_;
+    int64_t rows_[kLanczosTaps];  // the source row in each slot; negative: none
+};
+
+// Computes destination rows [first, end).
+void filter_rows(const LanczosRows& picture, LanczosCache& cache, int32_t first, int32_t end);
+
+}  // namespace ovrin

@@ -1,0 +1,265 @@
+// SPDX-License-Identifier: Apache-2.0
+// The tool's file types: what is kept, and that damaged files end in an Error and nothing worse.
+#include <gtest/gtest.h>
+#include <png.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <functional>
+#include <vector>
+// jpeglib.h needs size_t and FILE from the headers above.
+#include <jpeglib.h>
+
+#include "codecs.h"
+#include "convert.h"
+#include "error.h"
+#include "support/random.h"
+
+using ovrin_test::Random;
+using ovrin_test::rounds;
+using tool::Picture;
+
+namespace {
+
+using Bytes = std::vector<uint8_t>;
+
+// What `write` writes to a stream.
+Bytes written(const std::function<void(FILE*)>& write) {
+    char* data = nullptr;
+    size_t size = 0;
+    FILE* const stream = open_memstream(&data, &size);
+    write(stream);
+    static_cast<void>(fclose(stream));
+    Bytes bytes(data, data + size);
+    free(data);
+    return bytes;
+}
+
+Picture random_picture(Random* random, tool::Size size, bool has_alpha) {
+    Picture picture(size);
+    picture.has_alpha = has_alpha;
+    for (uint32_t& pixel : picture.words) {
+        pixel = static_cast<uint32_t>(random->between(0, INT32_MAX)) * 2;
+    }
+    return picture;
+}
+
+// Smooth enough for JPEG to come close to it.
+Picture gradient(tool::Size size) {
+    Picture picture(size);
+    uint8_t* to = picture.bytes();
+    for (int32_t y = 0; y < size.height; ++y) {
+        for (int32_t x = 0; x < size.width; ++x) {
+            *to++ = static_cast<uint8_t>(x * 255 / size.width);
+            *to++ = static_cast<uint8_t>(y * 255 / size.height);
+            *to++ = 100;
+            *to++ = 255;
+        }
+    }
+    return picture;
+}
+
+struct Codec {
+    const char* name;
+    bool (*recognise)(const uint8_t*, size_t);
+    Picture (*decode)(const uint8_t*, size_t);
+    void (*encode)(const Picture&, FILE*);
+};
+
+const Codec kCodecs[] = {
+    {"PNG", tool::is_png, tool::decode_png, tool::encode_png},
+    {"JPEG", tool::is_jpeg, tool::decode_jpeg,
+     [](const Picture& picture, FILE* out) { tool::encode_jpeg(picture, 90, out); }},
+    {"PPM", tool::is_ppm, tool::decode_ppm, tool::encode_ppm},
+};
+
+Bytes encoded(const Codec& codec, const Picture& picture) {
+    return written([&](FILE* out) { codec.encode(picture, out); });
+}
+
+// A file 2 pixels wide and 1 high, of any sample depth, with or without alpha.
+Bytes png_of(int depth, int colors, const Bytes& row) {
+    return written([&](FILE* out) {
+        png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
+        png_infop info = png_create_info_struct(png);
+        png_init_io(png, out);
+        png_set_IHDR(png, info, 2, 1, depth, colors, PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE,
+                     PNG_FILTER_TYPE_BASE);
+        png_write_info(png, info);
+        png_write_row(png, row.data());
+        png_write_end(png, info);
+        png_destroy_write_struct(&png, &info);
+    });
+}
+
+Bytes jpeg_of(J_COLOR_SPACE colors, int channels) {
+    return written([&](FILE* out) {
+        jpeg_compress_struct codec = {};
+        jpeg_error_mgr errors = {};
+        codec.err = jpeg_std_error(&errors);
+        jpeg_create_compress(&codec);
+        jpeg_stdio_dest(&codec, out);
+        codec.image_width = 8;
+        codec.image_height = 1;
+        codec.input_components = channels;
+        codec.in_color_space = colors;
+        jpeg_set_defaults(&codec);
+        jpeg_start_compress(&codec, TRUE);
+        Bytes samples(static_cast<size_t>(8 * channels), 200);
+        JSAMPROW row = samples.data();
+        jpeg_write_scanlines(&codec, &row, 1);
+        jpeg_finish_compress(&codec);
+        jpeg_destroy_compress(&codec);
+    });
+}
+
+Bytes rgb_bytes(const Picture& picture) {
+    const Picture rgb = tool::converted(picture, tool::PixelFormat::kRgb);
+    return Bytes(rgb.bytes(), rgb.bytes() + rgb.byte_count());
+}
+
+Bytes pixels_of(const Picture& picture) {
+    return Bytes(picture.bytes(), picture.bytes() + picture.size.pixels() * 4);
+}
+
+Picture decode_ppm(const std::string& file) {
+    return tool::decode_ppm(reinterpret_cast<const uint8_t*>(file.data()), file.size());
+}
+
+}  // namespace
+
+TEST(Codecs, LosslessTypesKeepEveryPixel) {
+    Random random(1);
+    SCOPED_TRACE(random.trace());
+    for (const tool::Size size : {tool::Size{1, 1}, tool::Size{37, 5}, tool::Size{256, 64}}) {
+        for (const bool has_alpha : {false, true}) {
+            const Picture picture = random_picture(&random, size, has_alpha);
+            const Bytes png = encoded(kCodecs[0], picture);
+            const Picture from_png = tool::decode_png(png.data(), png.size());
+            EXPECT_EQ(from_png.has_alpha, has_alpha);
+            EXPECT_EQ(rgb_bytes(from_png), rgb_bytes(picture));
+            if (has_alpha) {
+                EXPECT_EQ(from_png.words, picture.words);
+            }
+            const Bytes ppm = encoded(kCodecs[2], picture);
+            const Picture from_ppm = tool::decode_ppm(ppm.data(), ppm.size());
+            EXPECT_FALSE(from_ppm.has_alpha);
+            EXPECT_EQ(rgb_bytes(from_ppm), rgb_bytes(picture));
+        }
+    }
+}
+
+TEST(Codecs, JpegComesClose) {
+    const Picture picture = gradient({80, 60});
+    const Bytes file = encoded(kCodecs[1], picture);
+    const Picture decoded = tool::decode_jpeg(file.data(), file.size());
+    ASSERT_EQ(decoded.size.width, 80);
+    ASSERT_EQ(decoded.size.height, 60);
+    for (size_t i = 0; i < picture.size.pixels() * 4; ++i) {
+        ASSERT_NEAR(decoded.bytes()[i], picture.bytes()[i], 12) << "byte " << i;
+    }
+}
+
+TEST(Codecs, PngOfOtherDepthsBecomesEightBitRgba) {
+    const Bytes deep = png_of(16, PNG_COLOR_TYPE_RGB,
+                              {0xFF, 0xFF, 0x80, 0x80, 0, 0, 0x12, 0x12, 0x34, 0x34, 0x56, 0x56});
+    EXPECT_EQ(pixels_of(tool::decode_png(deep.data(), deep.size())),
+              (Bytes{0xFF, 0x80, 0, 255, 0x12, 0x34, 0x56, 255}));
+    const Bytes gray = png_of(8, PNG_COLOR_TYPE_GRAY, {7, 250});
+    EXPECT_EQ(pixels_of(tool::decode_png(gray.data(), gray.size())),
+              (Bytes{7, 7, 7, 255, 250, 250, 250, 255}));
+    const Bytes gray_alpha = png_of(8, PNG_COLOR_TYPE_GRAY_ALPHA, {7, 90, 250, 0});
+    const Picture with_alpha = tool::decode_png(gray_alpha.data(), gray_alpha.size());
+    EXPECT_TRUE(with_alpha.has_alpha);
+    EXPECT_EQ(pixels_of(with_alpha), (Bytes{7, 7, 7, 90, 250, 250, 250, 0}));
+    const Bytes bits = png_of(1, PNG_COLOR_TYPE_GRAY, {0x40});
+    EXPECT_EQ(pixels_of(tool::decode_png(bits.data(), bits.size())),
+              (Bytes{0, 0, 0, 255, 255, 255, 255, 255}));
+}
+
+TEST(Codecs, GrayJpegIsReadAndCmykIsRefused) {
+    const Bytes gray = jpeg_of(JCS_GRAYSCALE, 1);
+    EXPECT_EQ(pixels_of(tool::decode_jpeg(gray.data(), gray.size()))[0], 200);
+    const Bytes cmyk = jpeg_of(JCS_CMYK, 4);
+    EXPECT_THROW(tool::decode_jpeg(cmyk.data(), cmyk.size()), tool::Error);
+}
+
+TEST(Codecs, PpmHeadersAndDepths) {
+    EXPECT_EQ(pixels_of(decode_ppm("P6#c\n1# 9\n\t1\r\n15\n\x0F\x05\x08")),
+              (Bytes{255, 85, 136, 255}));
+    EXPECT_EQ(pixels_of(decode_ppm(std::string("P6 1 1 65535 \xFF\xFF\x80\x80\0\0", 19))),
+              (Bytes{255, 128, 0, 255}));
+    // Samples above the stated largest value count as that value.
+    EXPECT_EQ(pixels_of(decode_ppm("P6 1 1 10 \x0A\x7F\x05")), (Bytes{255, 255, 128, 255}));
+    for (const char* file : {"P6 1 1 255", "P6 1 1 0 abc", "P6 1 1 65536 abcdef", "P6 1 -1 255 abc",
+                             "P6 1 x 255 abc", "P6 1 1 255 ab", "P6 # 1 1 255 abc"}) {
+        EXPECT_THROW(decode_ppm(file), tool::Error) << file;
+    }
+}
+
+TEST(Codecs, EachTypeIsToldApart) {
+    for (const Codec& codec : kCodecs) {
+        const Bytes file = encoded(codec, gradient({9, 7}));
+        for (const Codec& other : kCodecs) {
+            EXPECT_EQ(other.recognise(file.data(), file.size()), &codec == &other)
+                << codec.name << " as " << other.name;
+        }
+        for (size_t size = 0; size < 3; ++size) {
+            EXPECT_FALSE(codec.recognise(file.data(), size)) << codec.name;
+        }
+    }
+}
+
+TEST(Codecs, EveryTruncationIsRefused) {
+    for (const Codec& codec : kCodecs) {
+        const Bytes file = encoded(codec, gradient({40, 30}));
+        // The last bytes of a PNG, its closing chunk, hold nothing of the picture.
+        const size_t needed = file.size() - (codec.decode == tool::decode_png ? 16 : 0);
+        for (size_t size = 0; size < needed; ++size) {
+            const Bytes part(file.begin(), file.begin() + static_cast<ptrdiff_t>(size));
+            if (!codec.recognise(part.data(), size)) continue;
+            EXPECT_THROW(codec.decode(part.data(), size), tool::Error)
+                << codec.name << " cut to " << size << " of " << file.size() << " bytes";
+        }
+    }
+}
+
+TEST(Codecs, DamageEndsInAnErrorAtWorst) {
+    Random random(2);
+    SCOPED_TRACE(random.trace());
+    int refused = 0;
+    for (const Codec& codec : kCodecs) {
+        const Bytes file = encoded(codec, random_picture(&random, {33, 21}, true));
+        for (int i = 0; i < rounds(2000); ++i) {
+            Bytes damaged = file;
+            for (int hits = random.between(1, 4); hits > 0; --hits) {
+                const int last = std::min<int>(static_cast<int>(file.size()) - 1, 700);
+                damaged[static_cast<size_t>(random.between(3, last))] =
+                    static_cast<uint8_t>(random.between(0, 255));
+            }
+            try {
+                codec.decode(damaged.data(), damaged.size());
+            } catch (const tool::Error&) {
+                ++refused;
+            } catch (const std::bad_alloc&) {
+                ++refused;
+            }
+        }
+    }
+    EXPECT_GT(refused, 0);
+}
+
+TEST(Codecs, UnwritableStreamsAreReported) {
+    for (const Codec& codec : kCodecs) {
+        FILE* const full = fopen("/dev/full", "wb");
+        ASSERT_NE(full, nullptr);
+        EXPECT_THROW(
+            {
+                codec.encode(gradient({300, 300}), full);
+                if (fflush(full) != 0) throw tool::Error("flush");
+            },
+            tool::Error)
+            << codec.name;
+        static_cast<void>(fclose(full));
+    }
+}

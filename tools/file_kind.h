@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <string>
+
+#include "picture.h"
+
+namespace tool {
+
+enum class Container { kPng, kJpeg, kPpm, kY4m, kRaw };
+
+struct FileKind {
+    Container container;
+    PixelFormat format;  // of frames in kRaw and kY4m; image files hold RGBA as far as we see
+};
+
+// What the ending of a file's name stands for. Throws Error when it stands for nothing.
+FileKind kind_of_name(const std::string& path);
+
+}  // namespace tool

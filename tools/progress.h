@@ -1,0 +1,30 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+
+namespace tool {
+
+// A line on standard error that says how far a long job has come. It appears after half a second,
+// only when standard error is a terminal, and is wiped at the end.
+class Progress {
+public:
+    Progress();
+    ~Progress();
+    Progress(const Progress&) = delete;
+    Progress& operator=(const Progress&) = delete;
+
+    // part: of the work that is done, 0 to 1; negative when not known.
+    void update(int64_t frames, double part);
+
+private:
+    using Clock = std::chrono::steady_clock;
+
+    bool is_terminal_;
+    bool is_visible_ = false;
+    Clock::time_point start_;
+    Clock::time_point next_update_;
+};
+
+}  // namespace tool

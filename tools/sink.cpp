@@ -1,0 +1,66 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "sink.h"
+
+#include <cerrno>
+#include <cstring>
+#include <string>
+
+#include "codecs.h"
+#include "convert.h"
+#include "error.h"
+
+namespace tool {
+
+namespace {
+
+bool is_image_file(Container container) {
+    return container != Container::kRaw && container != Container::kY4m;
+}
+
+}  // namespace
+
+void Sink::write(const Picture& frame) {
+    if (!is_first_ && is_image_file(kind_.container)) {
+        throw Error("an image file holds one picture, but there are more");
+    }
+    if (frame.format == kind_.format) {
+        write_in_format(frame);
+    } else {
+        write_in_format(converted(frame, kind_.format));
+    }
+    is_first_ = false;
+}
+
+void Sink::write_in_format(const Picture& frame) {
+    switch (kind_.container) {
+        case Container::kPng:
+            return encode_png(frame, stream_);
+        case Container::kJpeg:
+            return encode_jpeg(frame, quality_, stream_);
+        case Container::kPpm:
+            return encode_ppm(frame, stream_);
+        case Container::kY4m: {
+            const std::string head = (is_first_ ? y4m_header_line(*y4m_header_) : "") + "FRAME\n";
+            write_bytes(head.data(), head.size());
+            return write_bytes(frame.bytes(), frame.byte_count());
+        }
+        case Container::kRaw:
+            return write_bytes(frame.bytes(), frame.byte_count());
+    }
+}
+
+void Sink::write_bytes(const void* bytes, size_t count) {
+    if (fwrite(bytes, 1, count, stream_) != count) throw Error(strerror(errno));
+}
+
+void check_conversion(FileKind from, FileKind to) {
+    const bool from_y4m = from.container == Container::kY4m;
+    if (to.container == Container::kY4m && !from_y4m) {
+        throw Error("only Y4M can be written as Y4M");
+    }
+    if (from_y4m && !has_chroma_planes(to.format)) {
+        throw Error("Y4M can be written as .y4m, .i420, .yuv or .nv21 only");
+    }
+}
+
+}  // namespace tool

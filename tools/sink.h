@@ -1,0 +1,37 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <cstdio>
+#include <optional>
+
+#include "file_kind.h"
+#include "picture.h"
+#include "y4m.h"
+
+namespace tool {
+
+// Writes frames to a stream as the kind of file asked for, converting them where need be.
+// Everything throws Error.
+class Sink {
+public:
+    // The header is for Y4M only. quality: of JPEG, 1 to 100.
+    Sink(FileKind kind, const std::optional<Y4mHeader>& y4m_header, int quality, FILE* stream)
+        : kind_(kind), y4m_header_(y4m_header), quality_(quality), stream_(stream) {}
+
+    void write(const Picture& frame);
+
+private:
+    void write_in_format(const Picture& frame);
+    void write_bytes(const void* bytes, size_t count);
+
+    FileKind kind_;
+    std::optional<Y4mHeader> y4m_header_;
+    int quality_;
+    FILE* stream_;
+    bool is_first_ = true;
+};
+
+// Whether frames of one kind of file can be written as another; Error when not.
+void check_conversion(FileKind from, FileKind to);
+
+}  // namespace tool

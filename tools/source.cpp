@@ -1,0 +1,102 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "source.h"
+
+#include <utility>
+
+#include "codecs.h"
+#include "error.h"
+
+namespace tool {
+
+namespace {
+
+constexpr char kY4mMagic[] = "YUV4MPEG2 ";
+constexpr size_t kY4mMagicBytes = sizeof(kY4mMagic) - 1;
+constexpr size_t kPeekBytes = 16;
+
+// An image file: one picture.
+class Still : public Source {
+public:
+    using Decode = Picture(const uint8_t*, size_t);
+
+    Still(Input input, Container container, Decode* decode)
+        : Source(std::move(input), {container, PixelFormat::kRgba}) {
+        const std::vector<uint8_t> file = input_.read_all();
+        picture_ = decode(file.data(), file.size());
+        size_ = picture_->size;
+    }
+
+    bool next(Picture* frame) override {
+        if (!picture_) return false;
+        *frame = std::move(*picture_);
+        picture_.reset();
+        return true;
+    }
+
+private:
+    std::optional<Picture> picture_;
+};
+
+class Raw : public Source {
+public:
+    Raw(Input input, const RawLayout& layout)
+        : Source(std::move(input), {Container::kRaw, layout.format}) {
+        size_ = layout.size;
+    }
+
+    bool next(Picture* frame) override { return read_frame(frame); }
+};
+
+class Y4m : public Source {
+public:
+    explicit Y4m(Input input) : Source(std::move(input), {Container::kY4m, PixelFormat::kI420}) {
+        std::string line;
+        if (!input_.read_line(&line, kMaxY4mLine)) throw Error("damaged Y4M: bad header");
+        y4m_header_ = parse_y4m_header(line);
+        size_ = y4m_header_->size;
+    }
+
+    bool next(Picture* frame) override {
+        std::string line;
+        const bool is_whole = input_.read_line(&line, kMaxY4mLine);
+        if (!is_whole && line.empty()) return false;
+        if (!is_whole || line.compare(0, 5, "FRAME") != 0) {
+            throw Error("damaged Y4M: a frame was expected");
+        }
+        if (!read_frame(frame)) throw Error("damaged Y4M: the last frame is empty");
+        return true;
+    }
+};
+
+}  // namespace
+
+bool Source::read_frame(Picture* frame) {
+    if (frame->words.empty()) *frame = Picture(size_, kind_.format);
+    const size_t bytes = frame->byte_count();
+    const size_t got = input_.read(frame->bytes(), bytes);
+    if (got == 0) return false;
+    ++frames_read_;
+    if (got < bytes) {
+        throw Error("frame " + std::to_string(frames_read_) + " is cut short: " +
+                    std::to_string(got) + " of " + std::to_string(bytes) + " bytes");
+    }
+    return true;
+}
+
+std::unique_ptr<Source> open_source(const std::string& path, const std::optional<RawLayout>& raw) {
+    Input input(path);
+    if (raw) return std::make_unique<Raw>(std::move(input), *raw);
+
+    const std::vector<uint8_t> head = input.peek(kPeekBytes);
+    const auto is = [&head](auto recognise) { return recognise(head.data(), head.size()); };
+    if (is(is_png)) return std::make_unique<Still>(std::move(input), Container::kPng, decode_png);
+    if (is(is_jpeg))
+        return std::make_unique<Still>(std::move(input), Container::kJpeg, decode_jpeg);
+    if (is(is_ppm)) return std::make_unique<Still>(std::move(input), Container::kPpm, decode_ppm);
+    if (std::string(head.begin(), head.end()).compare(0, kY4mMagicBytes, kY4mMagic) == 0) {
+        return std::make_unique<Y4m>(std::move(input));
+    }
+    throw Error("neither PNG, JPEG, binary PPM (P6) nor Y4M; raw frames need --format");
+}
+
+}  // namespace tool
