@@ -32,6 +32,25 @@ constexpr Scaling kNearestSizes[] = {
     {{1920, 1080}, {640, 360}},
 };
 
+constexpr Scaling kBilinearSizes[] = {
+    {{1920, 1080}, {1366, 768}},
+    {{1280, 720}, {1920, 1080}},
+    {{1920, 1080}, {640, 360}},
+};
+
+// Results of 1024 rows or more: others are blended.
+constexpr Scaling kBandedSizes[] = {
+    {{4000, 3000}, {1440, 1080}},
+    {{3840, 2160}, {1920, 1080}},
+    {{1280, 720}, {1920, 1080}},
+};
+
+constexpr Scaling kLanczosSizes[] = {
+    {{1920, 1080}, {1280, 720}},
+    {{640, 480}, {1280, 960}},
+    {{1280, 720}, {320, 180}},
+};
+
 // From 1 to 100 megapixels, a quarter of the size each way.
 constexpr Scaling kGrowth[] = {
     {{1168, 864}, {292, 216}},    {{2048, 1536}, {512, 384}},   {{4032, 3024}, {1008, 756}},
@@ -51,8 +70,8 @@ constexpr Letterbox kLetterboxes[] = {
     {{1920, 1080}, {1280, 720}, {1280, 960}, 0, 120},
 };
 
-Job plain_job(Layout layout, const Scaling& sizes) {
-    return {layout, sizes.src, sizes.dst, sizes.dst, 0, 0};
+Job plain_job(Layout layout, const Scaling& sizes, Content content = Content::kMixed) {
+    return {layout, sizes.src, sizes.dst, sizes.dst, 0, 0, content};
 }
 
 std::string size_name(Size size) {
@@ -67,7 +86,7 @@ class List {
 public:
     // Cases that differ only in size.
     template <size_t n>
-    void add(const char* family, Layout layout, const Scaling (&sizes)[n], Sampling sampling,
+    void add(const std::string& family, Layout layout, const Scaling (&sizes)[n], Sampling sampling,
              unsigned peer_filters, const OurCalls& ours) {
         for (const Scaling& scaling : sizes) {
             const Job job = plain_job(layout, scaling);
@@ -77,11 +96,20 @@ public:
 
     void add_letterboxes(const char* layout_name, Layout layout) {
         for (const Letterbox& box : kLetterboxes) {
-            const Job job = {layout, box.src, box.dst, box.canvas, box.x, box.y};
+            const Job job = {layout, box.src, box.dst, box.canvas, box.x, box.y, Content::kMixed};
             const std::string name =
                 layout_name + (" " + scaling_name(job)) + " in " + size_name(job.canvas);
             cases_.push_back(
                 {"keep-ratio", name, job, Sampling::kQuarter, kSmoothing, our_letterbox(layout)});
+        }
+    }
+
+    // What Lanczos costs us depends on the picture: see how it decides a byte.
+    void add_lanczos(Content content, const std::string& content_name) {
+        for (const Scaling& scaling : kLanczosSizes) {
+            const Job job = plain_job(Layout::kRgba, scaling, content);
+            cases_.push_back({"Lanczos", scaling_name(job) + ", " + content_name, job,
+                              Sampling::kEveryRow, kLanczos, our_lanczos()});
         }
     }
 
@@ -108,6 +136,21 @@ void add_nearest_cases(List& list) {
     list.add("nearest", Layout::kRgba, kNearestSizes, Sampling::kPoint, kPoint, our_nearest());
 }
 
+void add_engine_cases(List& list) {
+    const auto rows = Sampling::kBilinear;
+    list.add("bilinear RGBA", Layout::kRgba, kBilinearSizes, rows, kBilinear,
+             our_bilinear(Layout::kRgba));
+    list.add("bilinear NV21", Layout::kNv21, kBilinearSizes, rows, kBilinear,
+             our_bilinear(Layout::kNv21));
+    list.add("banded RGBA", Layout::kRgba, kBandedSizes, Sampling::kPoint, kPoint,
+             our_banded_bilinear(Layout::kRgba));
+    list.add("banded NV21", Layout::kNv21, kBandedSizes, Sampling::kPoint, kPoint,
+             our_banded_bilinear(Layout::kNv21));
+    list.add_lanczos(Content::kNoise, "noise");
+    list.add_lanczos(Content::kSoft, "soft");
+    list.add_lanczos(Content::kEdges, "hard edges");
+}
+
 // Without Lanczos: it is slow, and never the best peer.
 void add_growth_cases(List& list) {
     const unsigned peer_filters = kBilinear | kArea;
@@ -131,6 +174,7 @@ std::vector<Case> all_cases() {
     List list;
     add_quarter_cases(list);
     add_nearest_cases(list);
+    add_engine_cases(list);
     add_growth_cases(list);
     return list.take();
 }

@@ -35,6 +35,14 @@ enum : unsigned {
     kSmoothing = kBilinear | kArea | kLanczos,  // all that look at more than one sample
 };
 
+// What a source shows. Most rules do not care, so theirs change from round to round.
+enum class Content {
+    kNoise,
+    kSoft,   // a gradient with a little noise
+    kEdges,  // black and white, like text
+    kMixed,
+};
+
 // What there is to do: scale the source to a size, at some place in a canvas.
 struct Job {
     Layout layout;
@@ -43,6 +51,7 @@ struct Job {
     Size canvas;  // dst itself, unless the picture is letterboxed
     int32_t x;
     int32_t y;
+    Content content;
 
     bool letterboxed() const { return canvas.width != dst.width || canvas.height != dst.height; }
 };

@@ -74,6 +74,25 @@ void letterbox_rgba_wrapper(const Job& job, const Picture& src, const Picture& c
     ovrin_resize_rgba8888_keep_ratio(src.data(), src.size.width, src.size.height, &target);
 }
 
+constexpr int32_t kFormatRgba = 7;
+constexpr int32_t kFormatNv21 = 18;
+
+template <auto resize, int32_t format>
+void bilinear(const Job& /*job*/, const Picture& src, const Picture& dst) {
+    resize(src.data(), dst.data(), src.size.width, src.size.height, dst.size.width, dst.size.height,
+           format, nullptr);
+}
+
+void lanczos(const Job& /*job*/, const Picture& src, const Picture& dst) {
+    ov_lanczos(src.data(), src.size.width, src.size.height, dst.data(), dst.size.width,
+               dst.size.height, src.planes[0].sample_bytes);
+}
+
+void lanczos_wrapper(const Job& /*job*/, const Picture& src, const Picture& dst) {
+    ovrin_resize_lanczos(src.data(), dst.data(), src.size.width, src.size.height, dst.size.width,
+                         dst.size.height, src.planes[0].sample_bytes);
+}
+
 }  // namespace
 
 OurCalls our_nv21() {
@@ -94,6 +113,20 @@ OurCalls our_rgb() {
 
 OurCalls our_nearest() {
     return {plain<ovrin_resize_nearest_rgba8888>, nullptr};
+}
+
+OurCalls our_bilinear(Layout layout) {
+    if (layout == Layout::kNv21) return {bilinear<ov_bilinear_sg, kFormatNv21>, nullptr};
+    return {bilinear<ov_bilinear_sg, kFormatRgba>, nullptr};
+}
+
+OurCalls our_banded_bilinear(Layout layout) {
+    if (layout == Layout::kNv21) return {nullptr, bilinear<ov_bilinear, kFormatNv21>};
+    return {nullptr, bilinear<ov_bilinear, kFormatRgba>};
+}
+
+OurCalls our_lanczos() {
+    return {lanczos, lanczos_wrapper};
 }
 
 OurCalls our_letterbox(Layout layout) {

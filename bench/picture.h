@@ -9,6 +9,8 @@
 
 namespace bench {
 
+constexpr size_t kSlackBytes = size_t{1} << 17;
+
 enum class Layout { kRgba, kRgb, kI420, kNv21 };
 
 struct Size {
@@ -38,6 +40,8 @@ struct Picture {
     uint8_t* data() const { return planes[0].data; }
 };
 
+// Without the slack that every buffer has: some rules, ours among them, read a row and a sample
+// past the picture.
 size_t picture_bytes(Layout layout, Size size);
 
 // The picture whose packed planes start at `data`.

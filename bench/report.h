@@ -22,8 +22,8 @@ struct Figures {
     Quartiles limit;                  // seconds per call
     std::optional<Quartiles> single;  // the calling thread
     std::optional<Quartiles> wrapper;
-    std::optional<double> over_limit;    // calling thread over limit
     std::optional<double> wrapper_gain;  // calling thread over wrapper
+    double over_limit;                   // ours over limit; ours is the calling thread if measured
     std::string best_peer;
     double best_peer_seconds;
     double faster;  // best peer over ours

@@ -16,15 +16,13 @@ namespace {
 
 constexpr size_t kPage = 4096;
 constexpr size_t kCacheLine = 64;
-// Some rules read a little past a picture's last sample, as some peers do.
-constexpr size_t kSlack = 4 * kPage;
 constexpr size_t kFewestRounds = 5;
 
 // Bytes on a page boundary.
 class Buffer {
 public:
     explicit Buffer(size_t bytes)
-        : size_((bytes + kSlack + kPage - 1) / kPage * kPage),
+        : size_((bytes + kSlackBytes + kPage - 1) / kPage * kPage),
           data_(static_cast<uint8_t*>(std::aligned_alloc(kPage, size_)), std::free) {
         if (data_ == nullptr) throw std::bad_alloc();
         std::fill_n(data_.get(), size_, uint8_t{0});
@@ -38,27 +36,33 @@ private:
     std::unique_ptr<uint8_t, decltype(&std::free)> data_;
 };
 
-// What the sources hold: noise, a soft gradient with a little noise, and hard edges like text.
-constexpr size_t kContents = 3;
-
-uint8_t content_byte(size_t content, size_t i, uint32_t random) {
-    switch (content) {
-        case 0:
-            return static_cast<uint8_t>(random);
-        case 1:
-            return static_cast<uint8_t>((i >> 6) % 251 + random % 5);
-        default:
-            return (random & 0x300) == 0 ? 0 : 255;
-    }
+uint8_t content_byte(Content content, size_t i, uint32_t random) {
+    if (content == Content::kNoise) return static_cast<uint8_t>(random);
+    if (content == Content::kSoft) return static_cast<uint8_t>((i >> 6) % 251 + random % 5);
+    return (random & 0x300) == 0 ? 0 : 255;
 }
 
-Buffer make_source(size_t bytes, size_t content) {
+Buffer make_source(size_t bytes, Content content) {
     Buffer buffer(bytes);
-    std::minstd_rand random(static_cast<unsigned>(content + 1));
+    std::minstd_rand random(static_cast<unsigned>(content) + 1);
     for (size_t i = 0; i < buffer.size(); ++i) {
         buffer.data()[i] = content_byte(content, i, static_cast<uint32_t>(random() >> 8));
     }
     return buffer;
+}
+
+// One for each content that a job shows.
+std::vector<Buffer> make_sources(const Job& job) {
+    const size_t bytes = picture_bytes(job.layout, job.src);
+    std::vector<Buffer> sources;
+    if (job.content == Content::kMixed) {
+        for (const Content content : {Content::kNoise, Content::kSoft, Content::kEdges}) {
+            sources.push_back(make_source(bytes, content));
+        }
+    } else {
+        sources.push_back(make_source(bytes, job.content));
+    }
+    return sources;
 }
 
 double seconds_since(std::chrono::steady_clock::time_point start) {
@@ -130,13 +134,10 @@ std::vector<int> calls_per_sample(const std::vector<Contender>& contenders, cons
 
 std::vector<Samples> measure(const Job& job, const std::vector<Contender>& contenders,
                              const Effort& effort) {
-    std::vector<Buffer> sources;
-    for (size_t content = 0; content < kContents; ++content) {
-        sources.push_back(make_source(picture_bytes(job.layout, job.src), content));
-    }
+    const std::vector<Buffer> sources = make_sources(job);
     const Buffer target(picture_bytes(job.layout, job.canvas));
     const auto source_at = [&](size_t round) {
-        return picture_at(sources[round % kContents].data(), job.layout, job.src);
+        return picture_at(sources[round % sources.size()].data(), job.layout, job.src);
     };
     // Where the two pictures lie to each other within a page matters to loads behind stores, so it
     // changes from round to round.

@@ -50,14 +50,14 @@ size_t touched_bytes(std::function<void()> run) {
 
 void print_stack_use(std::ostream& out, const std::vector<Case>& cases) {
     const size_t idle = touched_bytes([] {});
-    Table table(out, {{"family", 11, true},
+    Table table(out, {{"family", 13, true},
                       {"case", 39, true},
                       {"one thread", 10, false},
                       {"wrapper", 10, false}});
     for (const Case& test : cases) {
         const Job& job = test.job;
-        std::vector<uint8_t> src(picture_bytes(job.layout, job.src) + kPage);
-        std::vector<uint8_t> dst(picture_bytes(job.layout, job.canvas) + kPage);
+        std::vector<uint8_t> src(picture_bytes(job.layout, job.src) + kSlackBytes);
+        std::vector<uint8_t> dst(picture_bytes(job.layout, job.canvas) + kSlackBytes);
         const Picture from = picture_at(src.data(), job.layout, job.src);
         const Picture to = picture_at(dst.data(), job.layout, job.canvas);
         const auto use = [&](OurCall* call) -> std::string {
