@@ -5,7 +5,8 @@
 # loop takes when all data lie in the first-level cache. Prints one table.
 #
 # A loop is a block that ends in a branch to its own beginning and stores whole vectors. "stack"
-# counts its accesses to the stack, which spilled registers would cause.
+# counts its accesses to the stack, which spilled registers would cause. Where a loop calls a
+# function, a compiler did not inline what it should have, and nothing can be modelled.
 set -euo pipefail
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 
@@ -55,6 +56,10 @@ print_loops() { # COMPILER
         printf '| %-26s | %-5s | %5d | %12d | %5d |' "$name" "$1" "$bytes" \
             "$(grep -c '^	' "$loop")" "$stack"
         for processor in $processors; do
+            if grep -q '^	bl	' "$loop"; then
+                printf ' %11s |' calls
+                continue
+            fi
             printf ' %11.3f |' "$(awk -v c="$(model "$loop" "$processor")" -v b="$bytes" 'BEGIN { print c / b }')"
         done
         echo
