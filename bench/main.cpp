@@ -32,7 +32,7 @@ struct Options {
     std::string isa;
     std::string json;
     std::string chart;
-    Effort effort = {Caches::kWarm, 31, 5e-4, 12};
+    Effort effort = {Caches::kWarm, 31, 5e-4, 8};
     bool stack = false;
 };
 
