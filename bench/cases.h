@@ -1,0 +1,23 @@
+// SPDX-License-Identifier: Apache-2.0
+// What is measured.
+#pragma once
+
+#include "ours.h"
+
+namespace bench {
+
+struct Case {
+    std::string family;  // cases that share one geometric mean
+    std::string name;    // sizes, and whatever else tells it from the family's others
+    Job job;
+    Sampling sampling;  // which rows the limit reads
+    unsigned peer_filters;
+    OurCalls ours;
+};
+
+std::vector<Case> all_cases();
+
+// Ours, the limit and the peers.
+std::vector<Contender> contenders_of(const Case& test);
+
+}  // namespace bench
