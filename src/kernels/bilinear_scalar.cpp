@@ -1,4 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
+#include <string.h>
+
 #include "kernels/sets.h"
 
 namespace ovrin {
@@ -57,9 +59,7 @@ void horizontal(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns
 
 template <int N>
 void copy(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count) {
-    for (int32_t i = 0; i < count; ++i, dst += N) {
-        for (int c = 0; c < N; ++c) dst[c] = row[int64_t{N} * index[i] + c];
-    }
+    for (int32_t i = 0; i < count; ++i, dst += N) memcpy(dst, row + int64_t{N} * index[i], N);
 }
 
 }  // namespace
