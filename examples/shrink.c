@@ -2,19 +2,17 @@
 /* Shrinks a picture in memory to a quarter of its width and height. */
 #include <ovrinresize.h>
 #include <stdio.h>
-#include <stdlib.h>
+
+enum { W = 1600, H = 1200, SMALL_W = 400, SMALL_H = 300 };
+
+static uint8_t picture[W * H * 4]; /* R, G, B, A per pixel */
+static uint32_t small[SMALL_W * SMALL_H];
 
 int main(void) {
-    const int32_t w = 1600, h = 1200, small_w = 400, small_h = 300;
-    uint8_t* picture = calloc((size_t)w * h, 4); /* R, G, B, A per pixel */
-    uint32_t* small = malloc((size_t)small_w * small_h * 4);
-    if (picture == NULL || small == NULL) return 1;
-    for (int32_t i = 0; i < w * h; ++i) picture[(size_t)4 * i] = (uint8_t)(255 * (i % w) / w);
+    for (size_t i = 0; i < sizeof(picture); i += 4) picture[i] = (uint8_t)(i / 4 % W * 255 / W);
 
-    ovrin_resize_rgba8888(picture, small, w, h, small_w, small_h);
+    ovrin_resize_rgba8888(picture, small, W, H, SMALL_W, SMALL_H);
 
-    printf("red from %d to %d\n", *(uint8_t*)small, *(uint8_t*)(small + small_w - 1));
-    free(picture);
-    free(small);
+    printf("red from %d to %d\n", *(uint8_t*)&small[0], *(uint8_t*)&small[SMALL_W - 1]);
     return 0;
 }

@@ -3,6 +3,8 @@
 
 #include <ovrinresize.h>
 
+#include <vector>
+
 #include "convert.h"
 #include "error.h"
 
@@ -68,25 +70,107 @@ void resize_on_canvas(const Picture& source, const Placement& placement, Picture
     *canvas = converted(rgba, PixelFormat::kRgb);
 }
 
+void resize_nearest(const Picture& source, Picture* result) {
+    ovrin_resize_nearest_rgba8888(source.words.data(), result->words.data(), source.size.width,
+                                  source.size.height, result->size.width, result->size.height);
+}
+
+int32_t bilinear_format(PixelFormat format) {
+    switch (format) {
+        case PixelFormat::kI420:
+            return 2;
+        case PixelFormat::kNv21:
+            return 18;
+        default:
+            return 7;
+    }
+}
+
+// On the calling thread at any height: in bands the engine would not interpolate. Not for RGB.
+void resize_bilinear(const Picture& source, Picture* result) {
+    // The engine may read a row and a sample past the end, which then count; they repeat the end.
+    const size_t words = source.words.size();
+    std::vector<uint32_t> padded(source.words);
+    padded.resize(words + static_cast<size_t>(source.size.width) + 1, padded.back());
+    ov_bilinear_sg(reinterpret_cast<const uint8_t*>(padded.data()), result->bytes(),
+                   source.size.width, source.size.height, result->size.width, result->size.height,
+                   bilinear_format(source.format), nullptr);
+}
+
+// The engine knows no RGB; RGBA gives the same bytes.
+void resize_rgb_bilinear(const Picture& source, Picture* result) {
+    Picture rgba(result->size);
+    resize_bilinear(converted(source, PixelFormat::kRgba), &rgba);
+    *result = converted(rgba, PixelFormat::kRgb);
+}
+
+// Planes one by one: the library's own function for Y and VU wants more chroma than a frame has.
+void resize_planes_lanczos(const Picture& source, Picture* result) {
+    const bool planar = source.format == PixelFormat::kI420;
+    const auto half = [](Size size) { return Size{(size.width + 1) / 2, (size.height + 1) / 2}; };
+    const auto plane = [](const uint8_t* src, Size from, uint8_t* dst, Size to, int32_t samples) {
+        ov_lanczos(src, from.width, from.height, dst, to.width, to.height, samples);
+    };
+    const Size from = half(source.size);
+    const Size to = half(result->size);
+    const uint8_t* src = source.bytes() + source.size.pixels();
+    uint8_t* dst = result->bytes() + result->size.pixels();
+    plane(source.bytes(), source.size, result->bytes(), result->size, 1);
+    if (!planar) return plane(src, from, dst, to, 2);
+    plane(src, from, dst, to, 1);
+    plane(src + from.pixels(), from, dst + to.pixels(), to, 1);
+}
+
+void resize_lanczos(const Picture& source, Picture* result) {
+    if (has_chroma_planes(source.format)) return resize_planes_lanczos(source, result);
+    if (source.format == PixelFormat::kRgb) {
+        return ov_lanczos(source.bytes(), source.size.width, source.size.height, result->bytes(),
+                          result->size.width, result->size.height, 3);
+    }
+    ovrin_resize_lanczos(source.bytes(), result->bytes(), source.size.width, source.size.height,
+                         result->size.width, result->size.height, 4);
+}
+
+const char* name_of(Engine engine) {
+    switch (engine) {
+        case Engine::kQuarter:
+            return "quarter";
+        case Engine::kBilinear:
+            return "bilinear";
+        case Engine::kLanczos:
+            return "lanczos";
+        case Engine::kNearest:
+            return "nearest";
+    }
+    return "";
+}
+
 }  // namespace
 
 void check_engine(Engine engine, PixelFormat format, const Placement& placement) {
-    if (engine != Engine::kNearest) return;
-    if (format != PixelFormat::kRgba) {
+    if (engine == Engine::kQuarter) return;
+    if (engine == Engine::kNearest && format != PixelFormat::kRgba) {
         throw Error(std::string("the nearest engine handles rgba, not ") + name_of(format));
     }
-    if (placement.on_canvas) throw Error("the nearest engine knows no canvas");
+    if (placement.on_canvas) {
+        throw Error(std::string("the ") + name_of(engine) + " engine knows no canvas");
+    }
 }
 
 void resize(Engine engine, const Picture& source, const Placement& placement, Picture* result) {
     result->has_alpha = source.has_alpha;
-    if (engine == Engine::kNearest) {
-        return ovrin_resize_nearest_rgba8888(source.words.data(), result->words.data(),
-                                             source.size.width, source.size.height,
-                                             result->size.width, result->size.height);
+    switch (engine) {
+        case Engine::kQuarter:
+            if (placement.on_canvas) return resize_on_canvas(source, placement, result);
+            return resize_whole(source, result);
+        case Engine::kBilinear:
+            if (source.format == PixelFormat::kRgb) return resize_rgb_bilinear(source, result);
+            return resize_bilinear(source, result);
+        case Engine::kLanczos:
+            return resize_lanczos(source, result);
+        case Engine::kNearest:
+            return resize_nearest(source, result);
     }
-    if (placement.on_canvas) return resize_on_canvas(source, placement, result);
-    resize_whole(source, result);
 }
 
 }  // namespace tool

@@ -9,7 +9,7 @@
 
 namespace tool {
 
-enum class Engine { kQuarter, kNearest };
+enum class Engine { kQuarter, kBilinear, kLanczos, kNearest };
 
 // Throws Error when the engine cannot do that with pictures of this format.
 void check_engine(Engine engine, PixelFormat format, const Placement& placement);

@@ -137,8 +137,11 @@ void declare_resizing(CLI::App* app, Options* options) {
         "contain: the largest picture that fits into the size and keeps\n"
         "its proportions (the default with --canvas)");
     add_choice<Engine, Engine>(app, "-e,--engine", "NAME", &options->engine,
-                               {{"quarter", Engine::kQuarter}, {"nearest", Engine::kNearest}},
-                               "Resampler: quarter (the default) or nearest");
+                               {{"quarter", Engine::kQuarter},
+                                {"bilinear", Engine::kBilinear},
+                                {"lanczos", Engine::kLanczos},
+                                {"nearest", Engine::kNearest}},
+                               "Resampler: quarter (the default), bilinear, lanczos or nearest");
 }
 
 void declare(CLI::App* app, Options* options) {
@@ -193,7 +196,7 @@ void report(const Source& source, const Placement& placement, int64_t frames, do
     std::cerr << name_of(source.kind().format) << " " << to_string(source.size()) << " to "
               << to_string(placement.picture);
     if (placement.on_canvas) std::cerr << " on " << to_string(placement.result);
-    std::cerr << ": " << std::fixed << std::setprecision(2);
+    std::cerr << ": " << std::fixed << std::setprecision(3);
     if (frames == 1) {
         std::cerr << "resized in " << milliseconds << " ms\n";
     } else {

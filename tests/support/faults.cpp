@@ -7,6 +7,7 @@
 
 #include <atomic>
 #include <cstdlib>
+#include <cstring>
 #include <mutex>
 #include <unordered_set>
 
@@ -72,7 +73,10 @@ extern "C" {
 
 void* __wrap_malloc(size_t size) {
     ask(size);
-    return refuses(faults::Kind::kMalloc) ? nullptr : remember(__real_malloc(size));
+    void* block = refuses(faults::Kind::kMalloc) ? nullptr : __real_malloc(size);
+    // Whoever counts on fresh memory being zero is found out.
+    if (block != nullptr) memset(block, 0xA5, size);
+    return remember(block);
 }
 
 void* __wrap_calloc(size_t count, size_t size) {

@@ -168,6 +168,58 @@ TEST(ToolContent, NearestIsWhatTheLibraryGives) {
     }
 }
 
+TEST(ToolContent, BilinearIsWhatTheLibraryGives) {
+    Random random(6);
+    SCOPED_TRACE(random.trace());
+    for (int i = 0; i < rounds(20); ++i) {
+        const Case c = random_case(&random);
+        const std::tuple<const char*, int32_t, size_t, size_t> formats[] = {
+            {"rgba", 7, packed(c.src_w, c.src_h, 4), packed(c.dst_w, c.dst_h, 4)},
+            {"i420", 2, yuv_420(c.src_w, c.src_h), yuv_420(c.dst_w, c.dst_h)},
+            {"nv21", 18, yuv_420(c.src_w, c.src_h), yuv_420(c.dst_w, c.dst_h)}};
+        for (const auto& [name, code, src_bytes, dst_bytes] : formats) {
+            // Zeros, so that what lies behind the picture counts as little as what the tool puts
+            // there.
+            Bytes src = random.bytes(src_bytes);
+            std::fill(src.end() - std::min<ptrdiff_t>(8, std::distance(src.begin(), src.end())),
+                      src.end(), uint8_t{0});
+            Bytes padded(src);
+            padded.resize(src.size() + packed(c.src_w + 2, 1, 4));
+            Bytes dst(dst_bytes);
+            ov_bilinear_sg(padded.data(), dst.data(), c.src_w, c.src_h, c.dst_w, c.dst_h, code,
+                           nullptr);
+            EXPECT_EQ(
+                through_command(src, name, c.input_size(), c.options() + " --engine bilinear"),
+                dst);
+        }
+    }
+}
+
+TEST(ToolContent, LanczosIsWhatTheLibraryGives) {
+    Random random(7);
+    SCOPED_TRACE(random.trace());
+    for (int i = 0; i < rounds(10); ++i) {
+        const Case c = random_case(&random);
+        for (const int32_t n : {3, 4}) {
+            const Bytes src = random.bytes(packed(c.src_w, c.src_h, static_cast<size_t>(n)));
+            Bytes dst(packed(c.dst_w, c.dst_h, static_cast<size_t>(n)));
+            ov_lanczos(src.data(), c.src_w, c.src_h, dst.data(), c.dst_w, c.dst_h, n);
+            EXPECT_EQ(through_command(src, n == 3 ? "rgb" : "rgba", c.input_size(),
+                                      c.options() + " --engine lanczos"),
+                      dst);
+        }
+        // Chroma pairs are a picture of two components and half the size.
+        const Bytes src = random.bytes(yuv_420(c.src_w, c.src_h));
+        Bytes dst(yuv_420(c.dst_w, c.dst_h));
+        const auto half = [](int32_t size) { return (size + 1) / 2; };
+        ov_lanczos(src.data(), c.src_w, c.src_h, dst.data(), c.dst_w, c.dst_h, 1);
+        ov_lanczos(src.data() + packed(c.src_w, c.src_h, 1), half(c.src_w), half(c.src_h),
+                   dst.data() + packed(c.dst_w, c.dst_h, 1), half(c.dst_w), half(c.dst_h), 2);
+        EXPECT_EQ(through_command(src, "nv21", c.input_size(), c.options() + " --engine lanczos"),
+                  dst);
+    }
+}
+
 TEST(ToolContent, RgbaAndRgbStandInTheMiddleOfTheCanvas) {
     Random random(5);
     SCOPED_TRACE(random.trace());
