@@ -35,7 +35,7 @@ if (cases > 0) {
 
 if (growth_layouts ne '') {
     set lmargin 9
-    set key inside top left vertical
+    set key below horizontal
     set xrange [0.8:130]
     set yrange [0:*] noreverse
     set logscale x
