@@ -3,15 +3,12 @@
 // outside this folder knows which set is in use.
 #pragma once
 
+#include <stddef.h>
 #include <stdint.h>
 
-namespace ovrin {
+#include "quarter/points.h"
 
-// The source samples of one target sample within a row, as sample indices.
-struct Tap {
-    int32_t left;   // at the target's quarter point
-    int32_t right;  // at its three-quarter point; never less than left
-};
+namespace ovrin {
 
 // The rows that a plan is for.
 struct QuarterRowShape {
@@ -28,9 +25,8 @@ constexpr int32_t kPlanTaps = kPlanBytes / static_cast<int32_t>(sizeof(Tap));
 // on the stack, and used for every row of the strip. Kernels encode the taps in their own ways.
 struct QuarterPlan {
     int32_t sample_bytes;
-    int32_t samples;   // in the strip
-    int32_t capacity;  // most samples that the strip can take; at least 1
-    int32_t windows;   // vector kernels: source vectors that a target vector is gathered from
+    int32_t samples;         // in the strip
+    int32_t vector_samples;  // vector kernels: in a target vector
     int64_t row_bytes;
     union {
         alignas(64) Tap taps[kPlanTaps];
@@ -38,34 +34,39 @@ struct QuarterPlan {
     };
 };
 
-// Samples are appended in blocks of this many; only the last block of a strip may be shorter.
-constexpr int32_t kTapBlock = 256;
+// The source rows of a target row, and those that will be asked for next, to be fetched meanwhile.
+// The next rows may be any.
+struct QuarterRows {
+    const uint8_t* top;
+    const uint8_t* bottom;
+    const uint8_t* next_top;
+    const uint8_t* next_bottom;
+};
 
-// Row kernels that share a way of encoding a plan. append takes the taps of the next samples, in
-// order, until capacity is reached. Then, for every sample i of the strip and every byte c of a
-// sample of N bytes:
+// Row kernels that share a way of encoding a plan. For every sample i of the strip and every byte c
+// of a sample of N bytes:
 //
 //   store_pair  dst[N*i + c]  = quarters(top, i, c) + quarters(bottom, i, c)
 //   add_pair    dst[N*i + c] += quarters(top, i, c) + quarters(bottom, i, c)
-//   add_row     dst[N*i + c] += quarters(row, i, c)
+//   add_row     dst[N*i + c] += quarters(top, i, c)
 //
 //   quarters(row, i, c) = (row[N*left + c] >> 2) + (row[N*right + c] >> 2), the taps of sample i
 //
 // Four quarters reach at most 252, so no byte carries into the next. Additions wrap per byte.
 // Reads only bytes of the source_samples of each row; writes only bytes of the strip. No alignment
 // is needed; dst overlaps no source.
+using QuarterKernel = void(uint8_t* dst, const QuarterRows& rows, const QuarterPlan& plan);
 struct QuarterKernels {
-    void (*append)(QuarterPlan& plan, const Tap* taps, int32_t count);
-    void (*store_pair)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom,
-                       const QuarterPlan& plan);
-    void (*add_pair)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom,
-                     const QuarterPlan& plan);
-    void (*add_row)(uint8_t* dst, const uint8_t* row, const QuarterPlan& plan);
+    QuarterKernel* store_pair;
+    QuarterKernel* add_pair;
+    QuarterKernel* add_row;
 };
 
-// Starts an empty plan and returns the kernels to use with it: what is fastest depends on the
+// Plans the samples whose columns come next: `samples` of them, or as many as the plan has room
+// for, but at least one. Returns the kernels to use with the plan: what is fastest depends on the
 // ratio.
-using BeginQuarterPlan = const QuarterKernels&(QuarterPlan& plan, const QuarterRowShape& shape);
+using PlanQuarters = const QuarterKernels&(QuarterPlan& plan, const QuarterRowShape& shape,
+                                           QuarterColumns& columns, int32_t samples);
 
 // Columns of a bilinear row, or of a strip of it: for every destination sample the source sample to
 // its left and the weight of the one to its right, with 12 fractional bits, 1024 to 5119.
@@ -136,7 +137,7 @@ constexpr double kSmallWeights = 1.9;
 using LanczosRowKernel = void(const LanczosRow& row);
 
 struct Kernels {
-    BeginQuarterPlan* begin_quarter_plan;
+    PlanQuarters* plan_quarters;
     const BilinearBlend* bilinear_blend;  // these two for samples of 1, 2 and 4 bytes
     const BilinearEdges* bilinear_edges;
     LanczosRowKernel* lanczos_row;

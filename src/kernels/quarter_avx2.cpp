@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-// Quarter-point rows with AVX2. Byte shuffles stay inside 16-byte lanes, so each lane of a target
-// vector has windows of its own.
+// Quarter-point rows with AVX2. Byte shuffles stay inside 16-byte lanes, so each lane is a target
+// vector with windows of its own; two lanes go at a time.
 #include <immintrin.h>
 
+#include "kernels/inline.h"
 #include "kernels/quarter_windows.h"
 #include "kernels/sets.h"
 
@@ -14,23 +15,15 @@ constexpr int32_t kLane = 16;
 constexpr int32_t kVector = 32;
 constexpr int32_t kMostWindows = 8;
 
-// Storage of a plan: for every target vector and each of its windows, the shuffle masks of the left
-// and of the right taps; behind all masks, for every target vector, where its lanes' windows start.
-struct LaneBases {
-    int32_t low;
+// Storage of a plan, for every two lanes.
+struct LanesEntry {
+    int32_t low;  // first bytes of the lanes' windows within a row
     int32_t high;
+    int32_t masks;  // where in the plan lie, for each window, the masks of the left and right taps
 };
 
 constexpr int32_t mask_bytes(int32_t windows) {
     return windows * 2 * kVector;
-}
-
-constexpr int32_t most_vectors(int32_t windows) {
-    return kPlanBytes / (mask_bytes(windows) + static_cast<int32_t>(sizeof(LaneBases)));
-}
-
-constexpr int32_t bases_offset(int32_t windows) {
-    return most_vectors(windows) * mask_bytes(windows);
 }
 
 // The masks of one lane. A shuffle gives 0 where the mask's top bit is set: adding 0x70 with
@@ -48,33 +41,32 @@ void store_masks(uint8_t* masks, const WindowTaps& taps, int32_t windows) {
     }
 }
 
-int32_t append_lane(uint8_t* masks, const Tap* taps, int32_t first, int32_t bytes,
-                    const QuarterPlan& plan) {
+int32_t encode_lane(uint8_t* masks, const Tap* taps, int32_t count, const QuarterPlan& plan,
+                    int32_t windows) {
     WindowTaps window;
-    locate_taps(window, taps, first, bytes, plan, plan.windows * kLane);
-    store_masks(masks, window, plan.windows);
+    locate_taps(window, taps, count, plan, windows * kLane);
+    store_masks(masks, window, windows);
     return window.base;
 }
 
-void append(QuarterPlan& plan, const Tap* taps, int32_t count) {
-    const int32_t bytes = count * plan.sample_bytes;
-    int32_t vector = plan.samples * plan.sample_bytes / kVector;
-    auto* bases = reinterpret_cast<LaneBases*>(plan.bytes + bases_offset(plan.windows)) + vector;
-    uint8_t* masks = plan.bytes + vector * mask_bytes(plan.windows);
-    const auto lane_bytes = [](int32_t rest) { return rest < kLane ? rest : kLane; };
-    for (int32_t first = 0; first < bytes; first += kVector, ++bases) {
-        bases->low = append_lane(masks, taps, first, lane_bytes(bytes - first), plan);
-        // A lane without a tap of its own stays where the other one is.
-        const int32_t second = bytes - first > kLane ? first + kLane : first;
-        bases->high = append_lane(masks + kLane, taps, second, lane_bytes(bytes - second), plan);
-        masks += mask_bytes(plan.windows);
-    }
-    plan.samples += count;
+void encode(uint8_t* masks, LanesEntry& entry, const Tap* taps, int32_t count,
+            const QuarterPlan& plan, int32_t windows) {
+    const int32_t lane = plan.vector_samples / 2;
+    const int32_t low = count < lane ? count : lane;
+    // A lane without a tap of its own stays where the other one is.
+    const int32_t high = count > lane ? lane : 0;
+    entry.low = encode_lane(masks, taps, low, plan, windows);
+    entry.high = encode_lane(masks + kLane, taps + high, count - high, plan, windows);
 }
 
-__m256i load_lanes(const uint8_t* row, LaneBases bases, int32_t window) {
-    const auto* low = reinterpret_cast<const __m128i*>(row + bases.low + window * kLane);
-    const auto* high = reinterpret_cast<const __m128i*>(row + bases.high + window * kLane);
+void fetch_lanes(const uint8_t* row, LanesEntry entry, int32_t window) {
+    _mm_prefetch(row + entry.low + window * kLane, _MM_HINT_T0);
+    _mm_prefetch(row + entry.high + window * kLane, _MM_HINT_T0);
+}
+
+__m256i load_lanes(const uint8_t* row, LanesEntry entry, int32_t window) {
+    const auto* low = reinterpret_cast<const __m128i*>(row + entry.low + window * kLane);
+    const auto* high = reinterpret_cast<const __m128i*>(row + entry.high + window * kLane);
     return _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
                                    _mm_loadu_si128(high), 1);
 }
@@ -83,13 +75,20 @@ __m256i quarter(__m256i samples) {
     return _mm256_and_si256(_mm256_srli_epi16(samples, 2), _mm256_set1_epi8(0x3F));
 }
 
-// One target vector: the rows' quarters are summed first, then gathered for both taps.
+// Two lanes: the rows' quarters are summed first, then gathered for both taps. A cache line holds
+// four windows, so only every fourth one has its line fetched for the next rows.
 template <int kWindows, bool kPair>
-__m256i gather(const uint8_t* top, const uint8_t* bottom, LaneBases bases, const uint8_t* masks) {
+OVRIN_ALWAYS_INLINE __m256i gather(const QuarterRows& rows, const QuarterPlan& plan,
+                                   LanesEntry entry) {
+    const uint8_t* masks = plan.bytes + entry.masks;
     __m256i result = _mm256_setzero_si256();
     for (int w = 0; w < kWindows; ++w) {
-        __m256i sums = quarter(load_lanes(top, bases, w));
-        if (kPair) sums = _mm256_add_epi8(sums, quarter(load_lanes(bottom, bases, w)));
+        __m256i sums = quarter(load_lanes(rows.top, entry, w));
+        if (kPair) sums = _mm256_add_epi8(sums, quarter(load_lanes(rows.bottom, entry, w)));
+        if (w % 4 == 0) {
+            fetch_lanes(rows.next_top, entry, w);
+            if (kPair) fetch_lanes(rows.next_bottom, entry, w);
+        }
         const auto* mask = reinterpret_cast<const __m256i*>(masks + w * 2 * kVector);
         const __m256i left = _mm256_shuffle_epi8(sums, _mm256_load_si256(mask));
         const __m256i right = _mm256_shuffle_epi8(sums, _mm256_load_si256(mask + 1));
@@ -99,53 +98,58 @@ __m256i gather(const uint8_t* top, const uint8_t* bottom, LaneBases bases, const
 }
 
 template <bool kAdd>
-void put(uint8_t* dst, __m256i samples) {
-    auto* vector = reinterpret_cast<__m256i*>(dst);
-    if (kAdd) samples = _mm256_add_epi8(samples, _mm256_loadu_si256(vector));
-    _mm256_storeu_si256(vector, samples);
+void put_lane(uint8_t* dst, __m128i samples) {
+    auto* lane = reinterpret_cast<__m128i*>(dst);
+    if (kAdd) samples = _mm_add_epi8(samples, _mm_loadu_si128(lane));
+    _mm_storeu_si128(lane, samples);
 }
 
-// The last vector of a strip goes through a copy, so that nothing behind its bytes is touched.
+// The last lanes of a strip go through a copy, so that nothing behind their bytes is touched.
 template <bool kAdd>
-void put_part(uint8_t* dst, __m256i samples, int32_t bytes) {
-    alignas(kVector) uint8_t copy[kVector];
+void put_part(uint8_t* dst, __m128i samples, int32_t bytes) {
+    alignas(kLane) uint8_t copy[kLane];
     if (kAdd) memcpy(copy, dst, static_cast<size_t>(bytes));
-    put<kAdd>(copy, samples);
+    put_lane<kAdd>(copy, samples);
     memcpy(dst, copy, static_cast<size_t>(bytes));
 }
 
+__m256i first_bytes_of_lanes(int32_t count) {
+    const __m128i index = _mm_setr_epi8(0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15);
+    return _mm256_broadcastsi128_si256(
+        _mm_cmplt_epi8(index, _mm_set1_epi8(static_cast<char>(count))));
+}
+
+// Whole lanes are stored as long as they end inside the strip: what lies behind the samples of one
+// is stored by the next.
 template <int kWindows, bool kPair, bool kAdd>
-void run_windows(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    const int32_t bytes = plan.samples * plan.sample_bytes;
-    const auto* bases = reinterpret_cast<const LaneBases*>(plan.bytes + bases_offset(kWindows));
-    const uint8_t* masks = plan.bytes;
-    for (int32_t done = kVector; done <= bytes; done += kVector, dst += kVector, ++bases) {
-        put<kAdd>(dst, gather<kWindows, kPair>(top, bottom, *bases, masks));
-        masks += mask_bytes(kWindows);
+void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+    const QuarterRows rows = source;
+    const int32_t step = plan.vector_samples / 2 * plan.sample_bytes;
+    const __m256i kept = first_bytes_of_lanes(step);
+    const auto* entry = reinterpret_cast<const LanesEntry*>(plan.bytes);
+    int32_t rest = plan.samples * plan.sample_bytes;
+    const auto next = [&]() __attribute__((always_inline)) {
+        __m256i samples = gather<kWindows, kPair>(rows, plan, *entry++);
+        return kAdd ? _mm256_and_si256(samples, kept) : samples;
+    };
+    for (; rest >= step + kLane; rest -= 2 * step, dst += 2 * step) {
+        const __m256i samples = next();
+        put_lane<kAdd>(dst, _mm256_castsi256_si128(samples));
+        put_lane<kAdd>(dst + step, _mm256_extracti128_si256(samples, 1));
     }
-    if (bytes % kVector != 0) {
-        put_part<kAdd>(dst, gather<kWindows, kPair>(top, bottom, *bases, masks), bytes % kVector);
+    for (; rest > 0; rest -= 2 * step, dst += 2 * step) {
+        const __m256i samples = next();
+        put_part<kAdd>(dst, _mm256_castsi256_si128(samples), rest < step ? rest : step);
+        if (rest <= step) break;
+        const int32_t high = rest - step;
+        put_part<kAdd>(dst + step, _mm256_extracti128_si256(samples, 1), high < step ? high : step);
     }
-}
-
-template <int kWindows>
-void store_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    run_windows<kWindows, true, false>(dst, top, bottom, plan);
-}
-
-template <int kWindows>
-void add_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    run_windows<kWindows, true, true>(dst, top, bottom, plan);
-}
-
-template <int kWindows>
-void add_row(uint8_t* dst, const uint8_t* row, const QuarterPlan& plan) {
-    run_windows<kWindows, false, true>(dst, row, nullptr, plan);
 }
 
 template <int kWindows>
 constexpr QuarterKernels quarter_kernels() {
-    return {append, store_pair<kWindows>, add_pair<kWindows>, add_row<kWindows>};
+    return {run_windows<kWindows, true, false>, run_windows<kWindows, true, true>,
+            run_windows<kWindows, false, true>};
 }
 
 constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
@@ -154,13 +158,19 @@ constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
 
 }  // namespace
 
-const QuarterKernels& begin_quarter_plan_avx2(QuarterPlan& plan, const QuarterRowShape& shape) {
-    const QuarterKernels& by_taps = begin_quarter_plan_scalar(plan, shape);
-    const int32_t windows = windows_needed(shape, kLane, kLane, kMostWindows);
-    if (windows == 0) return by_taps;
-    plan.windows = windows;
-    plan.capacity = most_vectors(windows) * kVector / shape.sample_bytes;
-    return kQuarterKernels[windows - 1];
+const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
+                                         QuarterColumns& columns, int32_t samples) {
+    const WindowShape lane = window_shape(shape, kLane, kMostWindows);
+    if (lane.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
+    plan.sample_bytes = shape.sample_bytes;
+    plan.vector_samples = 2 * lane.samples;
+    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
+    plan_vectors<LanesEntry>(
+        plan, columns, samples, mask_bytes(lane.windows),
+        [&](uint8_t* masks, LanesEntry& entry, const Tap* taps, int32_t count) {
+            encode(masks, entry, taps, count, plan, lane.windows);
+        });
+    return kQuarterKernels[lane.windows - 1];
 }
 
 }  // namespace ovrin

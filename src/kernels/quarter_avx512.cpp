@@ -3,6 +3,7 @@
 // permutation picks from two windows.
 #include <immintrin.h>
 
+#include "kernels/inline.h"
 #include "kernels/quarter_windows.h"
 #include "kernels/sets.h"
 
@@ -13,36 +14,26 @@ namespace {
 constexpr int32_t kVector = 64;
 constexpr int32_t kMostWindows = 4;
 
-// Storage of a plan, for every target vector. A permutation looks at seven bits of an offset, so
-// the eighth says which of two pairs of windows it is meant for.
-struct VectorPlan {
-    alignas(kVector) uint8_t left[kVector];
-    uint8_t right[kVector];
-    uint64_t left_in_second_pair;
-    uint64_t right_in_second_pair;
-    int32_t base;
+// Storage of a plan, for every target vector.
+struct VectorEntry {
+    int32_t base;   // first byte of the windows within a row
+    int32_t masks;  // where its Offsets lie in the plan
 };
 
-constexpr int32_t kMostVectors = kPlanBytes / static_cast<int32_t>(sizeof(VectorPlan));
+// Offsets of the taps from the start of the windows. A permutation looks at seven bits of them; the
+// eighth says which of two pairs of windows it is meant for.
+struct Offsets {
+    alignas(kVector) uint8_t left[kVector];
+    uint8_t right[kVector];
+};
 
-void append(QuarterPlan& plan, const Tap* taps, int32_t count) {
-    const int32_t bytes = count * plan.sample_bytes;
-    auto* vectors = reinterpret_cast<VectorPlan*>(plan.bytes);
-    VectorPlan* vector = vectors + plan.samples * plan.sample_bytes / kVector;
-    for (int32_t first = 0; first < bytes; first += kVector, ++vector) {
-        const int32_t rest = bytes - first;
-        WindowTaps window;
-        locate_taps(window, taps, first, rest < kVector ? rest : kVector, plan,
-                    plan.windows * kVector);
-        const __m512i left = _mm512_load_si512(window.left);
-        const __m512i right = _mm512_load_si512(window.right);
-        _mm512_storeu_si512(vector->left, left);
-        _mm512_storeu_si512(vector->right, right);
-        vector->left_in_second_pair = _mm512_movepi8_mask(left);
-        vector->right_in_second_pair = _mm512_movepi8_mask(right);
-        vector->base = window.base;
-    }
-    plan.samples += count;
+void encode(uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count,
+            const QuarterPlan& plan, int32_t windows) {
+    WindowTaps window;
+    locate_taps(window, taps, count, plan, windows * kVector);
+    memcpy(masks, window.left, kVector);
+    memcpy(masks + kVector, window.right, kVector);
+    entry.base = window.base;
 }
 
 __m512i quarter(__m512i samples) {
@@ -50,10 +41,14 @@ __m512i quarter(__m512i samples) {
 }
 
 // The rows' quarters of one window.
-template <bool kPair>
-__m512i load_window(const uint8_t* top, const uint8_t* bottom, int32_t offset) {
-    __m512i sums = quarter(_mm512_loadu_si512(top + offset));
-    if (kPair) sums = _mm512_add_epi8(sums, quarter(_mm512_loadu_si512(bottom + offset)));
+template <bool kFetch, bool kPair>
+OVRIN_ALWAYS_INLINE __m512i load_window(const QuarterRows& rows, ptrdiff_t offset) {
+    if (kFetch) _mm_prefetch(rows.next_top + offset, _MM_HINT_T0);
+    __m512i sums = quarter(_mm512_loadu_si512(rows.top + offset));
+    if (kPair) {
+        if (kFetch) _mm_prefetch(rows.next_bottom + offset, _MM_HINT_T0);
+        sums = _mm512_add_epi8(sums, quarter(_mm512_loadu_si512(rows.bottom + offset)));
+    }
     return sums;
 }
 
@@ -63,11 +58,13 @@ __m512i permute(__m512i offsets, __m512i window) {
 }
 
 template <int kWindows, bool kPair>
-__m512i gather(const uint8_t* top, const uint8_t* bottom, const VectorPlan& vector) {
-    const __m512i left = _mm512_loadu_si512(vector.left);
-    const __m512i right = _mm512_loadu_si512(vector.right);
+OVRIN_ALWAYS_INLINE __m512i gather(const QuarterRows& rows, const QuarterPlan& plan,
+                                   VectorEntry entry) {
+    const auto& offsets = *reinterpret_cast<const Offsets*>(plan.bytes + entry.masks);
+    const __m512i left = _mm512_load_si512(offsets.left);
+    const __m512i right = _mm512_load_si512(offsets.right);
     const auto window = [&](int32_t w) {
-        return load_window<kPair>(top, bottom, vector.base + w * kVector);
+        return load_window<(kWindows > 1), kPair>(rows, ptrdiff_t{entry.base} + w * kVector);
     };
     const __m512i first = window(0);
     if (kWindows == 1) {
@@ -79,49 +76,47 @@ __m512i gather(const uint8_t* top, const uint8_t* bottom, const VectorPlan& vect
     if (kWindows > 2) {
         const __m512i third = window(2);
         const __m512i fourth = kWindows > 3 ? window(3) : third;
-        left_taps = _mm512_mask_mov_epi8(left_taps, vector.left_in_second_pair,
+        left_taps = _mm512_mask_mov_epi8(left_taps, _mm512_movepi8_mask(left),
                                          _mm512_permutex2var_epi8(third, left, fourth));
-        right_taps = _mm512_mask_mov_epi8(right_taps, vector.right_in_second_pair,
+        right_taps = _mm512_mask_mov_epi8(right_taps, _mm512_movepi8_mask(right),
                                           _mm512_permutex2var_epi8(third, right, fourth));
     }
     return _mm512_add_epi8(left_taps, right_taps);
 }
 
+__mmask64 first_bytes(int32_t count) {
+    return ~uint64_t{0} >> (kVector - count);
+}
+
+// Whole vectors are stored as long as they end inside the strip: what lies behind the samples of
+// one is stored by the next.
 template <int kWindows, bool kPair, bool kAdd>
-void run_windows(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    const int32_t bytes = plan.samples * plan.sample_bytes;
-    const auto* vector = reinterpret_cast<const VectorPlan*>(plan.bytes);
-    for (int32_t done = kVector; done <= bytes; done += kVector, dst += kVector, ++vector) {
-        __m512i samples = gather<kWindows, kPair>(top, bottom, *vector);
-        if (kAdd) samples = _mm512_add_epi8(samples, _mm512_loadu_si512(dst));
+void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+    const QuarterRows rows = source;
+    const int32_t step = plan.vector_samples * plan.sample_bytes;
+    const __mmask64 kept = first_bytes(step);
+    const auto* entry = reinterpret_cast<const VectorEntry*>(plan.bytes);
+    int32_t rest = plan.samples * plan.sample_bytes;
+    for (; rest >= kVector; rest -= step, dst += step, ++entry) {
+        __m512i samples = gather<kWindows, kPair>(rows, plan, *entry);
+        if (kAdd) {
+            samples =
+                _mm512_add_epi8(_mm512_maskz_mov_epi8(kept, samples), _mm512_loadu_si512(dst));
+        }
         _mm512_storeu_si512(dst, samples);
     }
-    if (bytes % kVector != 0) {
-        const __mmask64 part = ~uint64_t{0} >> (kVector - bytes % kVector);
-        __m512i samples = gather<kWindows, kPair>(top, bottom, *vector);
+    for (; rest > 0; rest -= step, dst += step, ++entry) {
+        const __mmask64 part = first_bytes(rest < step ? rest : step);
+        __m512i samples = gather<kWindows, kPair>(rows, plan, *entry);
         if (kAdd) samples = _mm512_add_epi8(samples, _mm512_maskz_loadu_epi8(part, dst));
         _mm512_mask_storeu_epi8(dst, part, samples);
     }
 }
 
 template <int kWindows>
-void store_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    run_windows<kWindows, true, false>(dst, top, bottom, plan);
-}
-
-template <int kWindows>
-void add_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    run_windows<kWindows, true, true>(dst, top, bottom, plan);
-}
-
-template <int kWindows>
-void add_row(uint8_t* dst, const uint8_t* row, const QuarterPlan& plan) {
-    run_windows<kWindows, false, true>(dst, row, nullptr, plan);
-}
-
-template <int kWindows>
 constexpr QuarterKernels quarter_kernels() {
-    return {append, store_pair<kWindows>, add_pair<kWindows>, add_row<kWindows>};
+    return {run_windows<kWindows, true, false>, run_windows<kWindows, true, true>,
+            run_windows<kWindows, false, true>};
 }
 
 constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
@@ -129,14 +124,20 @@ constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
 
 }  // namespace
 
-const QuarterKernels& begin_quarter_plan_avx512(QuarterPlan& plan, const QuarterRowShape& shape) {
-    // Where four windows do not reach, the shorter ones of AVX2 do better than many long ones.
-    const QuarterKernels& shorter = begin_quarter_plan_avx2(plan, shape);
-    const int32_t windows = windows_needed(shape, kVector, kVector, kMostWindows);
-    if (windows == 0) return shorter;
-    plan.windows = windows;
-    plan.capacity = kMostVectors * kVector / shape.sample_bytes;
-    return kQuarterKernels[windows - 1];
+const QuarterKernels& plan_quarters_avx512(QuarterPlan& plan, const QuarterRowShape& shape,
+                                           QuarterColumns& columns, int32_t samples) {
+    const WindowShape vector = window_shape(shape, kVector, kMostWindows);
+    // Rows too short for these windows may have room for shorter ones.
+    if (vector.windows == 0) return plan_quarters_avx2(plan, shape, columns, samples);
+    plan.sample_bytes = shape.sample_bytes;
+    plan.vector_samples = vector.samples;
+    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
+    plan_vectors<VectorEntry>(
+        plan, columns, samples, static_cast<int32_t>(sizeof(Offsets)),
+        [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
+            encode(masks, entry, taps, count, plan, vector.windows);
+        });
+    return kQuarterKernels[vector.windows - 1];
 }
 
 }  // namespace ovrin

@@ -3,6 +3,7 @@
 // offsets outside them, or leaves the byte as it is.
 #include <arm_neon.h>
 
+#include "kernels/inline.h"
 #include "kernels/quarter_windows.h"
 #include "kernels/sets.h"
 
@@ -15,44 +16,38 @@ constexpr int32_t kTableWindows = 4;  // windows of one lookup
 constexpr int32_t kMostWindows = 8;
 
 // Storage of a plan, for every target vector.
-struct VectorPlan {
-    alignas(kVector) uint8_t left[kVector];
-    uint8_t right[kVector];
-    int32_t base;
+struct VectorEntry {
+    int32_t base;   // first byte of the windows within a row
+    int32_t masks;  // where its Offsets lie in the plan
 };
 
-constexpr int32_t kMostVectors = kPlanBytes / static_cast<int32_t>(sizeof(VectorPlan));
+// Offsets of the taps from the start of the windows.
+struct Offsets {
+    alignas(kVector) uint8_t left[kVector];
+    uint8_t right[kVector];
+};
 
-void append(QuarterPlan& plan, const Tap* taps, int32_t count) {
-    const int32_t bytes = count * plan.sample_bytes;
-    auto* vectors = reinterpret_cast<VectorPlan*>(plan.bytes);
-    VectorPlan* vector = vectors + plan.samples * plan.sample_bytes / kVector;
-    for (int32_t first = 0; first < bytes; first += kVector, ++vector) {
-        const int32_t rest = bytes - first;
-        WindowTaps window;
-        locate_taps(window, taps, first, rest < kVector ? rest : kVector, plan,
-                    plan.windows * kVector);
-        memcpy(vector->left, window.left, kVector);
-        memcpy(vector->right, window.right, kVector);
-        vector->base = window.base;
-    }
-    plan.samples += count;
+void encode(uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count,
+            const QuarterPlan& plan, int32_t windows) {
+    WindowTaps window;
+    locate_taps(window, taps, count, plan, windows * kVector);
+    memcpy(masks, window.left, kVector);
+    memcpy(masks + kVector, window.right, kVector);
+    entry.base = window.base;
 }
 
 // The rows' quarters of one window.
 template <bool kPair>
-uint8x16_t load_window(const uint8_t* top, const uint8_t* bottom, int32_t offset) {
-    const uint8x16_t quarters = vshrq_n_u8(vld1q_u8(top + offset), 2);
-    return kPair ? vsraq_n_u8(quarters, vld1q_u8(bottom + offset), 2) : quarters;
+OVRIN_ALWAYS_INLINE uint8x16_t load_window(const QuarterRows& rows, ptrdiff_t offset) {
+    const uint8x16_t quarters = vshrq_n_u8(vld1q_u8(rows.top + offset), 2);
+    return kPair ? vsraq_n_u8(quarters, vld1q_u8(rows.bottom + offset), 2) : quarters;
 }
 
 // Looks both taps up in `kWindows` windows of one table and adds them to `taps`.
 template <int kWindows, bool kPair>
-uint8x16_t look_up(uint8x16_t taps, const uint8_t* top, const uint8_t* bottom, uint8x16_t left,
-                   uint8x16_t right, int32_t offset) {
-    const auto window = [&](int32_t w) {
-        return load_window<kPair>(top, bottom, offset + w * kVector);
-    };
+OVRIN_ALWAYS_INLINE uint8x16_t look_up(uint8x16_t taps, const QuarterRows& rows, uint8x16_t left,
+                                       uint8x16_t right, ptrdiff_t offset) {
+    const auto window = [&](int32_t w) { return load_window<kPair>(rows, offset + w * kVector); };
     const auto add = [&](uint8x16_t left_taps, uint8x16_t right_taps) {
         return vaddq_u8(taps, vaddq_u8(left_taps, right_taps));
     };
@@ -71,19 +66,31 @@ uint8x16_t look_up(uint8x16_t taps, const uint8_t* top, const uint8_t* bottom, u
     }
 }
 
+// A cache line holds four windows, so only one fetch in four is needed for the next rows.
 template <int kWindows, bool kPair>
-uint8x16_t gather(const uint8_t* top, const uint8_t* bottom, const VectorPlan& vector) {
+OVRIN_ALWAYS_INLINE void fetch(const QuarterRows& rows, ptrdiff_t offset) {
+    for (int32_t w = 0; w < kWindows; w += 4) {
+        __builtin_prefetch(rows.next_top + offset + w * kVector);
+        if (kPair) __builtin_prefetch(rows.next_bottom + offset + w * kVector);
+    }
+}
+
+template <int kWindows, bool kPair>
+OVRIN_ALWAYS_INLINE uint8x16_t gather(const QuarterRows& rows, const QuarterPlan& plan,
+                                      VectorEntry entry) {
     constexpr int kFirst = kWindows < kTableWindows ? kWindows : kTableWindows;
-    const uint8x16_t left = vld1q_u8(vector.left);
-    const uint8x16_t right = vld1q_u8(vector.right);
-    uint8x16_t taps = look_up<kFirst, kPair>(vdupq_n_u8(0), top, bottom, left, right, vector.base);
+    const auto& offsets = *reinterpret_cast<const Offsets*>(plan.bytes + entry.masks);
+    const uint8x16_t left = vld1q_u8(offsets.left);
+    const uint8x16_t right = vld1q_u8(offsets.right);
+    fetch<kWindows, kPair>(rows, entry.base);
+    uint8x16_t taps = look_up<kFirst, kPair>(vdupq_n_u8(0), rows, left, right, entry.base);
     if constexpr (kWindows > kTableWindows) {
         // Offsets below the second table wrap to values that lie outside it.
         constexpr int kTableBytes = kTableWindows * kVector;
         const uint8x16_t table_bytes = vdupq_n_u8(kTableBytes);
-        taps = look_up<kWindows - kTableWindows, kPair>(
-            taps, top, bottom, vsubq_u8(left, table_bytes), vsubq_u8(right, table_bytes),
-            vector.base + kTableBytes);
+        taps = look_up<kWindows - kTableWindows, kPair>(taps, rows, vsubq_u8(left, table_bytes),
+                                                        vsubq_u8(right, table_bytes),
+                                                        entry.base + kTableBytes);
     }
     return taps;
 }
@@ -93,41 +100,49 @@ void put(uint8_t* dst, uint8x16_t samples) {
     vst1q_u8(dst, kAdd ? vaddq_u8(samples, vld1q_u8(dst)) : samples);
 }
 
+// Through a copy, so that nothing behind the bytes is touched.
+template <bool kAdd>
+void put_part(uint8_t* dst, uint8x16_t samples, int32_t bytes) {
+    uint8_t copy[kVector];
+    if (kAdd) memcpy(copy, dst, static_cast<size_t>(bytes));
+    put<kAdd>(copy, samples);
+    memcpy(dst, copy, static_cast<size_t>(bytes));
+}
+
+uint8x16_t first_bytes(int32_t count) {
+    const uint8x16_t index = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
+    return vcltq_u8(index, vdupq_n_u8(static_cast<uint8_t>(count)));
+}
+
+// Whole vectors are stored as long as they end inside the strip: what lies behind the samples of
+// one is stored by the next. Two at a time, before either is stored: in-order processors would
+// otherwise wait for the end of one before they begin the other.
 template <int kWindows, bool kPair, bool kAdd>
-void run_windows(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    const int32_t bytes = plan.samples * plan.sample_bytes;
-    const auto* vector = reinterpret_cast<const VectorPlan*>(plan.bytes);
-    for (int32_t done = kVector; done <= bytes; done += kVector, dst += kVector, ++vector) {
-        put<kAdd>(dst, gather<kWindows, kPair>(top, bottom, *vector));
+void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+    const QuarterRows rows = source;
+    const int32_t step = plan.vector_samples * plan.sample_bytes;
+    const uint8x16_t kept = first_bytes(step);
+    const auto* entry = reinterpret_cast<const VectorEntry*>(plan.bytes);
+    int32_t rest = plan.samples * plan.sample_bytes;
+    const auto vector = [&](VectorEntry at) __attribute__((always_inline)) {
+        const uint8x16_t samples = gather<kWindows, kPair>(rows, plan, at);
+        return kAdd ? vandq_u8(samples, kept) : samples;
+    };
+    for (; rest >= step + kVector; rest -= 2 * step, dst += 2 * step, entry += 2) {
+        const uint8x16_t first = vector(entry[0]);
+        const uint8x16_t second = vector(entry[1]);
+        put<kAdd>(dst, first);
+        put<kAdd>(dst + step, second);
     }
-    if (bytes % kVector != 0) {
-        // Through a copy, so that nothing behind the strip is touched.
-        const size_t part = static_cast<size_t>(bytes % kVector);
-        uint8_t copy[kVector];
-        if (kAdd) memcpy(copy, dst, part);
-        put<kAdd>(copy, gather<kWindows, kPair>(top, bottom, *vector));
-        memcpy(dst, copy, part);
+    for (; rest > 0; rest -= step, dst += step, ++entry) {
+        put_part<kAdd>(dst, vector(*entry), rest < step ? rest : step);
     }
-}
-
-template <int kWindows>
-void store_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    run_windows<kWindows, true, false>(dst, top, bottom, plan);
-}
-
-template <int kWindows>
-void add_pair(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, const QuarterPlan& plan) {
-    run_windows<kWindows, true, true>(dst, top, bottom, plan);
-}
-
-template <int kWindows>
-void add_row(uint8_t* dst, const uint8_t* row, const QuarterPlan& plan) {
-    run_windows<kWindows, false, true>(dst, row, nullptr, plan);
 }
 
 template <int kWindows>
 constexpr QuarterKernels quarter_kernels() {
-    return {append, store_pair<kWindows>, add_pair<kWindows>, add_row<kWindows>};
+    return {run_windows<kWindows, true, false>, run_windows<kWindows, true, true>,
+            run_windows<kWindows, false, true>};
 }
 
 constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
@@ -136,13 +151,19 @@ constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
 
 }  // namespace
 
-const QuarterKernels& begin_quarter_plan_neon(QuarterPlan& plan, const QuarterRowShape& shape) {
-    const QuarterKernels& by_taps = begin_quarter_plan_scalar(plan, shape);
-    const int32_t windows = windows_needed(shape, kVector, kVector, kMostWindows);
-    if (windows == 0) return by_taps;
-    plan.windows = windows;
-    plan.capacity = kMostVectors * kVector / shape.sample_bytes;
-    return kQuarterKernels[windows - 1];
+const QuarterKernels& plan_quarters_neon(QuarterPlan& plan, const QuarterRowShape& shape,
+                                         QuarterColumns& columns, int32_t samples) {
+    const WindowShape vector = window_shape(shape, kVector, kMostWindows);
+    if (vector.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
+    plan.sample_bytes = shape.sample_bytes;
+    plan.vector_samples = vector.samples;
+    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
+    plan_vectors<VectorEntry>(
+        plan, columns, samples, static_cast<int32_t>(sizeof(Offsets)),
+        [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
+            encode(masks, entry, taps, count, plan, vector.windows);
+        });
+    return kQuarterKernels[vector.windows - 1];
 }
 
 }  // namespace ovrin

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-// How the vector sets plan a strip. Bytes of a target vector are gathered from a few whole source
-// vectors, the windows, by byte shuffles; samples of any size are just bytes here. A window starts
-// where the target vector's first tap lies, or earlier at the end of a row: no window reaches past
-// the row, so kernels load whole vectors and have no border case.
+// How the vector sets plan a strip. A target vector holds a whole number of samples; its bytes are
+// gathered from a few whole source vectors, the windows, by byte shuffles. A window starts where
+// the target vector's first tap lies, or earlier at the end of a row: no window reaches past the
+// row, so kernels load whole vectors and have no border case.
 //
 // For inclusion by kernel files only: everything has internal linkage, because each of them is
 // compiled for another instruction set.
@@ -16,55 +16,96 @@ namespace ovrin {
 
 namespace {
 
-// Bytes from a target vector's first tap to its last, at most.
-int64_t widest_span(const QuarterRowShape& shape, int32_t vector_bytes) {
-    const int64_t n = shape.sample_bytes;
+// How a row is cut: the samples of a target vector and the windows that it takes. No windows: a
+// plan of this kind does not fit the row.
+struct WindowShape {
+    int32_t samples;
+    int32_t windows;
+};
+
+// Windows of `window_bytes` that `samples` target samples need; 0 when they are too many, or longer
+// together than the source row.
+int32_t windows_needed(const QuarterRowShape& shape, int32_t samples, int32_t window_bytes,
+                       int32_t most) {
     const int64_t s = shape.source_extent;
-    // Samples that a vector touches; one of 3 bytes may begin and end inside a sample.
-    const int64_t samples = vector_bytes % n == 0 ? vector_bytes / n : (vector_bytes - 2) / n + 2;
     const int64_t points = (samples - 1) * s + ((3 * s) >> 2) - (s >> 2);
     // Points `points` apart lie at most this many cells apart, wherever the first one lies.
     const int64_t cells = (points + shape.target_extent - 1) / shape.target_extent;
-    return (cells + 1) * n;
-}
-
-// Windows of `window_bytes` that a target vector needs; 0 when they are too many, or longer
-// together than the source row.
-int32_t windows_needed(const QuarterRowShape& shape, int32_t vector_bytes, int32_t window_bytes,
-                       int32_t most) {
-    const int64_t windows = (widest_span(shape, vector_bytes) + window_bytes - 1) / window_bytes;
+    const int64_t windows = ((cells + 1) * shape.sample_bytes + window_bytes - 1) / window_bytes;
     const int64_t row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
     const bool fits = windows <= most && windows * window_bytes <= row_bytes;
     return fits && row_bytes <= INT32_MAX ? static_cast<int32_t>(windows) : 0;
 }
 
-// The taps of a target vector, as bytes from the start of its windows. Windows span at most 256
-// bytes together.
+// As many samples in a vector as the windows allow: half and a quarter of a vector still beat
+// samples one by one.
+WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes, int32_t most) {
+    int32_t samples = vector_bytes / shape.sample_bytes;
+    for (int32_t halvings = 0; halvings < 4 && samples > 1; ++halvings, samples /= 2) {
+        const int32_t windows = windows_needed(shape, samples, vector_bytes, most);
+        if (windows > 0) return {samples, windows};
+    }
+    return {0, 0};
+}
+
+// The taps of a target vector, as bytes from the start of its windows, which span at most 256 bytes
+// together. Bytes behind the vector's last sample are any.
 struct WindowTaps {
     int32_t base;  // first byte of the windows within the row
-    alignas(64) uint8_t left[64];
-    alignas(64) uint8_t right[64];
+    alignas(64) uint8_t left[64 + sizeof(uint32_t)];
+    alignas(64) uint8_t right[64 + sizeof(uint32_t)];
 };
 
-// The vector of `bytes` that starts at byte `first` of the samples whose taps are given. What is
-// behind `bytes` repeats some tap: vectors are computed whole and stored in part.
-void locate_taps(WindowTaps& window, const Tap* taps, int32_t first, int32_t bytes,
-                 const QuarterPlan& plan, int32_t span) {
+// The bytes of a sample of up to four, from the first one on.
+void put_bytes(uint8_t* offsets, int32_t first) {
+    const uint32_t bytes = static_cast<uint32_t>(first) * 0x01010101U + 0x03020100U;
+    memcpy(offsets, &bytes, sizeof bytes);
+}
+
+void locate_taps(WindowTaps& window, const Tap* taps, int32_t count, const QuarterPlan& plan,
+                 int32_t span) {
     const int32_t n = plan.sample_bytes;
+    const int32_t first = n * taps[0].left;
     const int32_t last_base = static_cast<int32_t>(plan.row_bytes) - span;
-    int32_t sample = first / n;
-    int32_t c = first % n;
-    const int32_t base = n * taps[sample].left;
-    window.base = base < last_base ? base : last_base;
+    window.base = first < last_base ? first : last_base;
     memset(window.left, 0, sizeof window.left);
     memset(window.right, 0, sizeof window.right);
-    for (int32_t i = 0; i < bytes; ++sample, c = 0) {
-        const int32_t left = n * taps[sample].left - window.base;
-        const int32_t right = n * taps[sample].right - window.base;
-        for (; c < n && i < bytes; ++c, ++i) {
-            window.left[i] = static_cast<uint8_t>(left + c);
-            window.right[i] = static_cast<uint8_t>(right + c);
+    for (int32_t i = 0; i < count; ++i) {
+        put_bytes(window.left + n * i, n * taps[i].left - window.base);
+        put_bytes(window.right + n * i, n * taps[i].right - window.base);
+    }
+}
+
+// Plans vectors until the samples or the storage end. Entries, one for each vector, grow from the
+// front of the storage, blocks of `mask_bytes` from its back. Simple ratios repeat: as long as they
+// do, vectors share one block, which stays in the cache and leaves room for longer strips.
+//
+// encode(masks, entry, taps, count) writes the masks of the vector with these taps, and all of its
+// entry but where the masks are.
+template <class Entry, class Encode>
+void plan_vectors(QuarterPlan& plan, QuarterColumns& columns, int32_t samples, int32_t mask_bytes,
+                  const Encode& encode) {
+    constexpr int32_t kEntryBytes = static_cast<int32_t>(sizeof(Entry));
+    auto* entry = reinterpret_cast<Entry*>(plan.bytes);
+    int32_t masks = kPlanBytes;
+    int32_t room = kPlanBytes;
+    for (plan.samples = 0; plan.samples < samples; ++entry) {
+        room -= kEntryBytes;
+        if (room < mask_bytes) return;
+        const int32_t rest = samples - plan.samples;
+        const int32_t count = rest < plan.vector_samples ? rest : plan.vector_samples;
+        Tap taps[64];
+        for (int32_t i = 0; i < count; ++i) taps[i] = columns.next();
+        uint8_t* block = plan.bytes + masks - mask_bytes;
+        encode(block, *entry, taps, count);
+        const bool repeats =
+            masks < kPlanBytes && memcmp(block, plan.bytes + masks, size_t(mask_bytes)) == 0;
+        if (!repeats) {
+            masks -= mask_bytes;
+            room -= mask_bytes;
         }
+        entry->masks = masks;
+        plan.samples += count;
     }
 }
 

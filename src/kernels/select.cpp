@@ -4,16 +4,16 @@
 
 namespace ovrin {
 
-const Kernels scalar_kernels = {begin_quarter_plan_scalar, bilinear_blend_scalar,
-                                bilinear_edges_scalar, lanczos_row_scalar};
+const Kernels scalar_kernels = {plan_quarters_scalar, bilinear_blend_scalar, bilinear_edges_scalar,
+                                lanczos_row_scalar};
 
 namespace {
 
 #if defined(__x86_64__)
 
-constexpr Kernels kAvx2Kernels = {begin_quarter_plan_avx2, bilinear_blend_avx2,
-                                  bilinear_edges_scalar, lanczos_row_avx2};
-constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, bilinear_blend_avx2,
+constexpr Kernels kAvx2Kernels = {plan_quarters_avx2, bilinear_blend_avx2, bilinear_edges_scalar,
+                                  lanczos_row_avx2};
+constexpr Kernels kAvx512Kernels = {plan_quarters_avx512, bilinear_blend_avx2,
                                     bilinear_edges_scalar, lanczos_row_avx2};
 
 const Kernels* best_kernels() {
@@ -25,8 +25,8 @@ const Kernels* best_kernels() {
 
 #elif defined(__aarch64__)
 
-constexpr Kernels kNeonKernels = {begin_quarter_plan_neon, bilinear_blend_neon,
-                                  bilinear_edges_scalar, lanczos_row_neon};
+constexpr Kernels kNeonKernels = {plan_quarters_neon, bilinear_blend_neon, bilinear_edges_scalar,
+                                  lanczos_row_neon};
 
 const Kernels* best_kernels() {
     return &kNeonKernels;

@@ -6,10 +6,10 @@
 
 namespace ovrin {
 
-BeginQuarterPlan begin_quarter_plan_scalar;
-BeginQuarterPlan begin_quarter_plan_avx2;
-BeginQuarterPlan begin_quarter_plan_avx512;
-BeginQuarterPlan begin_quarter_plan_neon;
+PlanQuarters plan_quarters_scalar;
+PlanQuarters plan_quarters_avx2;
+PlanQuarters plan_quarters_avx512;
+PlanQuarters plan_quarters_neon;
 
 extern const BilinearBlend bilinear_blend_scalar[3];
 extern const BilinearBlend bilinear_blend_avx2[3];

@@ -44,6 +44,25 @@ private:
     int32_t target_ = 1;
 };
 
+// The source samples of one target sample within a row, as sample indices.
+struct Tap {
+    int32_t left;   // at the target's quarter point
+    int32_t right;  // at its three-quarter point; never less than left
+};
+
+// The columns of a row from some target sample on.
+struct QuarterColumns {
+    QuarterPoints left;
+    QuarterPoints right;
+
+    Tap next() {
+        const Tap tap = {static_cast<int32_t>(left.cell()), static_cast<int32_t>(right.cell())};
+        left.next();
+        right.next();
+        return tap;
+    }
+};
+
 // Where the first target's two points lie on an axis of `source` cells.
 inline int32_t quarter_point(int32_t source) {
     return source >> 2;

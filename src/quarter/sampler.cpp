@@ -43,43 +43,13 @@ struct RowScan {
     }
 };
 
-// The columns of a row from some target sample on.
-struct Columns {
-    QuarterPoints left;
-    QuarterPoints right;
-
-    Tap next() {
-        const Tap tap = {static_cast<int32_t>(left.cell()), static_cast<int32_t>(right.cell())};
-        left.next();
-        right.next();
-        return tap;
-    }
-};
-
 // One strip of the plane: its columns, planned, and where they start.
 struct Strip {
     const QuarterKernels& kernels;
     const QuarterPlan& plan;
-    Columns columns;
+    QuarterColumns columns;
     Write write;
 };
-
-// Plans as many of the columns as one strip takes.
-const QuarterKernels& plan_strip(const QuarterPlane& plane, int32_t samples_left, Columns& columns,
-                                 QuarterPlan& plan) {
-    const QuarterKernels& strip_kernels = kernels().begin_quarter_plan(
-        plan, {plane.sample_bytes, plane.src_samples, plane.src_columns, plane.dst_columns});
-    const int32_t samples = samples_left < plan.capacity ? samples_left : plan.capacity;
-    Tap taps[kTapBlock];
-    for (int32_t planned = 0; planned < samples;) {
-        const int32_t rest = samples - planned;
-        const int32_t count = rest < kTapBlock ? rest : kTapBlock;
-        for (int32_t i = 0; i < count; ++i) taps[i] = columns.next();
-        strip_kernels.append(plan, taps, count);
-        planned += count;
-    }
-    return strip_kernels;
-}
 
 void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const QuarterPlan& plan) {
     for (int32_t i = 0; i < plan.samples; ++i, points.next()) {
@@ -92,7 +62,7 @@ void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const Quar
 
 void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
     if (target.left == target.right) {
-        strip.kernels.add_row(target.left, row, strip.plan);
+        strip.kernels.add_row(target.left, {row, row, row, row}, strip.plan);
         return;
     }
     // Only a record that no walk has made sends the columns' samples to two places.
@@ -107,6 +77,11 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     const auto row = [&](const QuarterPoints& points) {
         return plane.src + points.cell() * plane.src_pitch;
     };
+    const auto next_row = [&](QuarterPoints points) {
+        const uint8_t* current = row(points);
+        points.next();
+        return points.cell() < scan.rows ? row(points) : current;
+    };
     const auto pair =
         strip.write == Write::kStore ? strip.kernels.store_pair : strip.kernels.add_pair;
     while (scan.has_top() || scan.has_bottom()) {
@@ -116,7 +91,9 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            pair(scan.top_target.left, row(scan.top), row(scan.bottom), strip.plan);
+            pair(scan.top_target.left,
+                 {row(scan.top), row(scan.bottom), next_row(scan.top), next_row(scan.bottom)},
+                 strip.plan);
         } else if (take_top) {
             add_row(strip, scan.top_target, row(scan.top));
         } else {
@@ -134,14 +111,16 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
 }
 
 void scan_plane(const QuarterPlane& plane, RowScan scan, Write write) {
-    Columns columns = {
+    QuarterColumns columns = {
         {quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns},
         {three_quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns}};
+    const QuarterRowShape shape = {plane.sample_bytes, plane.src_samples, plane.src_columns,
+                                   plane.dst_columns};
     QuarterPlan plan;
     for (int32_t done = 0; done < plane.samples; done += plan.samples) {
-        const Columns first = columns;
+        const QuarterColumns first = columns;
         const QuarterKernels& strip_kernels =
-            plan_strip(plane, plane.samples - done, columns, plan);
+            kernels().plan_quarters(plan, shape, columns, plane.samples - done);
         scan_strip(plane, scan, {strip_kernels, plan, first, write});
         const ptrdiff_t strip_bytes = ptrdiff_t{plan.samples} * plane.sample_bytes;
         scan.top_target.move(strip_bytes);

@@ -7,7 +7,6 @@
 #include <memory>
 
 #include "kernels/kernels.h"
-#include "reference/quarter.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
 #include "support/random.h"
@@ -24,15 +23,14 @@ struct Row {
     int32_t unit;  // what the ratio counts per sample: 1, or the bytes of an interleaved pair
 };
 
-std::vector<Tap> taps_of(const Row& row) {
-    const int64_t source = int64_t{row.source_samples} * row.unit;
-    const int64_t target = int64_t{row.samples} * row.unit;
-    std::vector<Tap> taps;
-    for (int32_t k = 0; k < row.samples; ++k) {
-        taps.push_back({static_cast<int32_t>(reference::near_cell(k, source, target)),
-                        static_cast<int32_t>(reference::far_cell(k, source, target))});
-    }
-    return taps;
+// The columns from sample `first` on.
+QuarterColumns columns_of(const Row& row, int32_t first) {
+    const int32_t source = row.source_samples * row.unit;
+    const int32_t target = row.samples * row.unit;
+    QuarterColumns columns = {{quarter_point(source), source, target},
+                              {three_quarter_point(source), source, target}};
+    for (int32_t i = 0; i < first; ++i) columns.next();
+    return columns;
 }
 
 // One strip of a row, planned by one set.
@@ -41,16 +39,13 @@ struct Planned {
     const QuarterKernels* kernels;
 };
 
-std::unique_ptr<Planned> plan_with(const Kernels& set, const Row& row, const Tap* taps,
+std::unique_ptr<Planned> plan_with(const Kernels& set, const Row& row, int32_t first,
                                    int32_t count) {
     auto planned = std::make_unique<Planned>();
-    planned->kernels = &set.begin_quarter_plan(
-        planned->plan, {row.sample_bytes, row.source_samples, row.source_samples * row.unit,
-                        row.samples * row.unit});
-    const int32_t strip = std::min(count, planned->plan.capacity);
-    for (int32_t done = 0; done < strip; done += kTapBlock) {
-        planned->kernels->append(planned->plan, taps + done, std::min(strip - done, kTapBlock));
-    }
+    QuarterColumns columns = columns_of(row, first);
+    const QuarterRowShape shape = {row.sample_bytes, row.source_samples,
+                                   row.source_samples * row.unit, row.samples * row.unit};
+    planned->kernels = &set.plan_quarters(planned->plan, shape, columns, count);
     return planned;
 }
 
@@ -60,22 +55,21 @@ void run(const Planned& planned, Kernel kernel, uint8_t* dst, const uint8_t* top
          const uint8_t* bottom) {
     switch (kernel) {
         case Kernel::kStorePair:
-            return planned.kernels->store_pair(dst, top, bottom, planned.plan);
+            return planned.kernels->store_pair(dst, {top, bottom, bottom, top}, planned.plan);
         case Kernel::kAddPair:
-            return planned.kernels->add_pair(dst, top, bottom, planned.plan);
+            return planned.kernels->add_pair(dst, {top, bottom, bottom, top}, planned.plan);
         case Kernel::kAddRow:
-            return planned.kernels->add_row(dst, top, planned.plan);
+            return planned.kernels->add_row(dst, {top, nullptr, bottom, nullptr}, planned.plan);
     }
 }
 
 // Compares the strips of a whole row; returns whether the set has kernels of its own for it.
 bool check_row(const NamedKernels& set, const Row& row, Random& random) {
-    const std::vector<Tap> taps = taps_of(row);
     const size_t row_bytes =
         static_cast<size_t>(row.source_samples) * static_cast<size_t>(row.sample_bytes);
     bool differs = false;
     for (int32_t done = 0; done < row.samples;) {
-        const auto tested = plan_with(*set.kernels, row, taps.data() + done, row.samples - done);
+        const auto tested = plan_with(*set.kernels, row, done, row.samples - done);
         const int32_t strip = tested->plan.samples;
         for (const Kernel kernel : {Kernel::kStorePair, Kernel::kAddPair, Kernel::kAddRow}) {
             const Flush flush = random.pick({Flush::kEnd, Flush::kStart});
@@ -86,8 +80,7 @@ bool check_row(const NamedKernels& set, const Row& row, Random& random) {
             run(*tested, kernel, actual.data(), top.data(), bottom.data());
             std::vector<uint8_t> expected(before);
             for (int32_t at = 0; at < strip;) {
-                const auto scalar =
-                    plan_with(scalar_kernels, row, taps.data() + done + at, strip - at);
+                const auto scalar = plan_with(scalar_kernels, row, done + at, strip - at);
                 run(*scalar, kernel, expected.data() + at * row.sample_bytes, top.data(),
                     bottom.data());
                 at += scalar->plan.samples;
@@ -162,8 +155,7 @@ TEST_F(VectorQuarterKernels, ExtremeSamples) {
     for (const NamedKernels& set : vector_sets_) {
         for (const int value : {0x00, 0xFF, 0x03, 0xFC}) {
             const Row row = {1, 301, 200, 1};
-            const std::vector<Tap> taps = taps_of(row);
-            const auto planned = plan_with(*set.kernels, row, taps.data(), row.samples);
+            const auto planned = plan_with(*set.kernels, row, 0, row.samples);
             const std::vector<uint8_t> source(301, static_cast<uint8_t>(value));
             std::vector<uint8_t> dst(200, 1);
             run(*planned, Kernel::kStorePair, dst.data(), source.data(), source.data());
