@@ -36,7 +36,8 @@ add_library(ovrinresize_objects OBJECT
   src/yuv/planar_bands.cpp
   src/yuv420/bands.cpp
   src/yuv420/place.cpp
-  src/yuv420/resize.cpp)
+  src/yuv420/resize.cpp
+  src/yuv420/work_buffer.cpp)
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
   target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
     src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp)

@@ -9,9 +9,6 @@ namespace ovrin {
 
 namespace {
 
-// Whether target rows are stored or added to what is there.
-enum class Write { kStore, kAdd };
-
 // Where the next samples of a source row go: those of the left columns and those of the right ones.
 struct RowTarget {
     uint8_t* left;
@@ -48,8 +45,51 @@ struct Strip {
     const QuarterKernels& kernels;
     const QuarterPlan& plan;
     QuarterColumns columns;
-    Write write;
 };
+
+// Calls walk(strip, bytes to its left) for one strip after another.
+template <class Walk>
+void for_each_strip(const QuarterPlane& plane, const Walk& walk) {
+    const QuarterRowShape shape = {plane.sample_bytes, plane.src_samples, plane.src_columns,
+                                   plane.dst_columns};
+    QuarterColumns columns = {
+        {quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns},
+        {three_quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns}};
+    QuarterPlan plan;
+    for (int32_t done = 0; done < plane.samples; done += plan.samples) {
+        const QuarterColumns first = columns;
+        const QuarterKernels& strip_kernels =
+            kernels().plan_quarters(plan, shape, columns, plane.samples - done);
+        walk(Strip{strip_kernels, plan, first}, ptrdiff_t{done} * plane.sample_bytes);
+    }
+}
+
+const uint8_t* row_at(const QuarterPlane& plane, const QuarterPoints& points) {
+    return plane.src + points.cell() * plane.src_pitch;
+}
+
+// The row of the point after this one, or this one's if that lies behind the plane's `rows`.
+const uint8_t* row_after(const QuarterPlane& plane, QuarterPoints points, int64_t rows) {
+    const uint8_t* current = row_at(plane, points);
+    points.next();
+    return points.cell() < rows ? row_at(plane, points) : current;
+}
+
+QuarterRows rows_at(const QuarterPlane& plane, const QuarterPoints& top,
+                    const QuarterPoints& bottom, int64_t rows) {
+    return {row_at(plane, top), row_at(plane, bottom), row_after(plane, top, rows),
+            row_after(plane, bottom, rows)};
+}
+
+void store_strip(const QuarterPlane& plane, const Strip& strip, uint8_t* dst) {
+    QuarterPoints top(quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows);
+    QuarterPoints bottom(three_quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows);
+    for (int32_t j = 0; j < plane.rows; ++j, dst += plane.dst_pitch) {
+        strip.kernels.store_pair(dst, rows_at(plane, top, bottom, plane.src_rows), strip.plan);
+        top.next();
+        bottom.next();
+    }
+}
 
 void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const QuarterPlan& plan) {
     for (int32_t i = 0; i < plan.samples; ++i, points.next()) {
@@ -73,17 +113,7 @@ void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
 // A target row whose two source rows both lie in the scan is done in one go. Bands also hold halves
 // of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
 // behind.
-void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
-    const auto row = [&](const QuarterPoints& points) {
-        return plane.src + points.cell() * plane.src_pitch;
-    };
-    const auto next_row = [&](QuarterPoints points) {
-        const uint8_t* current = row(points);
-        points.next();
-        return points.cell() < scan.rows ? row(points) : current;
-    };
-    const auto pair =
-        strip.write == Write::kStore ? strip.kernels.store_pair : strip.kernels.add_pair;
+void add_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     while (scan.has_top() || scan.has_bottom()) {
         const bool both = scan.has_pair();
         // On one source row the bottom half goes first: it closes the row that is open.
@@ -91,13 +121,12 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            pair(scan.top_target.left,
-                 {row(scan.top), row(scan.bottom), next_row(scan.top), next_row(scan.bottom)},
-                 strip.plan);
+            strip.kernels.add_pair(scan.top_target.left,
+                                   rows_at(plane, scan.top, scan.bottom, scan.rows), strip.plan);
         } else if (take_top) {
-            add_row(strip, scan.top_target, row(scan.top));
+            add_row(strip, scan.top_target, row_at(plane, scan.top));
         } else {
-            add_row(strip, scan.bottom_target, row(scan.bottom));
+            add_row(strip, scan.bottom_target, row_at(plane, scan.bottom));
         }
         if (take_top) {
             scan.top.next();
@@ -110,48 +139,24 @@ void scan_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     }
 }
 
-void scan_plane(const QuarterPlane& plane, RowScan scan, Write write) {
-    QuarterColumns columns = {
-        {quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns},
-        {three_quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns}};
-    const QuarterRowShape shape = {plane.sample_bytes, plane.src_samples, plane.src_columns,
-                                   plane.dst_columns};
-    QuarterPlan plan;
-    for (int32_t done = 0; done < plane.samples; done += plan.samples) {
-        const QuarterColumns first = columns;
-        const QuarterKernels& strip_kernels =
-            kernels().plan_quarters(plan, shape, columns, plane.samples - done);
-        scan_strip(plane, scan, {strip_kernels, plan, first, write});
-        const ptrdiff_t strip_bytes = ptrdiff_t{plan.samples} * plane.sample_bytes;
-        scan.top_target.move(strip_bytes);
-        scan.bottom_target.move(strip_bytes);
-    }
-}
-
 void clear_plane(const QuarterPlane& plane) {
     const size_t row_bytes =
         static_cast<size_t>(plane.samples) * static_cast<size_t>(plane.sample_bytes);
     uint8_t* row = plane.dst;
-    for (int32_t j = 0; j < plane.dst_rows; ++j, row += plane.dst_pitch) memset(row, 0, row_bytes);
+    for (int32_t j = 0; j < plane.rows; ++j, row += plane.dst_pitch) memset(row, 0, row_bytes);
 }
 
 }  // namespace
 
 void sample_plane(const QuarterPlane& plane) {
-    if (plane.samples < 1 || plane.dst_rows < 1) return;
+    if (plane.samples < 1 || plane.rows < 1) return;
     if (plane.src_columns < 1 || plane.src_rows < 1) {
         clear_plane(plane);
         return;
     }
-    const RowTarget target = {plane.dst, plane.dst};
-    const RowScan scan = {
-        {quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows},
-        {three_quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows},
-        target,
-        target,
-        plane.src_rows,
-    };
-    scan_plane(plane, scan, Write::kStore);
+    for_each_strip(plane, [&](const Strip& strip, ptrdiff_t offset) {
+        store_strip(plane, strip, plane.dst + offset);
+    });
 }
 
 void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
@@ -159,14 +164,19 @@ void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
     if (plane.src_columns < 1) return;
     const auto at = [&](int32_t index) { return plane.dst + ptrdiff_t{index} * index_bytes; };
     const ScanAxis axis = {plane.src_rows, plane.dst_rows, 0};
-    const RowScan scan = {
+    const RowScan whole = {
         top_points(state, axis),
         bottom_points(state, axis),
         {at(state.top_left), at(state.top_right)},
         {at(state.bottom_left), at(state.bottom_right)},
         rows,
     };
-    scan_plane(plane, scan, Write::kAdd);
+    for_each_strip(plane, [&](const Strip& strip, ptrdiff_t offset) {
+        RowScan scan = whole;
+        scan.top_target.move(offset);
+        scan.bottom_target.move(offset);
+        add_strip(plane, scan, strip);
+    });
 }
 
 }  // namespace ovrin

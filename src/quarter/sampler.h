@@ -21,6 +21,7 @@ struct QuarterPlane {
     ptrdiff_t dst_pitch;   // bytes from one target row to the next
     int32_t dst_columns;   // target extent of a row
     int32_t dst_rows;      // target extent of a column
+    int32_t rows;          // target rows to sample, from the first on
     int32_t samples;       // target samples in a row
     int32_t src_samples;   // source samples in a row
     int32_t sample_bytes;  // 1 to 4

@@ -18,6 +18,7 @@ void ovrin_resize_rgb888(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_
         ptrdiff_t{dst_w} * kRgbBytes,
         dst_w,
         dst_h,
+        dst_h,
         dst_w,
         src_w,
         kRgbBytes,

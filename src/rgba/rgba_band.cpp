@@ -33,6 +33,7 @@ void add_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows) {
         ptrdiff_t{rows.dst_pixels} * kRgbaBytes,
         band.dst_w,
         band.dst_h,
+        band.dst_h,
         band.dst_w,
         band.src_w,
         kRgbaBytes,

@@ -141,6 +141,7 @@ void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t 
         ptrdiff_t{target->canvas_width} * kRgbaBytes,
         target->dst_width,
         target->dst_height,
+        target->dst_height,
         target->dst_width,
         size.width,
         kRgbaBytes,

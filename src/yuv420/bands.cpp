@@ -42,8 +42,9 @@ void add_yuv420_band(const BandWork& work, const BandState& state) {
     const Yuv420Layout picture = {work.source.chroma, work.width, work.height};
     if (!has_grid(picture) || work.source.width < 1 || work.source.height < 1) return;
     const Yuv420Layout grid = grid_of(picture);
+    const Yuv420Destination to = contiguous_destination(grid, work.target);
     if (work.luma_rows >= 1) {
-        QuarterPlane plane = luma_plane(work.source, picture, grid, work.target);
+        QuarterPlane plane = luma_plane(work.source, picture, to);
         plane.src += work.luma_offset;
         ScanState scan = state.luma.scan;
         if (state.luma.start_row == 0) start_points(scan, plane.src_rows);
@@ -52,7 +53,7 @@ void add_yuv420_band(const BandWork& work, const BandState& state) {
     const int32_t chroma_rows = half_rounded_up(work.source.height);
     if (work.chroma_rows < 1 || chroma_rows <= state.chroma.start_row) return;
     for (int32_t i = 0; i < work.source.chroma.planes; ++i) {
-        QuarterPlane plane = chroma_plane(work.source, grid, work.target, i);
+        QuarterPlane plane = chroma_plane(work.source, grid, to, i);
         plane.src += work.chroma_offset;
         ScanState scan = state.chroma.scan;
         if (state.chroma.start_row == 0) start_points(scan, plane.src_rows);

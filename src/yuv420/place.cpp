@@ -69,6 +69,23 @@ void paint_canvas(ChromaLayout chroma, const ovrin_resize_target& target) {
     paint_black(static_cast<uint8_t*>(target.dst), canvas_of(chroma, target));
 }
 
+bool fits_canvas(const Yuv420Layout& picture, const ovrin_resize_target& target) {
+    return target.dst_x >= 0 && target.dst_y >= 0 && target.dst_x % 2 == 0 &&
+           target.dst_y % 2 == 0 && int64_t{target.dst_x} + picture.width <= target.canvas_width &&
+           int64_t{target.dst_y} + picture.height <= target.canvas_height;
+}
+
+Yuv420Destination picture_in_canvas(ChromaLayout chroma, const ovrin_resize_target& target) {
+    const Yuv420Layout canvas = canvas_of(chroma, target);
+    auto* dst = static_cast<uint8_t*>(target.dst);
+    Yuv420Destination to = contiguous_destination(canvas, dst);
+    to.luma += ptrdiff_t{target.dst_y} * to.luma_pitch + target.dst_x;
+    const ptrdiff_t chroma_position = ptrdiff_t{target.dst_y / 2} * to.chroma_pitch +
+                                      ptrdiff_t{target.dst_x / 2} * chroma.sample_bytes;
+    for (int32_t plane = 0; plane < chroma.planes; ++plane) to.chroma[plane] += chroma_position;
+    return to;
+}
+
 void place_in_canvas(const uint8_t* grid_base, const Yuv420Layout& picture,
                      const ovrin_resize_target& target) {
     paint_canvas(picture.chroma, target);

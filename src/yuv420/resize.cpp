@@ -9,28 +9,24 @@ namespace ovrin {
 
 namespace {
 
-void sample_into(const Yuv420Source& source, const Yuv420Layout& picture, const Yuv420Layout& grid,
-                 uint8_t* base) {
-    sample_plane(luma_plane(source, picture, grid, base));
+void sample_into(const Yuv420Source& source, const Yuv420Layout& picture,
+                 const Yuv420Destination& to) {
+    sample_plane(luma_plane(source, picture, to));
     for (int32_t plane = 0; plane < source.chroma.planes; ++plane) {
-        sample_plane(chroma_plane(source, grid, base, plane));
+        sample_plane(chroma_plane(source, picture, to, plane));
     }
 }
 
 }  // namespace
 
+// Samples always go straight to the destination. Sizes beside the grid obtain a work buffer all the
+// same: bands of such a picture need one, and a call without memory for it writes nothing, on
+// whichever way it is run.
 void resize_yuv420(const Yuv420Source& source, uint8_t* dst, int32_t width, int32_t height) {
     const Yuv420Layout picture = {source.chroma, width, height};
     if (!has_grid(picture)) return;
-    if (is_own_grid(picture)) {
-        sample_into(source, picture, picture, dst);
-        return;
-    }
-    const Yuv420Layout grid = grid_of(picture);
-    const WorkBuffer work(grid);
-    if (work.data() == nullptr) return;
-    sample_into(source, picture, grid, work.data());
-    cut_out(work.data(), picture, dst);
+    if (!is_own_grid(picture) && WorkBuffer(grid_of(picture)).data() == nullptr) return;
+    sample_into(source, picture, contiguous_destination(picture, dst));
 }
 
 void resize_yuv420_into_canvas(const Yuv420Source& source, const ovrin_resize_target& target) {
@@ -47,7 +43,12 @@ void resize_yuv420_into_canvas(const Yuv420Source& source, const ovrin_resize_ta
     const Yuv420Layout grid = grid_of(picture);
     const WorkBuffer work(grid);
     if (work.data() == nullptr) return;
-    sample_into(source, picture, grid, work.data());
+    if (fits_canvas(picture, target)) {
+        paint_canvas(source.chroma, target);
+        sample_into(source, picture, picture_in_canvas(source.chroma, target));
+        return;
+    }
+    sample_into(source, picture, contiguous_destination(grid, work.data()));
     place_in_canvas(work.data(), picture, target);
 }
 

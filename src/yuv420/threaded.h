@@ -76,6 +76,7 @@ bool run_bands_by_work_buffer(typename Format::Band first, int32_t count,
     first.work = work.data();
     BandedRun<Format> bands(first, count);
     if (!bands.ready()) return false;
+    memset(first.work, 0, static_cast<size_t>(grid_of(picture).bytes()));
     bands.run();
     if (to.target != nullptr) {
         place_in_canvas(work.data(), picture, *to.target);

@@ -7,11 +7,10 @@
 
 namespace ovrin {
 
-// A zeroed buffer for one grid. It takes twice the luma, a third more than the planes need.
+// A buffer for one grid. It takes twice the luma, a third more than the planes need.
 class WorkBuffer {
 public:
-    explicit WorkBuffer(const Yuv420Layout& grid)
-        : data_(static_cast<uint8_t*>(calloc(2, static_cast<size_t>(grid.luma_plane())))) {}
+    explicit WorkBuffer(const Yuv420Layout& grid);
     ~WorkBuffer() { free(data_); }
 
     WorkBuffer(const WorkBuffer&) = delete;
