@@ -79,8 +79,9 @@ typedef struct ovrin_resize_target {
  * Resizes src (src_w x src_h pixels) into dst (dst_w x dst_h words). Byte n of a source pixel lands
  * in bits 8n to 8n+7 of the destination word, so in memory both have the same channel order.
  *
- * Below 1024 source rows the work is done on the calling thread, otherwise in bands on four
- * worker threads that end before the call returns. Both give the same bytes.
+ * From 1024 source rows on, pictures that take longer than threads take to start are resized in
+ * bands, on four worker threads that end before the call returns and on the calling thread; all
+ * others on the calling thread alone. Both give the same bytes.
  *
  * With a source size of 0 or less the destination is filled with 0; with a destination size of 0
  * or less nothing is written.

@@ -26,4 +26,21 @@ inline int32_t band_count(int32_t rows, int32_t height) {
     return static_cast<int32_t>((int64_t{rows} + (height >> 1)) / height);
 }
 
+// How a threaded call cuts its source.
+struct BandSplit {
+    int32_t rows;   // in every band but the last
+    int32_t count;  // less than 2: not worth any thread
+};
+
+// Runs of bands are handed out as one band: a few for each thread keep all of them busy, and every
+// further one would cost its start and its plan.
+constexpr int32_t kMostBands = 16;
+
+inline BandSplit split_into_bands(int32_t src_rows, int32_t dst_rows) {
+    const int32_t height = band_height(src_rows, dst_rows);
+    const int32_t run = (band_count(src_rows, height) + kMostBands - 1) / kMostBands;
+    if (run < 1) return {height, 0};
+    return {height * run, band_count(src_rows, height * run)};
+}
+
 }  // namespace ovrin

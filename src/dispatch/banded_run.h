@@ -19,20 +19,24 @@ namespace ovrin {
 //                                                     gives the last band all rows that are left;
 //                                                     false when there are none
 //     static bool shares_row(const Band& band)        a destination row is open where it starts
+//     static void clear_shared_row(const Band& band)  clears that row
+//
+// Tasks store the destination rows of which they have all samples; only rows that two bands share
+// are added to, and cleared before.
 template <class Format>
 class BandedRun {
 public:
     using Band = typename Format::Band;
 
-    // Obtains the pool and chains the records, starting from `first`; count is at least 2. Nothing
+    // Obtains the pool and chains the records, starting from `first`, for at least 2 bands. Nothing
     // is run or written yet.
-    BandedRun(const Band& first, int32_t count) : count_(count) {
+    BandedRun(const Band& first, const BandSplit& split) : count_(split.count) {
         pool_ = ovrin_threadpool_init(kBandThreads);
         if (pool_ == nullptr) return;
-        const size_t n = static_cast<size_t>(count);
+        const size_t n = static_cast<size_t>(count_);
         bands_ = static_cast<Band*>(calloc(n, sizeof(Band)));
         jobs_ = static_cast<BandJob*>(calloc(n, sizeof(BandJob)));
-        if (bands_ != nullptr && jobs_ != nullptr) chain(first);
+        if (bands_ != nullptr && jobs_ != nullptr) chain(first, split.rows);
     }
 
     ~BandedRun() {
@@ -48,11 +52,18 @@ public:
     bool ready() const { return pool_ != nullptr && bands_ != nullptr && jobs_ != nullptr; }
 
     // Runs all bands; returns when they are done.
-    void run() { run_bands(pool_, jobs_, count_); }
+    void run() {
+        for (int32_t i = 1; i < count_; ++i) {
+            if (jobs_[i].shares_row) Format::clear_shared_row(bands_[i]);
+        }
+        run_bands(pool_, jobs_, count_);
+        pool_ = nullptr;
+    }
 
 private:
-    void chain(const Band& first) {
+    void chain(const Band& first, int32_t rows) {
         bands_[0] = first;
+        bands_[0].band_rows = rows;
         for (int32_t i = 1; i < count_; ++i) {
             bands_[i] = bands_[i - 1];
             Format::advance(bands_[i], bands_[i - 1]);
@@ -60,9 +71,13 @@ private:
         const int32_t last = count_ - 1;
         const bool rest = Format::take_rest(bands_[last], bands_[last - 1]);
         for (int32_t i = 0; i < count_; ++i) {
-            jobs_[i] = {Format::task,       &bands_[i],
-                        &bands_[i].done,    i > 0 && Format::shares_row(bands_[i]),
-                        i == last && !rest, 0};
+            jobs_[i] = {Format::task,
+                        &bands_[i],
+                        &bands_[i].done,
+                        i > 0 && Format::shares_row(bands_[i]),
+                        i == last && !rest,
+                        false,
+                        0};
         }
     }
 

@@ -8,6 +8,22 @@ namespace ovrin {
 
 namespace {
 
+void run_contiguous(void* band, BandRows whole_rows) {
+    auto& record = *static_cast<ovrin_nv21_band*>(band);
+    run_yuv420_band(
+        record,
+        contiguous_source(kInterleavedChroma, record.src, record.src_width, record.src_height),
+        contiguous_target(record), record.src_vu_offset, record.vu_rows, whole_rows);
+}
+
+void run_separate(void* band, BandRows whole_rows) {
+    auto& record = *static_cast<ovrin_nv21_band*>(band);
+    run_yuv420_band(record,
+                    two_planes(record.src, record.src_vu, record.src_width, record.src_height,
+                               record.src_row_bytes),
+                    separate_target(record), record.src_vu_offset, record.vu_rows, whole_rows);
+}
+
 using Bands = Yuv420Bands<ovrin_nv21_band, &ovrin_nv21_band::vu_start_row,
                           &ovrin_nv21_band::vu_rows, ovrin_resize_nv21_get_pos>;
 
@@ -16,7 +32,7 @@ struct ContiguousBands : Bands {
         return first_band<Band>(source, to);
     }
 
-    static void task(void* band) { _resize_nv21_tp(band); }
+    static void task(void* band) { run_contiguous(band, BandRows::kStore); }
 };
 
 struct TwoPlaneBands : Bands {
@@ -26,7 +42,7 @@ struct TwoPlaneBands : Bands {
         return band;
     }
 
-    static void task(void* band) { _resize_y_nv21_tp(band); }
+    static void task(void* band) { run_separate(band, BandRows::kStore); }
 };
 
 int64_t chroma_row_bytes(int32_t luma_row_bytes) {
@@ -61,19 +77,11 @@ void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, int32_t ds
 }
 
 void _resize_nv21_tp(void* band) {
-    auto& record = *static_cast<ovrin_nv21_band*>(band);
-    run_yuv420_band(
-        record,
-        contiguous_source(kInterleavedChroma, record.src, record.src_width, record.src_height),
-        contiguous_target(record), record.src_vu_offset, record.vu_rows);
+    run_contiguous(band, BandRows::kAdd);
 }
 
 void _resize_y_nv21_tp(void* band) {
-    auto& record = *static_cast<ovrin_nv21_band*>(band);
-    run_yuv420_band(record,
-                    two_planes(record.src, record.src_vu, record.src_width, record.src_height,
-                               record.src_row_bytes),
-                    separate_target(record), record.src_vu_offset, record.vu_rows);
+    run_separate(band, BandRows::kAdd);
 }
 
 void ovrin_resize_nv21_tps(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,

@@ -113,7 +113,9 @@ void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
 // A target row whose two source rows both lie in the scan is done in one go. Bands also hold halves
 // of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
 // behind.
-void add_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
+void run_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip, BandRows whole_rows) {
+    const auto pair =
+        whole_rows == BandRows::kStore ? strip.kernels.store_pair : strip.kernels.add_pair;
     while (scan.has_top() || scan.has_bottom()) {
         const bool both = scan.has_pair();
         // On one source row the bottom half goes first: it closes the row that is open.
@@ -121,8 +123,8 @@ void add_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            strip.kernels.add_pair(scan.top_target.left,
-                                   rows_at(plane, scan.top, scan.bottom, scan.rows), strip.plan);
+            pair(scan.top_target.left, rows_at(plane, scan.top, scan.bottom, scan.rows),
+                 strip.plan);
         } else if (take_top) {
             add_row(strip, scan.top_target, row_at(plane, scan.top));
         } else {
@@ -159,8 +161,8 @@ void sample_plane(const QuarterPlane& plane) {
     });
 }
 
-void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
-              int32_t index_bytes) {
+void run_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes,
+              BandRows whole_rows) {
     if (plane.src_columns < 1) return;
     const auto at = [&](int32_t index) { return plane.dst + ptrdiff_t{index} * index_bytes; };
     const ScanAxis axis = {plane.src_rows, plane.dst_rows, 0};
@@ -175,7 +177,7 @@ void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
         RowScan scan = whole;
         scan.top_target.move(offset);
         scan.bottom_target.move(offset);
-        add_strip(plane, scan, strip);
+        run_strip(plane, scan, strip, whole_rows);
     });
 }
 

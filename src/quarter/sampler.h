@@ -30,8 +30,16 @@ struct QuarterPlane {
 // Stores every target sample of the plane; zeros when the source is empty.
 void sample_plane(const QuarterPlane& plane);
 
-// Adds the samples of `rows` source rows to the target, from a state between two rows. plane.src is
-// the first of these rows; the state's indices count `index_bytes` from plane.dst.
-void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes);
+// How a band treats target rows of which it has all samples.
+enum class BandRows {
+    kAdd,    // adds them, like all others, to what is there
+    kStore,  // stores them: they need not be cleared
+};
+
+// Takes the samples of `rows` source rows to the target, from a state between two rows. plane.src
+// is the first of these rows; the state's indices count `index_bytes` from plane.dst. Target rows
+// that need samples from outside the band are added to.
+void run_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes,
+              BandRows whole_rows);
 
 }  // namespace ovrin

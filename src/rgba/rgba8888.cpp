@@ -1,6 +1,4 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <string.h>
-
 #include "dispatch/banded_run.h"
 #include "rgba/rgba_band.h"
 
@@ -8,8 +6,17 @@ namespace ovrin {
 
 namespace {
 
+RgbaRows packed_rows(const ovrin_rgba_band& band) {
+    return {band.src_w, band.dst_w, 0};
+}
+
 struct PackedBands : RgbaBands {
-    static void task(void* band) { _resize_rgba8888_tp(band); }
+    static void task(void* band) {
+        auto* record = static_cast<Band*>(band);
+        run_rgba_band(*record, packed_rows(*record), BandRows::kStore);
+    }
+
+    static void clear_shared_row(const Band& band) { clear_open_row(band, packed_rows(band)); }
 
     static void advance(Band& next, Band& previous) {
         ovrin_resize_rgba8888_get_pos(next.src_w, next.src_h, next.dst_w, next.dst_h, &next);
@@ -22,10 +29,6 @@ bool fits_band_record(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h
     return int64_t{src_w} * src_h <= INT32_MAX / kRgbaBytes && int64_t{dst_w} * dst_h <= INT32_MAX;
 }
 
-size_t picture_bytes(int32_t w, int32_t h) {
-    return w < 1 || h < 1 ? 0 : static_cast<size_t>(w) * static_cast<size_t>(h) * kRgbaBytes;
-}
-
 ovrin_rgba_band first_band(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
                            int32_t dst_w, int32_t dst_h) {
     ovrin_rgba_band band = {};
@@ -35,18 +38,17 @@ ovrin_rgba_band first_band(const uint8_t* src, uint32_t* dst, int32_t src_w, int
     band.src_rows = src_h;
     band.dst_w = dst_w;
     band.dst_h = dst_h;
-    band.band_rows = band_height(src_h, dst_h);
     band.src = src;
     band.dst = dst;
     return band;
 }
 
 bool resize_in_bands(const ovrin_rgba_band& first) {
-    const int32_t count = band_count(first.src_h, first.band_rows);
-    if (count < 2) return false;
-    BandedRun<PackedBands> bands(first, count);
+    const BandSplit split = split_into_bands(first.src_h, first.dst_h);
+    // Nothing is sampled from a source without columns.
+    if (split.count < 2 || first.src_w < 1) return false;
+    BandedRun<PackedBands> bands(first, split);
     if (!bands.ready()) return false;
-    memset(first.dst, 0, picture_bytes(first.dst_w, first.dst_h));
     bands.run();
     return true;
 }
@@ -82,7 +84,7 @@ void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w, 
 
 void _resize_rgba8888_tp(void* band) {
     auto* record = static_cast<ovrin_rgba_band*>(band);
-    run_rgba_band(*record, {record->src_w, record->dst_w, 0});
+    run_rgba_band(*record, packed_rows(*record), BandRows::kAdd);
 }
 
 void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,

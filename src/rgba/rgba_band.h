@@ -20,8 +20,11 @@ struct RgbaRows {
 // Moves the record from one band to the next.
 void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, const RgbaRows& rows);
 
-// Adds the band's rows to the destination and reports the band done.
-void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows);
+// Takes the band's rows to the destination and reports the band done.
+void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows, BandRows whole_rows);
+
+// Clears the destination row that is open where the band starts.
+void clear_open_row(const ovrin_rgba_band& band, const RgbaRows& rows);
 
 // What the band driver asks of every format; `advance` is what the two paths do differently.
 struct RgbaBands {

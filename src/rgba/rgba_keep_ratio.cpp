@@ -67,8 +67,18 @@ void clear_canvas(const ovrin_resize_target& target) {
                kRgbaBytes);
 }
 
+RgbaRows canvas_rows(const ovrin_rgba_band& band) {
+    return {band.src_stride, wrapping_add(wrapping_add(band.dst_x, band.dst_w), band.dst_skip),
+            band.dst_x};
+}
+
 struct CanvasBands : RgbaBands {
-    static void task(void* band) { _resize_rgba8888_keep_ratio_tp(band); }
+    static void task(void* band) {
+        auto* record = static_cast<Band*>(band);
+        run_rgba_band(*record, canvas_rows(*record), BandRows::kStore);
+    }
+
+    static void clear_shared_row(const Band& band) { clear_open_row(band, canvas_rows(band)); }
 
     static void advance(Band& next, Band& previous) {
         const int32_t canvas_w = next.dst_x + next.dst_w + next.dst_skip;
@@ -89,7 +99,6 @@ ovrin_rgba_band first_band(const uint8_t* src, const SourceSize& size,
     band.dst_h = target.dst_height;
     band.dst_x = target.dst_x;
     band.dst_skip = target.canvas_width - (target.dst_x + target.dst_width);
-    band.band_rows = band_height(size.height, target.dst_height);
     band.src = src;
     band.dst = first_picture_row(target);
     return band;
@@ -104,20 +113,15 @@ bool fits_band_record(const SourceSize& size, const ovrin_resize_target& target)
 
 bool resize_in_bands(const uint8_t* src, const SourceSize& size,
                      const ovrin_resize_target& target) {
-    const int32_t count = band_count(size.height, band_height(size.height, target.dst_height));
-    if (count < 2 || target.dst_width < 1 || target.dst_height < 1) return false;
+    const BandSplit split = split_into_bands(size.height, target.dst_height);
+    if (split.count < 2 || target.dst_width < 1 || target.dst_height < 1) return false;
     if (!lies_in_canvas(target)) return false;
     if (!fits_band_record(size, target)) return false;
-    BandedRun<CanvasBands> bands(first_band(src, size, target), count);
+    BandedRun<CanvasBands> bands(first_band(src, size, target), split);
     if (!bands.ready()) return false;
     clear_canvas(target);
     bands.run();
     return true;
-}
-
-RgbaRows canvas_rows(const ovrin_rgba_band& band) {
-    return {band.src_stride, wrapping_add(wrapping_add(band.dst_x, band.dst_w), band.dst_skip),
-            band.dst_x};
 }
 
 }  // namespace
@@ -156,7 +160,7 @@ void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t /*src_w*/, int32_t src_h, 
 
 void _resize_rgba8888_keep_ratio_tp(void* band) {
     auto* record = static_cast<ovrin_rgba_band*>(band);
-    run_rgba_band(*record, canvas_rows(*record));
+    run_rgba_band(*record, canvas_rows(*record), BandRows::kAdd);
 }
 
 void ovrin_resize_rgba_keep_ratio_tps(const uint8_t* src, int32_t src_w, int32_t src_h,

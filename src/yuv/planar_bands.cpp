@@ -8,6 +8,21 @@ namespace ovrin {
 
 namespace {
 
+void run_contiguous(void* band, BandRows whole_rows) {
+    auto& record = *static_cast<ovrin_yuv_band*>(band);
+    run_yuv420_band(
+        record, contiguous_source(kPlanarChroma, record.src, record.src_width, record.src_height),
+        contiguous_target(record), record.src_uv_offset, record.uv_rows, whole_rows);
+}
+
+void run_separate(void* band, BandRows whole_rows) {
+    auto& record = *static_cast<ovrin_yuv_band*>(band);
+    run_yuv420_band(record,
+                    three_planes(record.src, record.src_u, record.src_v, record.src_width,
+                                 record.src_height, record.src_row_bytes),
+                    separate_target(record), record.src_uv_offset, record.uv_rows, whole_rows);
+}
+
 using Bands = Yuv420Bands<ovrin_yuv_band, &ovrin_yuv_band::uv_start_row, &ovrin_yuv_band::uv_rows,
                           ovrin_resize_yuv420_get_pos>;
 
@@ -16,7 +31,7 @@ struct ContiguousBands : Bands {
         return first_band<Band>(source, to);
     }
 
-    static void task(void* band) { _resize_yuv420_tp(band); }
+    static void task(void* band) { run_contiguous(band, BandRows::kStore); }
 };
 
 struct ThreePlaneBands : Bands {
@@ -27,7 +42,7 @@ struct ThreePlaneBands : Bands {
         return band;
     }
 
-    static void task(void* band) { _resize_y_u_v_tp(band); }
+    static void task(void* band) { run_separate(band, BandRows::kStore); }
 };
 
 }  // namespace
@@ -54,18 +69,11 @@ void ovrin_resize_yuv420_get_pos(int32_t /*src_width*/, int32_t src_height, int3
 }
 
 void _resize_yuv420_tp(void* band) {
-    auto& record = *static_cast<ovrin_yuv_band*>(band);
-    run_yuv420_band(
-        record, contiguous_source(kPlanarChroma, record.src, record.src_width, record.src_height),
-        contiguous_target(record), record.src_uv_offset, record.uv_rows);
+    run_contiguous(band, BandRows::kAdd);
 }
 
 void _resize_y_u_v_tp(void* band) {
-    auto& record = *static_cast<ovrin_yuv_band*>(band);
-    run_yuv420_band(record,
-                    three_planes(record.src, record.src_u, record.src_v, record.src_width,
-                                 record.src_height, record.src_row_bytes),
-                    separate_target(record), record.src_uv_offset, record.uv_rows);
+    run_separate(band, BandRows::kAdd);
 }
 
 void ovrin_resize_yuv420_tps(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,

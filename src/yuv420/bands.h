@@ -5,7 +5,7 @@
 #include <ovrinresize.h>
 #include <string.h>
 
-#include "quarter/scan.h"
+#include "quarter/sampler.h"
 #include "yuv420/layout.h"
 
 namespace ovrin {
@@ -78,17 +78,17 @@ struct BandWork {
     int32_t chroma_rows;
 };
 
-// Adds the band's samples to its target.
-void add_yuv420_band(const BandWork& work, const BandState& state);
+// Takes the band's samples to its target.
+void sample_yuv420_band(const BandWork& work, const BandState& state, BandRows whole_rows);
 
-// Runs one band and reports it done. Without a target there is nowhere to add to.
+// Runs one band and reports it done. Without a target there is nowhere to go.
 template <class Band>
 void run_yuv420_band(Band& band, const Yuv420Source& source, uint8_t* target, int32_t chroma_offset,
-                     int32_t chroma_rows) {
+                     int32_t chroma_rows, BandRows whole_rows) {
     if (target != nullptr) {
-        add_yuv420_band({source, band.dst_width, band.dst_height, target, band.src_y_offset,
-                         chroma_offset, band.y_rows, chroma_rows},
-                        load_state(band));
+        sample_yuv420_band({source, band.dst_width, band.dst_height, target, band.src_y_offset,
+                            chroma_offset, band.y_rows, chroma_rows},
+                           load_state(band), whole_rows);
     }
     __atomic_store_n(&band.done, 1, __ATOMIC_RELEASE);
 }
@@ -131,6 +131,11 @@ struct Yuv420Bands {
 
     // Chroma bands end on whole destination rows.
     static bool shares_row(const Band& band) { return band.y_top_left != band.y_bottom_left; }
+
+    static void clear_shared_row(const Band& band) {
+        if (band.dst_width < 1) return;
+        memset(separate_target(band) + band.y_bottom_left, 0, static_cast<size_t>(band.dst_width));
+    }
 };
 
 }  // namespace ovrin

@@ -50,7 +50,6 @@ Band first_band(const Yuv420Source& source, const BandDestination& to) {
     band.src_rows = has_rows ? to.target->src_buffer_height : source.height;
     band.dst_width = to.width;
     band.dst_height = to.height;
-    band.band_rows = band_height(source.height, to.height);
     band.src = source.luma;
     band.dst = to.dst;
     return band;
@@ -58,25 +57,23 @@ Band first_band(const Yuv420Source& source, const BandDestination& to) {
 
 // Samples straight into the destination.
 template <class Format>
-bool run_bands_in_place(const typename Format::Band& first, int32_t count,
-                        const Yuv420Layout& picture) {
-    BandedRun<Format> bands(first, count);
+bool run_bands_in_place(const typename Format::Band& first, const BandSplit& split) {
+    BandedRun<Format> bands(first, split);
     if (!bands.ready()) return false;
-    memset(first.dst, 0, static_cast<size_t>(picture.bytes()));
     bands.run();
     return true;
 }
 
 // Samples into a work buffer, then copies.
 template <class Format>
-bool run_bands_by_work_buffer(typename Format::Band first, int32_t count,
+bool run_bands_by_work_buffer(typename Format::Band first, const BandSplit& split,
                               const Yuv420Layout& picture, const BandDestination& to) {
     const WorkBuffer work(grid_of(picture));
     if (work.data() == nullptr) return false;
     first.work = work.data();
-    BandedRun<Format> bands(first, count);
+    BandedRun<Format> bands(first, split);
     if (!bands.ready()) return false;
-    memset(first.work, 0, static_cast<size_t>(grid_of(picture).bytes()));
+    if (first.src_width < 1) memset(work.data(), 0, static_cast<size_t>(grid_of(picture).bytes()));
     bands.run();
     if (to.target != nullptr) {
         place_in_canvas(work.data(), picture, *to.target);
@@ -91,8 +88,10 @@ bool run_bands_by_work_buffer(typename Format::Band first, int32_t count,
 //     static Band first(source, destination)   the first band's record, but for `work`
 template <class Format>
 bool resize_yuv420_in_bands(const Yuv420Source& source, const BandDestination& to) {
-    const int32_t count = band_count(source.height, band_height(source.height, to.height));
-    if (count < 2) return false;
+    const BandSplit split = split_into_bands(source.height, to.height);
+    if (split.count < 2) return false;
+    // Nothing is sampled from a source without columns.
+    if (source.width < 1 && to.target == nullptr) return false;
     const Yuv420Layout picture = {source.chroma, to.width, to.height};
     if (picture.is_empty() && to.target != nullptr) {
         paint_canvas(source.chroma, *to.target);
@@ -101,8 +100,8 @@ bool resize_yuv420_in_bands(const Yuv420Source& source, const BandDestination& t
     if (!fits_band_record(source, picture)) return false;
     const typename Format::Band first = Format::first(source, to);
     return to.target == nullptr && is_own_grid(picture)
-               ? run_bands_in_place<Format>(first, count, picture)
-               : run_bands_by_work_buffer<Format>(first, count, picture, to);
+               ? run_bands_in_place<Format>(first, split)
+               : run_bands_by_work_buffer<Format>(first, split, picture, to);
 }
 
 }  // namespace ovrin

@@ -57,7 +57,7 @@ std::unique_ptr<Run> make_run(int32_t count, Random& random, bool shares_all) {
             band.above = &run->bands[static_cast<size_t>(k - 1)];
             run->bands[static_cast<size_t>(k - 1)].below = &band;
         }
-        run->jobs.push_back({Band::run, &band, &band.done, shares, false, 0});
+        run->jobs.push_back({Band::run, &band, &band.done, shares, false, false, 0});
     }
     return run;
 }
@@ -79,7 +79,6 @@ TEST(BandSchedule, RunsEachBandOnceAndNeverTwoThatShareARow) {
         auto run = make_run(count, random, i % 2 == 0);
         ovrin_threadpool* pool = ovrin_threadpool_init(4);
         run_bands(pool, run->jobs.data(), count);
-        ovrin_threadpool_free(pool, 1);
         expect_each_ran_once(*run, count);
     }
 }
@@ -91,7 +90,6 @@ TEST(BandSchedule, CallerRunsEverythingWhenNoWorkerDoes) {
         for (int32_t k = 0; k < count; ++k) run->bands[static_cast<size_t>(k)].delay = 0;
         ovrin_threadpool* pool = ovrin_threadpool_init(0);
         run_bands(pool, run->jobs.data(), count);
-        ovrin_threadpool_free(pool, 1);
         expect_each_ran_once(*run, count);
     }
 }
@@ -109,7 +107,6 @@ TEST(BandSchedule, SkipsALastBandWithNothingLeft) {
     run->jobs[2].skip = true;
     ovrin_threadpool* pool = ovrin_threadpool_init(2);
     run_bands(pool, run->jobs.data(), 3);
-    ovrin_threadpool_free(pool, 1);
     EXPECT_EQ(run->bands[1].runs, 1);
     EXPECT_EQ(run->bands[2].runs, 0);
 }
