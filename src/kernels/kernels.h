@@ -136,11 +136,17 @@ constexpr double kSmallWeights = 1.9;
 // result.
 using LanczosRowKernel = void(const LanczosRow& row);
 
+// dst[i] = src[i * step], for i in [0, count) and a step of 0 or more. `next` is the row that will
+// be asked for next. Reads nothing behind the last of these words.
+using CopyEvery = void(uint32_t* dst, const uint32_t* src, int32_t step, int32_t count,
+                       const uint32_t* next);
+
 struct Kernels {
     PlanQuarters* plan_quarters;
     const BilinearBlend* bilinear_blend;  // these two for samples of 1, 2 and 4 bytes
     const BilinearEdges* bilinear_edges;
     LanczosRowKernel* lanczos_row;
+    CopyEvery* copy_every;
 };
 
 // The plain C++ kernels, which define what every other set must compute.

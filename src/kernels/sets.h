@@ -20,4 +20,8 @@ LanczosRowKernel lanczos_row_scalar;
 LanczosRowKernel lanczos_row_avx2;
 LanczosRowKernel lanczos_row_neon;
 
+CopyEvery copy_every_scalar;
+CopyEvery copy_every_avx512;
+CopyEvery copy_every_neon;
+
 }  // namespace ovrin

@@ -12,6 +12,9 @@ namespace {
 
 constexpr int32_t kStripColumns = 1024;
 
+// Above this, single precision no longer holds every whole number.
+constexpr int64_t kExact = int64_t{1} << 24;
+
 // Where one axis is sampled. Positions pass through single precision, which rounds those above
 // 2^24; they never decrease.
 struct NearestAxis {
@@ -39,7 +42,48 @@ struct NearestAxis {
         while (count < dst_size && holds(at(count))) ++count;
         return count;
     }
+
+    // The first `count` samples lie exactly a step apart.
+    bool is_even(int32_t count) const {
+        return count < 2 || at(0) + (count - 1) * int64_t{step} <= kExact;
+    }
 };
+
+struct NearestPicture {
+    const uint32_t* src;
+    ptrdiff_t src_pitch;  // in pixels, like the other lengths
+    uint32_t* dst;
+    ptrdiff_t dst_pitch;
+    int32_t width;  // of the samples that are kept
+    int32_t height;
+    NearestAxis columns;
+    NearestAxis rows;
+
+    const uint32_t* row(int32_t j) const { return src + src_pitch * rows.at(j); }
+};
+
+void copy_even(const NearestPicture& p) {
+    const auto copy = kernels().copy_every;
+    const ptrdiff_t first = p.columns.at(0);
+    for (int32_t j = 0; j < p.height; ++j) {
+        const uint32_t* next = p.row(j + 1 < p.height ? j + 1 : j);
+        copy(p.dst + p.dst_pitch * j, p.row(j) + first, p.columns.step, p.width, next + first);
+    }
+}
+
+// Positions that single precision has rounded, in strips.
+void copy_rounded(const NearestPicture& p) {
+    int32_t taps[kStripColumns];
+    for (int32_t x = 0; x < p.width; x += kStripColumns) {
+        const int32_t count = p.width - x < kStripColumns ? p.width - x : kStripColumns;
+        for (int32_t i = 0; i < count; ++i) taps[i] = static_cast<int32_t>(p.columns.at(x + i));
+        for (int32_t j = 0; j < p.height; ++j) {
+            const uint32_t* row = p.row(j);
+            uint32_t* dst = p.dst + p.dst_pitch * j + x;
+            for (int32_t i = 0; i < count; ++i) dst[i] = row[taps[i]];
+        }
+    }
+}
 
 }  // namespace
 
@@ -53,17 +97,12 @@ void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst, int32_t s
     if (src_w < 1 || src_h < 1 || dst_w < 1 || dst_h < 1) return;
     const NearestAxis columns(src_w, dst_w);
     const NearestAxis rows(src_h, dst_h);
-    const int32_t width = columns.kept(dst_w);
-    const int32_t height = rows.kept(dst_h);
-    const auto copy = kernels().bilinear_edges[2].copy;
-    int32_t taps[kStripColumns];
-    for (int32_t x = 0; x < width; x += kStripColumns) {
-        const int32_t count = width - x < kStripColumns ? width - x : kStripColumns;
-        for (int32_t i = 0; i < count; ++i) taps[i] = static_cast<int32_t>(columns.at(x + i));
-        for (int32_t j = 0; j < height; ++j) {
-            copy(reinterpret_cast<uint8_t*>(dst + ptrdiff_t{j} * dst_w + x),
-                 reinterpret_cast<const uint8_t*>(src + ptrdiff_t{src_w} * rows.at(j)), taps,
-                 count);
-        }
+    const NearestPicture picture = {
+        src, src_w, dst, dst_w, columns.kept(dst_w), rows.kept(dst_h), columns, rows,
+    };
+    if (columns.is_even(picture.width)) {
+        copy_even(picture);
+    } else {
+        copy_rounded(picture);
     }
 }
