@@ -1,0 +1,55 @@
+// SPDX-License-Identifier: Apache-2.0
+// What native methods demand of their arguments. The first demand that is not met throws
+// IllegalArgumentException; the others then pass unlooked at, and ok() says not to go on.
+#pragma once
+
+#include <jni.h>
+#include <stdint.h>
+
+#include "extents.h"
+
+namespace ovrin_jni {
+
+// A rectangle of a canvas.
+struct Placement {
+    Size canvas;
+    Size picture;
+    int32_t x;
+    int32_t y;
+};
+
+class Checks {
+public:
+    explicit Checks(JNIEnv* env) : env_(env) {}
+
+    bool ok() const { return ok_; }
+
+    void side(const char* name, int32_t value) { number(name, value, 1, kLargestSide); }
+    void size(const char* name, Size size);
+    void number(const char* name, int32_t value, int32_t least, int32_t most);
+    // The picture lies inside the canvas.
+    void placement(const Placement& placement);
+
+    // The address of a direct buffer that holds at least `bytes` bytes, and starts at a multiple of
+    // `alignment`; null when it is not one. Destinations come last: they must not be read-only, nor
+    // share a byte with the sources.
+    const uint8_t* source(jobject buffer, const char* name, int64_t bytes, int alignment = 1);
+    uint8_t* destination(jobject buffer, int64_t bytes, int alignment = 1);
+
+private:
+    struct Range {
+        uintptr_t begin;
+        uintptr_t end;
+    };
+
+    uint8_t* address(jobject buffer, const char* name, int64_t bytes, int alignment);
+    bool is_read_only(jobject buffer);
+    void fail(const char* format, ...) __attribute__((format(printf, 2, 3)));
+
+    JNIEnv* env_;
+    bool ok_ = true;
+    Range sources_[3] = {};
+    int source_count_ = 0;
+};
+
+}  // namespace ovrin_jni
