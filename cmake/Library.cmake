@@ -8,6 +8,7 @@ add_library(ovrinresize_objects OBJECT
   src/bilinear/rows.cpp
   src/bilinear/single.cpp
   src/bilinear/threaded.cpp
+  src/canvas/margin.cpp
   src/dispatch/band_schedule.cpp
   src/dispatch/helping_run.cpp
   src/dispatch/sleep.cpp

@@ -2,6 +2,7 @@
 // RGBA8888 into a canvas.
 #include <string.h>
 
+#include "canvas/margin.h"
 #include "dispatch/banded_run.h"
 #include "rgba/rgba_band.h"
 
@@ -60,11 +61,32 @@ bool lies_in_canvas(const ovrin_resize_target& target) {
     return first >= 0 && last_row + target.dst_width <= width * target.canvas_height;
 }
 
+// No row of the picture runs on into the next one of the canvas.
+bool is_inside_canvas(const ovrin_resize_target& target) {
+    return target.dst_x >= 0 && target.dst_y >= 0 && target.dst_width > 0 &&
+           target.dst_height > 0 &&
+           int64_t{target.dst_x} + target.dst_width <= target.canvas_width &&
+           int64_t{target.dst_y} + target.dst_height <= target.canvas_height;
+}
+
 void clear_canvas(const ovrin_resize_target& target) {
     if (target.canvas_width < 1 || target.canvas_height < 1) return;
     memset(target.dst, 0,
            static_cast<size_t>(target.canvas_width) * static_cast<size_t>(target.canvas_height) *
                kRgbaBytes);
+}
+
+// For a picture that stores every pixel of its own.
+void clear_around_picture(const ovrin_resize_target& target) {
+    if (!is_inside_canvas(target)) {
+        clear_canvas(target);
+        return;
+    }
+    fill_margin(static_cast<uint8_t*>(target.dst), ptrdiff_t{target.canvas_width} * kRgbaBytes,
+                target.canvas_height,
+                {ptrdiff_t{target.dst_x} * kRgbaBytes, target.dst_y,
+                 ptrdiff_t{target.dst_width} * kRgbaBytes, target.dst_height},
+                0);
 }
 
 RgbaRows canvas_rows(const ovrin_rgba_band& band) {
@@ -119,7 +141,11 @@ bool resize_in_bands(const uint8_t* src, const SourceSize& size,
     if (!fits_band_record(size, target)) return false;
     BandedRun<CanvasBands> bands(first_band(src, size, target), split);
     if (!bands.ready()) return false;
-    clear_canvas(target);
+    if (size.width < 1) {
+        clear_canvas(target);
+    } else {
+        clear_around_picture(target);
+    }
     bands.run();
     return true;
 }
@@ -134,8 +160,11 @@ void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t 
                                      ovrin_resize_target* target) {
     if (is_rejected(*target)) return;
     const SourceSize size = clip_to_canvas(*target, src_w, src_h);
-    clear_canvas(*target);
-    if (!lies_in_canvas(*target)) return;
+    if (!lies_in_canvas(*target)) {
+        clear_canvas(*target);
+        return;
+    }
+    clear_around_picture(*target);
     sample_plane({
         src,
         ptrdiff_t{target->src_stride} * kRgbaBytes,

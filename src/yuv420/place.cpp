@@ -3,6 +3,8 @@
 
 #include <string.h>
 
+#include "canvas/margin.h"
+
 namespace ovrin {
 
 namespace {
@@ -84,6 +86,19 @@ Yuv420Destination picture_in_canvas(ChromaLayout chroma, const ovrin_resize_targ
                                       ptrdiff_t{target.dst_x / 2} * chroma.sample_bytes;
     for (int32_t plane = 0; plane < chroma.planes; ++plane) to.chroma[plane] += chroma_position;
     return to;
+}
+
+void paint_around(const Yuv420Layout& picture, const ovrin_resize_target& target) {
+    const Yuv420Layout canvas = canvas_of(picture.chroma, target);
+    auto* dst = static_cast<uint8_t*>(target.dst);
+    fill_margin(dst, canvas.width, canvas.height,
+                {target.dst_x, target.dst_y, picture.width, picture.height}, kBlackLuma);
+    const PlaneArea chroma = {ptrdiff_t{target.dst_x / 2} * picture.chroma.sample_bytes,
+                              target.dst_y / 2, picture.chroma_row(), picture.chroma_rows()};
+    for (int32_t plane = 0; plane < picture.chroma.planes; ++plane) {
+        fill_margin(dst + canvas.chroma_offset(plane), canvas.chroma_row(), canvas.chroma_rows(),
+                    chroma, kBlackChroma);
+    }
 }
 
 void place_in_canvas(const uint8_t* grid_base, const Yuv420Layout& picture,

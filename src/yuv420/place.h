@@ -22,6 +22,9 @@ bool fits_canvas(const Yuv420Layout& picture, const ovrin_resize_target& target)
 // Where the samples of such a picture go.
 Yuv420Destination picture_in_canvas(ChromaLayout chroma, const ovrin_resize_target& target);
 
+// Paints what such a picture leaves free of the canvas black.
+void paint_around(const Yuv420Layout& picture, const ovrin_resize_target& target);
+
 // Paints the canvas black.
 void paint_canvas(ChromaLayout chroma, const ovrin_resize_target& target);
 

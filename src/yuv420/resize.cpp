@@ -44,7 +44,7 @@ void resize_yuv420_into_canvas(const Yuv420Source& source, const ovrin_resize_ta
     const WorkBuffer work(grid);
     if (work.data() == nullptr) return;
     if (fits_canvas(picture, target)) {
-        paint_canvas(source.chroma, target);
+        paint_around(picture, target);
         sample_into(source, picture, picture_in_canvas(source.chroma, target));
         return;
     }
