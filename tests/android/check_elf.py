@@ -2,8 +2,8 @@
 # SPDX-License-Identifier: Apache-2.0
 """check_elf.py LIBRARY IMPORTS DECLARED: what Android's loader and packaging ask of a library.
 
-IMPORTS lists the names that may be imported, DECLARED those that must be exported. Says for each rule
-whether it holds; ends with 1 if one does not."""
+IMPORTS lists the names that may be imported, DECLARED those that must be exported. Says for each
+rule whether it holds; ends with 1 if one does not."""
 import os
 import re
 import sys
@@ -49,7 +49,7 @@ class Library:
         return [t.entry.d_val for t in self.tags if t.entry.d_tag == tag]
 
     def has_number(self, numbers):
-        """Whether a dynamic tag has one of these numbers; elftools turns those it knows to names."""
+        """Whether a dynamic tag has one of these numbers; elftools names those that it knows."""
         names = {36: "DT_RELR", 0x6FFFE000: "DT_ANDROID_RELR", 0x6000000F: "DT_ANDROID_REL",
                  0x60000011: "DT_ANDROID_RELA"}
         wanted = list(numbers) + [names[number] for number in numbers]
@@ -152,9 +152,6 @@ def rule_relocations(lib, _):
 def rule_binding(lib, _):
     if not lib.flag("DT_FLAGS", DF_BIND_NOW):
         yield "not bound when it is loaded"
-    for tag in ("DT_INIT", "DT_INIT_ARRAY", "DT_FINI", "DT_FINI_ARRAY"):
-        if lib.values(tag):
-            yield f"runs code when it is loaded or unloaded: {tag}"
 
 
 def rule_load_alignment(lib, _):
@@ -169,8 +166,8 @@ def rule_load_alignment(lib, _):
 
 
 def rule_relro(lib, _):
-    """RELRO becomes read-only in whole pages, whatever their size: writable data that share one would
-    be lost, and pages that nothing reserved make the loader give up.
+    """RELRO becomes read-only in whole pages, whatever their size: writable data that share one
+    would be lost, and pages that nothing reserved make the loader give up.
 
     Between two segments RELRO may go on: that is reserved and empty."""
     relros = lib.of_type("PT_GNU_RELRO")
@@ -216,7 +213,8 @@ def rule_exports(lib, lists):
 
 RULES = [rule_platform, rule_file_name, rule_soname, rule_needed, rule_text_relocations,
          rule_section_headers, rule_rights, rule_hash_tables, rule_versions, rule_thread_local,
-         rule_relocations, rule_binding, rule_load_alignment, rule_relro, rule_imports, rule_exports]
+         rule_relocations, rule_binding, rule_load_alignment, rule_relro, rule_imports,
+         rule_exports]
 
 
 def read_lists(imports, declared):

@@ -136,6 +136,7 @@ def twins_of(linker, library, directory):
     def script(name, edit):
         return edited_map(linker.build, directory, name, edit)
 
+    numbered = replaced(f"-soname,{SONAME}", f"-soname,{SONAME}.1")
     small_pages = replaced("page-size=16384", "page-size=4096")
     short_relro = replaced(",-z,common-page-size=16384", "")
     one_hidden = script("hidden", lambda text: re.sub(r" *ov_sleep;\n", "", text))
@@ -145,10 +146,8 @@ def twins_of(linker, library, directory):
         ("short-relro", SONAME, link(short_relro), {"relro"}),
         ("long-relro", SONAME, patch(lengthen_relro), {"relro"}),
         ("no-relro", SONAME, link(replaced("-z,relro", "-z,norelro")), {"relro"}),
-        ("versioned-soname", SONAME, link(replaced(f"-soname,{SONAME}", f"-soname,{SONAME}.1")),
-         {"soname"}),
-        ("versioned-name", SONAME + ".1", link(replaced(f"-soname,{SONAME}", f"-soname,{SONAME}.1")),
-         {"file_name"}),
+        ("versioned-soname", SONAME, link(numbered), {"soname"}),
+        ("versioned-name", SONAME + ".1", link(numbered), {"file_name"}),
         ("needs-another", SONAME, patch(renames(b"libm.so", b"libz.so")), {"needed"}),
         ("text-relocations", SONAME, patch(have_text_relocations), {"text_relocations"}),
         ("stripped-sections", SONAME, patch(strip_sections), {"section_headers"}),

@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# library.sh DIRECTORY: configures and builds the android-arm64 preset with the stand-in for the NDK,
-# and checks what the preset said. The library is DIRECTORY/lib/libovrinresize.so.
+# library.sh DIRECTORY: configures and builds the android-arm64 preset with the stand-in for the
+# NDK, and checks what the preset said. The library is DIRECTORY/lib/libovrinresize.so.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 directory=$(realpath -m "$1")

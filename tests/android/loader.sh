@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# loader.sh PROGRAM: builds the loader with the golden cases, as a program for Linux that needs no other
-# file. shims.cpp comes first; it says why.
+# loader.sh PROGRAM: builds the loader with the golden cases, as a program for Linux that needs no
+# other file. shims.cpp comes first; it says why.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 tests=$here/..

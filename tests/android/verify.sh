@@ -1,8 +1,8 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# verify.sh DIRECTORY: all that can be said about the library for Android without Android. Links it as
-# the NDK would, holds the file against what Android's loader and packaging ask for, and runs that very
-# file on emulated processors, with pages of either size. See docs/android.md.
+# verify.sh DIRECTORY: all that can be said about the library for Android without Android. Links
+# it as the NDK would, holds the file against what Android's loader and packaging ask for, and
+# runs that very file on emulated processors, with pages of either size. See docs/android.md.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 source_dir=$here/../..
@@ -21,8 +21,8 @@ fail() {
     exit 1
 }
 
-# emulated PROCESSOR PAGE_SIZE LIBRARY [GOLDEN_FILE]: runs the golden cases on it. The loader's status
-# says how it went.
+# emulated PROCESSOR PAGE_SIZE LIBRARY [GOLDEN_FILE]: runs the golden cases on it. The loader's
+# status says how it went.
 emulated() {
     qemu-aarch64 -cpu "$1" -p "$2" "$directory/android_loader" "$3" "${4:-$golden_file}"
 }
@@ -54,8 +54,8 @@ bash "$here/loader.sh" "$directory/android_loader"
 same=0 different=1 refused=3
 ends_with $same cortex-a53 4096 "$library"
 ends_with $same max 16384 "$library"
-# The loader refuses what must be refused, and that for its alignment: with small pages it is a library
-# like any other.
+# The loader refuses what must be refused, and that for its alignment: with small pages it is a
+# library like any other.
 ends_with $same cortex-a53 4096 "$small_pages"
 ends_with $refused max 16384 "$small_pages"
 ends_with $refused cortex-a53 4096 "$directory/twins/long-relro/libovrinresize.so"

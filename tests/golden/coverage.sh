@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# coverage.sh GOLDEN_FILE HEADER: cases exist for every function that touches pixels, for those only,
-# and no two of them have the same name.
+# coverage.sh GOLDEN_FILE HEADER: cases exist for every function that touches pixels, for those
+# only, and no two of them have the same name.
 set -euo pipefail
 here=$(dirname "${BASH_SOURCE[0]}")
 file=$1

@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# boot.sh DIRECTORY: boots a kernel with 16 KB pages on an emulated machine and runs there what verify.sh
-# has left in DIRECTORY: the library for Android, in its loader, and its twin with 4 KB alignment.
+# boot.sh DIRECTORY: boots a kernel with 16 KB pages on an emulated machine and runs there what
+# verify.sh has left in DIRECTORY: the library for Android, in its loader, and its twin with 4 KB
+# alignment.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 directory=$(realpath -m "$1")

@@ -1,8 +1,9 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# kernel.sh DIRECTORY: makes DIRECTORY/vmlinuz, Debian's newest kernel for arm64 with 16 KB pages, unless
-# it is there. The package comes from wherever this machine gets its packages, but the machine's own
-# lists of packages stay as they are: these ones, for arm64, lie in DIRECTORY. It has some 90 MB.
+# kernel.sh DIRECTORY: makes DIRECTORY/vmlinuz, Debian's newest kernel for arm64 with 16 KB pages,
+# unless it is there. The package comes from wherever this machine gets its packages, but the
+# machine's own lists of packages stay as they are: these ones, for arm64, lie in DIRECTORY. It
+# has some 90 MB.
 set -euo pipefail
 directory=$(realpath -m "$1")
 [[ ! -s $directory/vmlinuz ]] || exit 0
@@ -19,7 +20,8 @@ END
 export APT_CONFIG=$directory/apt.conf
 cd "$directory"
 apt-get update
-package=$(apt-cache pkgnames linux-image-6 | grep -E -- '-arm64-16k-unsigned$' | sort -V | tail -n 1)
+package=$(apt-cache pkgnames linux-image-6 | grep -E -- '-arm64-16k-unsigned$' | sort -V |
+    tail -n 1)
 if [[ ! $package ]]; then
     echo "the package sources of this machine have no kernel for arm64 with 16 KB pages"
     exit 1
