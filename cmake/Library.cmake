@@ -1,6 +1,11 @@
 # SPDX-License-Identifier: Apache-2.0
 # The library itself: the objects, which white-box tests link too, and the shared object.
-find_package(Threads REQUIRED)
+if(ANDROID)
+  set(OVRINRESIZE_THREADS "") # a part of Android's libc
+else()
+  find_package(Threads REQUIRED)
+  set(OVRINRESIZE_THREADS Threads::Threads)
+endif()
 
 add_library(ovrinresize_objects OBJECT
   src/bilinear/plan.cpp
@@ -64,7 +69,7 @@ target_include_directories(ovrinresize_objects
 # No C++ run-time library: no exceptions, no RTTI, no guarded statics.
 target_compile_options(ovrinresize_objects PRIVATE
   -fno-exceptions -fno-rtti -fno-threadsafe-statics)
-target_link_libraries(ovrinresize_objects PRIVATE ovrinresize_warnings Threads::Threads)
+target_link_libraries(ovrinresize_objects PRIVATE ovrinresize_warnings ${OVRINRESIZE_THREADS})
 
 # The version script lists the functions that the public header declares, and nothing else.
 set(OVRINRESIZE_HEADER ${PROJECT_SOURCE_DIR}/include/ovrinresize.h)
@@ -75,16 +80,26 @@ foreach(declaration IN LISTS declarations)
   string(REGEX MATCH "([A-Za-z_0-9]+)\\(" ignored "${declaration}")
   string(APPEND OVRINRESIZE_EXPORTS "        ${CMAKE_MATCH_1};\n")
 endforeach()
+# Android's loader knows symbol versions only from API 23 on, and installs no file whose name does not
+# end in .so: there, neither the functions nor the file have a version.
+if(ANDROID)
+  set(OVRINRESIZE_VERSION_NODE "")
+else()
+  set(OVRINRESIZE_VERSION_NODE "OVRINRESIZE_${PROJECT_VERSION_MAJOR} ")
+endif()
 configure_file(cmake/exports.map.in ${PROJECT_BINARY_DIR}/exports.map @ONLY)
 
 add_library(ovrinresize SHARED $<TARGET_OBJECTS:ovrinresize_objects>)
 add_library(ovrinresize::ovrinresize ALIAS ovrinresize)
 set_target_properties(ovrinresize PROPERTIES
   LINKER_LANGUAGE CXX
-  VERSION ${PROJECT_VERSION}
-  SOVERSION ${PROJECT_VERSION_MAJOR}
   LINK_DEPENDS ${PROJECT_BINARY_DIR}/exports.map
   LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR})
+if(NOT ANDROID)
+  set_target_properties(ovrinresize PROPERTIES
+    VERSION ${PROJECT_VERSION}
+    SOVERSION ${PROJECT_VERSION_MAJOR})
+endif()
 target_include_directories(ovrinresize INTERFACE
   $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>
   $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
@@ -96,7 +111,11 @@ target_link_options(ovrinresize PRIVATE
   -Wl,--version-script=${PROJECT_BINARY_DIR}/exports.map
   -Wl,-z,relro,-z,now,-z,noexecstack
   -Wl,-z,max-page-size=16384,-z,common-page-size=16384)
+if(ANDROID)
+  # The older of the two hash tables is the only one that API 21 and 22 understand.
+  target_link_options(ovrinresize PRIVATE -Wl,--hash-style=both)
+endif()
 if(NOT CMAKE_CXX_FLAGS MATCHES "-fsanitize")
   target_link_options(ovrinresize PRIVATE -Wl,--no-undefined)
 endif()
-target_link_libraries(ovrinresize PRIVATE Threads::Threads m)
+target_link_libraries(ovrinresize PRIVATE ${OVRINRESIZE_THREADS} m)
