@@ -105,6 +105,11 @@ def relocate_thread_local(lib):
     lib.put(lib.first_relocation() + 8, 1030, 4)  # TPREL64
 
 
+def shorten_relro(lib):
+    memsz = lib.segment("PT_GNU_RELRO") + P_MEMSZ
+    lib.put(memsz, int.from_bytes(lib.data[memsz:memsz + 8], "little") - 16, 8)
+
+
 def lengthen_relro(lib):
     lib.put(lib.segment("PT_GNU_RELRO") + P_MEMSZ, 0x100000, 8)
 
@@ -138,12 +143,11 @@ def twins_of(linker, library, directory):
 
     numbered = replaced(f"-soname,{SONAME}", f"-soname,{SONAME}.1")
     small_pages = replaced("page-size=16384", "page-size=4096")
-    short_relro = replaced(",-z,common-page-size=16384", "")
     one_hidden = script("hidden", lambda text: re.sub(r" *ov_sleep;\n", "", text))
     node = script("node", lambda text: "OVRIN_1 " + text)
     return [
-        ("small-pages", SONAME, link(small_pages), {"load_alignment", "relro"}),
-        ("short-relro", SONAME, link(short_relro), {"relro"}),
+        ("small-pages", SONAME, link(small_pages), {"load_alignment"}),
+        ("short-relro", SONAME, patch(shorten_relro), {"relro"}),
         ("long-relro", SONAME, patch(lengthen_relro), {"relro"}),
         ("no-relro", SONAME, link(replaced("-z,relro", "-z,norelro")), {"relro"}),
         ("versioned-soname", SONAME, link(numbered), {"soname"}),
@@ -178,6 +182,8 @@ def main():
         os.makedirs(os.path.dirname(path), exist_ok=True)
         make(path)
         broken = set(check_elf.complaints(path, lists))
+        if name == "small-pages":
+            broken.discard("relro")  # one time in four it ends at 16 KB by chance
         verdict = "refused" if broken == expected else "FAILED "
         print(f"{verdict} {name}: breaks {sorted(broken)}, should break {sorted(expected)}")
         failures += broken != expected
