@@ -106,17 +106,29 @@ struct BilinearEdges {
     void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
 };
 
-// One row of a seven-tap filter over interleaved components, or part of it.
+// Neighbouring columns of a picture that a seven-tap filter makes out of interleaved components,
+// and what vector kernels keep of them from row to row.
+constexpr int32_t kLanczosColumns = 256;
+struct LanczosStrip {
+    int32_t src_components;
+    int32_t dst_components;
+    int32_t count;
+    const double* column_weights;    // per column: seven
+    int32_t index[kLanczosColumns];  // per column: the first of its seven taps in a source row
+    // Set up by prepare.
+    bool has_small_weights;  // see kSmallWeights
+    double largest_weights;  // of any column, the sum of its absolute weights
+    int32_t held_rows[7];    // the source row in each of the following; negative: none
+    alignas(64) float sums[7][kLanczosColumns * 4];
+    alignas(64) float weights[kLanczosColumns][8];  // with a zero behind the seven
+};
+
+// One destination row of a strip.
 struct LanczosRow {
     uint8_t* dst;
     const uint8_t* taps[7];  // source rows; pixel 0 of each lies three left of column 0
-    int32_t src_components;
-    int32_t dst_components;
-    const int32_t* index;          // per pixel: the first of its seven taps in a row
-    const double* column_weights;  // per pixel: seven
-    const double* row_weights;     // seven
-    int32_t count;
-    bool has_small_weights;  // see kSmallWeights
+    int32_t source_rows[7];  // their numbers, not negative: where they are equal, so are the rows
+    const double* row_weights;  // seven
 };
 
 // Weights of which no seven add up to more than this in absolute value leave room for shortcuts
@@ -124,22 +136,25 @@ struct LanczosRow {
 // caller.
 constexpr double kSmallWeights = 1.9;
 
-// For pixel x in [0, count), component k in [0, dst_components), with v the row weights and h the
-// pixel's column weights:
+// prepare is called once for a strip whose first five fields are set. Then row computes, for column
+// x in [0, count), component k in [0, dst_components), with v the row weights and h the column's:
 //
 //   acc = 0; for r in [0, 7), for i in [0, 7), in this order:
 //       acc = fma(v[r] * h[i], taps[r][index[x] * src_components + i * dst_components + k], acc)
 //   dst = acc + 0.5, truncated, clamped to 0 ... 255
 //
 // in double precision, each operation rounded once: the order and the fusing are part of the
-// result.
-using LanczosRowKernel = void(const LanczosRow& row);
+// result. Of the source rows only bytes from the first to the last of those named are read.
+struct LanczosKernels {
+    void (*prepare)(LanczosStrip& strip);
+    void (*row)(LanczosStrip& strip, const LanczosRow& row);
+};
 
 struct Kernels {
     BeginQuarterPlan* begin_quarter_plan;
     const BilinearBlend* bilinear_blend;  // these two for samples of 1, 2 and 4 bytes
     const BilinearEdges* bilinear_edges;
-    LanczosRowKernel* lanczos_row;
+    const LanczosKernels* lanczos;
 };
 
 // The plain C++ kernels, which define what every other set must compute.

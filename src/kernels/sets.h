@@ -16,8 +16,9 @@ extern const BilinearBlend bilinear_blend_avx2[3];
 extern const BilinearBlend bilinear_blend_neon[3];
 extern const BilinearEdges bilinear_edges_scalar[3];
 
-LanczosRowKernel lanczos_row_scalar;
-LanczosRowKernel lanczos_row_avx2;
-LanczosRowKernel lanczos_row_neon;
+extern const LanczosKernels lanczos_scalar;
+extern const LanczosKernels lanczos_avx2;
+extern const LanczosKernels lanczos_avx512;
+extern const LanczosKernels lanczos_neon;
 
 }  // namespace ovrin

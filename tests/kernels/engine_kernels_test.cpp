@@ -75,7 +75,7 @@ Bytes checkerboard(int32_t w, int32_t h) {
 
 TEST_F(EngineKernels, TheSetsHaveKernelsOfTheirOwn) {
     for (const NamedKernels& set : vector_sets_) {
-        EXPECT_NE(set.kernels->lanczos_row, scalar_kernels.lanczos_row) << set.name;
+        EXPECT_NE(set.kernels->lanczos->row, scalar_kernels.lanczos->row) << set.name;
         for (int i = 0; i < 3; ++i) {
             EXPECT_NE(set.kernels->bilinear_blend[i].both, scalar_kernels.bilinear_blend[i].both)
                 << set.name;
