@@ -10,11 +10,17 @@ namespace ovrin {
 
 namespace {
 
-constexpr int32_t kStepLanes = 4;  // lanes whose bytes fill a vector
-constexpr int32_t kStepBytes = kStepLanes * kLaneBytes;
+constexpr int32_t kStepLanes = 4;
+constexpr int32_t kStepSums = kStepLanes * kLaneBytes;
+constexpr int32_t kStepBytes = 16;  // of a finished row
 
-// Left and right samples of a lane, blended: four sums with 12 fractional bits.
-uint32x4_t blend_right(const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
+template <int N>
+void prepare(BilinearColumns& columns) {
+    prepare_lanes<N, 1, kStepLanes>(columns, 16);
+}
+
+// Left and right samples of a lane, blended.
+uint32x4_t blend_lane(const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
     const uint8x16_t window = vld1q_u8(row + columns.lane_base[lane]);
     const uint8x16_t shuffle = vld1q_u8(columns.lane_shuffle[lane]);
     // Lookups outside the table give 0: the high bytes of the 16-bit samples.
@@ -25,52 +31,52 @@ uint32x4_t blend_right(const uint8_t* row, const BilinearColumns& columns, int32
     return vreinterpretq_u32_s32(vpaddq_s32(low, high));
 }
 
-// Four target bytes as 32-bit numbers, in their top bytes.
-uint32x4_t blend(const uint8_t* top, const uint8_t* bottom, uint32_t wy,
-                 const BilinearColumns& columns, int32_t lane) {
-    const uint32x4_t upper = vmulq_n_u32(blend_right(top, columns, lane), 4096 - wy);
-    return vmlaq_n_u32(upper, blend_right(bottom, columns, lane), wy);
+template <int N>
+void across(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns) {
+    if (columns.window_bytes == 0) return bilinear_blend_scalar[N >> 1].across(sums, row, columns);
+    const int32_t count = whole_steps(columns.count * N, kStepSums);
+    for (int32_t i = 0; i < count; i += kStepSums) {
+        for (int32_t k = 0; k < kStepLanes; ++k) {
+            vst1q_u32(sums.values + i + k * kLaneBytes,
+                      blend_lane(row, columns, i / kLaneBytes + k));
+        }
+    }
 }
 
-// 16 target bytes.
-uint8x16_t blend_step(const uint8_t* top, const uint8_t* bottom, uint32_t wy,
-                      const BilinearColumns& columns, int32_t lane) {
+// Four target bytes, the top ones of 32-bit numbers. upper * (4096 - wy) + lower * wy with one
+// multiplication.
+uint32x4_t blend_four(const uint32_t* upper, const uint32_t* lower, uint32_t wy) {
+    const uint32x4_t from = vld1q_u32(upper);
+    return vmlaq_n_u32(vshlq_n_u32(from, 12), vsubq_u32(vld1q_u32(lower), from), wy);
+}
+
+uint8x16_t blend_bytes(const uint32_t* upper, const uint32_t* lower, uint32_t wy) {
     const auto four = [&](int32_t i) {
-        return vreinterpretq_u16_u32(blend(top, bottom, wy, columns, lane + i));
+        return vreinterpretq_u16_u32(blend_four(upper + i, lower + i, wy));
     };
     // The odd 16-bit halves hold the top bytes; of those, the odd bytes are the results.
-    const uint16x8_t low = vuzp2q_u16(four(0), four(1));
-    const uint16x8_t high = vuzp2q_u16(four(2), four(3));
+    const uint16x8_t low = vuzp2q_u16(four(0), four(4));
+    const uint16x8_t high = vuzp2q_u16(four(8), four(12));
     return vuzp2q_u8(vreinterpretq_u8_u16(low), vreinterpretq_u8_u16(high));
 }
 
-template <int N>
-void prepare(BilinearColumns& columns) {
-    prepare_lanes<N>(columns, kStepLanes);
-}
-
-template <int N>
-void both(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
-          const BilinearColumns& columns) {
-    if (columns.lanes == 0)
-        return bilinear_blend_scalar[N >> 1].both(dst, top, bottom, wy, columns);
+void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
+          int32_t bytes) {
     const uint32_t weight = static_cast<uint32_t>(wy);
-    const int32_t bytes = columns.count * N;
-    int32_t lane = 0;
-    for (int32_t done = kStepBytes; done <= bytes; done += kStepBytes, lane += kStepLanes) {
-        vst1q_u8(dst, blend_step(top, bottom, weight, columns, lane));
-        dst += kStepBytes;
+    int32_t i = 0;
+    for (; i + kStepBytes <= bytes; i += kStepBytes) {
+        vst1q_u8(dst + i, blend_bytes(upper.values + i, lower.values + i, weight));
     }
-    if (bytes % kStepBytes != 0) {
+    if (i < bytes) {
         uint8_t copy[kStepBytes];
-        vst1q_u8(copy, blend_step(top, bottom, weight, columns, lane));
-        memcpy(dst, copy, static_cast<size_t>(bytes % kStepBytes));
+        vst1q_u8(copy, blend_bytes(upper.values + i, lower.values + i, weight));
+        memcpy(dst + i, copy, static_cast<size_t>(bytes - i));
     }
 }
 
 }  // namespace
 
 const BilinearBlend bilinear_blend_neon[3] = {
-    {prepare<1>, both<1>}, {prepare<2>, both<2>}, {prepare<4>, both<4>}};
+    {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
 
 }  // namespace ovrin

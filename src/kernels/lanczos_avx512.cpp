@@ -1,11 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 // Lanczos rows with AVX-512; see lanczos_approximation.h for how the byte is decided.
-#if defined(__GNUC__) && !defined(__clang__)
-// The headers of g++ 12 initialise vectors that do not matter with themselves.
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#endif
-#include <immintrin.h>
-
+#include "kernels/intrinsics_avx512.h"
 #include "kernels/lanczos_approximation.h"
 #include "kernels/lanczos_chains_x86.h"
 #include "kernels/sets.h"

@@ -122,7 +122,8 @@ struct Chain {
                                              vqmovn_s64(vcvtq_s64_f64(vaddq_f64(high, half))));
         const int16x4_t words = vqmovn_s32(whole);
         const uint8x8_t bytes = vqmovun_s16(vcombine_s16(words, words));
-        vst1_lane_u32(reinterpret_cast<uint32_t*>(dst), vreinterpret_u32_u8(bytes), 0);
+        const uint32_t pixel = vget_lane_u32(vreinterpret_u32_u8(bytes), 0);
+        memcpy(dst, &pixel, sizeof pixel);
     }
 };
 

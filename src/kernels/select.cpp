@@ -13,7 +13,7 @@ namespace {
 
 constexpr Kernels kAvx2Kernels = {begin_quarter_plan_avx2, bilinear_blend_avx2,
                                   bilinear_edges_scalar, &lanczos_avx2};
-constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, bilinear_blend_avx2,
+constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, bilinear_blend_avx512,
                                     bilinear_edges_scalar, &lanczos_avx512};
 
 const Kernels* best_kernels() {

@@ -13,6 +13,7 @@ BeginQuarterPlan begin_quarter_plan_neon;
 
 extern const BilinearBlend bilinear_blend_scalar[3];
 extern const BilinearBlend bilinear_blend_avx2[3];
+extern const BilinearBlend bilinear_blend_avx512[3];
 extern const BilinearBlend bilinear_blend_neon[3];
 extern const BilinearEdges bilinear_edges_scalar[3];
 

@@ -77,8 +77,9 @@ TEST_F(EngineKernels, TheSetsHaveKernelsOfTheirOwn) {
     for (const NamedKernels& set : vector_sets_) {
         EXPECT_NE(set.kernels->lanczos->row, scalar_kernels.lanczos->row) << set.name;
         for (int i = 0; i < 3; ++i) {
-            EXPECT_NE(set.kernels->bilinear_blend[i].both, scalar_kernels.bilinear_blend[i].both)
-                << set.name;
+            const BilinearBlend& blend = set.kernels->bilinear_blend[i];
+            EXPECT_NE(blend.across, scalar_kernels.bilinear_blend[i].across) << set.name;
+            EXPECT_NE(blend.down, scalar_kernels.bilinear_blend[i].down) << set.name;
         }
     }
 }
