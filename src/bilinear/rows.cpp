@@ -90,8 +90,8 @@ void for_each_strip(const Plane& plane, const BilinearAxes& axes, int32_t first,
     }
 }
 
-// A strip's part of a row lies a whole row behind the last one, where the processor does not look by
-// itself.
+// A strip's part of a row lies a whole row behind the last one, where the processor does not look
+// by itself.
 void prefetch(const Plane& plane, const BilinearColumns& columns, const uint8_t* row) {
     constexpr int64_t kCacheLine = 64;
     const int64_t end = plane.sample_bytes * (columns.index[columns.count - 1] + int64_t{2});
@@ -180,14 +180,17 @@ void blend_rows(const BilinearGeometry& geometry, const BilinearAxes& axes,
 void copy_rows(const BilinearGeometry& geometry, const BilinearAxes& axes, int32_t columns,
                int32_t first_row, int32_t end_row) {
     for_each_plane(geometry, [&](const Plane& plane) {
-        const auto copy = kernels().bilinear_edges[plane.sample_bytes >> 1].copy;
-        for_each_strip(
-            plane, axes, 0, plane.samples(columns), [&](const BilinearColumns& s, int32_t first) {
-                for (int32_t r = plane.first_row(first_row); r < end_row; r += plane.subsampling) {
-                    copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
-                         plane.src_row(axes.row_index[r]), s.index, s.count);
-                }
-            });
+        const BilinearCopy& copy = kernels().bilinear_copy[plane.sample_bytes >> 1];
+        const auto strip = [&](BilinearColumns& s, int32_t first) {
+            copy.prepare(s);
+            for (int32_t r = plane.first_row(first_row); r < end_row; r += plane.subsampling) {
+                const int32_t next = r + plane.subsampling;
+                if (next < end_row) prefetch(plane, s, plane.src_row(axes.row_index[next]));
+                copy.copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
+                          plane.src_row(axes.row_index[r]), s);
+            }
+        };
+        for_each_strip(plane, axes, 0, plane.samples(columns), strip);
     });
 }
 

@@ -77,9 +77,46 @@ void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, in
     }
 }
 
+template <int N>
+void prepare_copy(BilinearColumns& columns) {
+    if (!prepare_groups<N>(columns, 16, 32)) prepare_groups<N>(columns, 8, 32);
+}
+
+// 16 bytes of a window of 32. Shuffles give 0 where the top bit of an index is set.
+__m128i shuffle_window(const uint8_t* window, __m128i indices) {
+    const auto* halves = reinterpret_cast<const __m128i*>(window);
+    const __m128i in_low = _mm_adds_epu8(indices, _mm_set1_epi8(0x70));
+    const __m128i in_high = _mm_sub_epi8(indices, _mm_set1_epi8(16));
+    return _mm_or_si128(_mm_shuffle_epi8(_mm_loadu_si128(halves), in_low),
+                        _mm_shuffle_epi8(_mm_loadu_si128(halves + 1), in_high));
+}
+
+template <int N>
+void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    if (columns.window_bytes == 0) return bilinear_copy_scalar[N >> 1].copy(dst, row, columns);
+    if (columns.group_bytes == 16) {
+        copy_groups<N, 16>(dst, row, columns,
+                           [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+                               const auto* indices = reinterpret_cast<const __m128i*>(shuffle);
+                               _mm_storeu_si128(reinterpret_cast<__m128i*>(to),
+                                                shuffle_window(window, _mm_loadu_si128(indices)));
+                           });
+    } else {
+        copy_groups<N, 8>(dst, row, columns,
+                          [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+                              const auto* indices = reinterpret_cast<const __m128i*>(shuffle);
+                              _mm_storel_epi64(reinterpret_cast<__m128i*>(to),
+                                               shuffle_window(window, _mm_loadl_epi64(indices)));
+                          });
+    }
+}
+
 }  // namespace
 
 const BilinearBlend bilinear_blend_avx2[3] = {
     {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
+
+const BilinearCopy bilinear_copy_avx2[3] = {
+    {prepare_copy<1>, copy<1>}, {prepare_copy<2>, copy<2>}, {prepare_copy<4>, copy<4>}};
 
 }  // namespace ovrin

@@ -102,9 +102,63 @@ void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, in
     }
 }
 
+// Windows of one vector, or of two for groups of less and less.
+template <int N>
+void prepare_copy(BilinearColumns& columns) {
+    if (prepare_groups<N>(columns, 64, 64)) return;
+    for (int32_t group_bytes = 64; group_bytes >= 16; group_bytes /= 2) {
+        if (prepare_groups<N>(columns, group_bytes, 128)) return;
+    }
+}
+
+// The bytes of a window of 128.
+__m512i shuffle_window(const uint8_t* window, __m512i indices) {
+    return _mm512_permutex2var_epi8(_mm512_loadu_si512(window), indices,
+                                    _mm512_loadu_si512(window + 64));
+}
+
+void copy_64_of_64(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    _mm512_storeu_si512(
+        dst, _mm512_permutexvar_epi8(_mm512_loadu_si512(shuffle), _mm512_loadu_si512(window)));
+}
+
+void copy_64_of_128(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    _mm512_storeu_si512(dst, shuffle_window(window, _mm512_loadu_si512(shuffle)));
+}
+
+void copy_32_of_128(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    const __m256i indices = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(shuffle));
+    const __m512i bytes = shuffle_window(window, _mm512_castsi256_si512(indices));
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(dst), _mm512_castsi512_si256(bytes));
+}
+
+void copy_16_of_128(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    const __m128i indices = _mm_loadu_si128(reinterpret_cast<const __m128i*>(shuffle));
+    const __m512i bytes = shuffle_window(window, _mm512_castsi128_si512(indices));
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), _mm512_castsi512_si128(bytes));
+}
+
+template <int N>
+void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    if (columns.window_bytes == 0) {
+        bilinear_copy_scalar[N >> 1].copy(dst, row, columns);
+    } else if (columns.window_bytes == 64) {
+        copy_groups<N, 64>(dst, row, columns, copy_64_of_64);
+    } else if (columns.group_bytes == 64) {
+        copy_groups<N, 64>(dst, row, columns, copy_64_of_128);
+    } else if (columns.group_bytes == 32) {
+        copy_groups<N, 32>(dst, row, columns, copy_32_of_128);
+    } else {
+        copy_groups<N, 16>(dst, row, columns, copy_16_of_128);
+    }
+}
+
 }  // namespace
 
 const BilinearBlend bilinear_blend_avx512[3] = {
     {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
+
+const BilinearCopy bilinear_copy_avx512[3] = {
+    {prepare_copy<1>, copy<1>}, {prepare_copy<2>, copy<2>}, {prepare_copy<4>, copy<4>}};
 
 }  // namespace ovrin

@@ -8,6 +8,8 @@
 // compiled for another instruction set.
 #pragma once
 
+#include <string.h>
+
 #include "kernels/kernels.h"
 
 namespace ovrin {
@@ -67,6 +69,53 @@ void prepare_lanes(BilinearColumns& columns, int32_t window_bytes) {
         if (!plan_lane<N>(columns, lane, base, window_bytes)) return;
     }
     columns.window_bytes = window_bytes;
+}
+
+// Plans copies of groups of bytes by a byte shuffle of a window each, the shuffles one behind the
+// other; bytes behind the last one repeat it. Windows stay between the first and the last byte that
+// the columns name. False: they do not fit, or groups not into them, and there is no plan.
+template <int N>
+bool prepare_groups(BilinearColumns& columns, int32_t group_bytes, int32_t window_bytes) {
+    columns.window_bytes = 0;
+    if (columns.count < 1) return false;
+    const int64_t begin = int64_t{N} * columns.index[0];
+    const int64_t last_base = int64_t{N} * (columns.index[columns.count - 1] + 1) - window_bytes;
+    if (last_base < begin || last_base > INT32_MAX) return false;
+    const int32_t bytes = columns.count * N;
+    uint8_t* shuffle = columns.lane_shuffle[0];
+    for (int32_t i = 0; i < bytes; i += group_bytes) {
+        const int64_t first = int64_t{N} * columns.index[i / N];
+        const int64_t base = first < last_base ? first : last_base;
+        columns.lane_base[i / group_bytes] = static_cast<int32_t>(base);
+        for (int32_t k = i; k < i + group_bytes; ++k) {
+            const int32_t byte = k < bytes ? k : bytes - 1;
+            const int64_t from = int64_t{N} * columns.index[byte / N] + byte % N - base;
+            if (from >= window_bytes) return false;
+            shuffle[k] = static_cast<uint8_t>(from);
+        }
+    }
+    columns.window_bytes = window_bytes;
+    columns.group_bytes = group_bytes;
+    return true;
+}
+
+// Calls copy_group(dst, window, shuffle) for every group, the last of them into a copy if it is not
+// whole.
+template <int N, int kGroupBytes, class CopyGroup>
+void copy_groups(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns,
+                 const CopyGroup& copy_group) {
+    const int32_t bytes = columns.count * N;
+    const uint8_t* shuffle = columns.lane_shuffle[0];
+    const int32_t* base = columns.lane_base;
+    int32_t i = 0;
+    for (; i + kGroupBytes <= bytes; i += kGroupBytes) {
+        copy_group(dst + i, row + *base++, shuffle + i);
+    }
+    if (i < bytes) {
+        uint8_t copy[kGroupBytes];
+        copy_group(copy, row + *base, shuffle + i);
+        memcpy(dst + i, copy, static_cast<size_t>(bytes - i));
+    }
 }
 
 }  // namespace

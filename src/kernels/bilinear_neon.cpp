@@ -74,9 +74,44 @@ void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, in
     }
 }
 
+template <int N>
+void prepare_copy(BilinearColumns& columns) {
+    for (int32_t window_bytes = 16; window_bytes <= 64; window_bytes *= 2) {
+        if (prepare_groups<N>(columns, 16, window_bytes)) return;
+    }
+}
+
+void copy_of_16(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    vst1q_u8(dst, vqtbl1q_u8(vld1q_u8(window), vld1q_u8(shuffle)));
+}
+
+void copy_of_32(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    vst1q_u8(dst, vqtbl2q_u8(vld1q_u8_x2(window), vld1q_u8(shuffle)));
+}
+
+void copy_of_64(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    vst1q_u8(dst, vqtbl4q_u8(vld1q_u8_x4(window), vld1q_u8(shuffle)));
+}
+
+template <int N>
+void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    if (columns.window_bytes == 0) {
+        bilinear_copy_scalar[N >> 1].copy(dst, row, columns);
+    } else if (columns.window_bytes == 16) {
+        copy_groups<N, 16>(dst, row, columns, copy_of_16);
+    } else if (columns.window_bytes == 32) {
+        copy_groups<N, 16>(dst, row, columns, copy_of_32);
+    } else {
+        copy_groups<N, 16>(dst, row, columns, copy_of_64);
+    }
+}
+
 }  // namespace
 
 const BilinearBlend bilinear_blend_neon[3] = {
     {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
+
+const BilinearCopy bilinear_copy_neon[3] = {
+    {prepare_copy<1>, copy<1>}, {prepare_copy<2>, copy<2>}, {prepare_copy<4>, copy<4>}};
 
 }  // namespace ovrin

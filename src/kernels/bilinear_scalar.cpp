@@ -51,6 +51,11 @@ void copy(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count)
     for (int32_t i = 0; i < count; ++i, dst += N) memcpy(dst, row + int64_t{N} * index[i], N);
 }
 
+template <int N>
+void copy_columns(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    copy<N>(dst, row, columns.index, columns.count);
+}
+
 }  // namespace
 
 const BilinearBlend bilinear_blend_scalar[3] = {
@@ -58,5 +63,8 @@ const BilinearBlend bilinear_blend_scalar[3] = {
 
 const BilinearEdges bilinear_edges_scalar[3] = {
     {vertical<1>, copy<1>}, {vertical<2>, copy<2>}, {vertical<4>, copy<4>}};
+
+const BilinearCopy bilinear_copy_scalar[3] = {
+    {prepare, copy_columns<1>}, {prepare, copy_columns<2>}, {prepare, copy_columns<4>}};
 
 }  // namespace ovrin

@@ -75,8 +75,10 @@ struct BilinearColumns {
     int32_t count;
     int32_t index[kBilinearColumns];
     int32_t weight[kBilinearColumns];
-    // How vector kernels gather four bytes, a lane, at a time; set by prepare.
-    int32_t window_bytes;  // from which some lanes take theirs; 0: no plan
+    // How vector kernels gather four bytes, a lane, at a time, or groups of bytes to be copied; set
+    // by prepare.
+    int32_t window_bytes;  // from which some lanes or a group take theirs; 0: no plan
+    int32_t group_bytes;
     int32_t lane_base[kBilinearLanes];
     alignas(64) uint8_t lane_shuffle[kBilinearLanes][16];
     alignas(64) int32_t lane_weights[kBilinearLanes][4];
@@ -112,6 +114,12 @@ struct BilinearEdges {
     void (*vertical)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
                      const BilinearColumns& columns);
     void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
+};
+
+// The same copies for columns whose index is set and that prepare has planned: for many rows.
+struct BilinearCopy {
+    void (*prepare)(BilinearColumns& columns);
+    void (*copy)(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns);
 };
 
 // Neighbouring columns of a picture that a seven-tap filter makes out of interleaved components,
@@ -160,8 +168,9 @@ struct LanczosKernels {
 
 struct Kernels {
     BeginQuarterPlan* begin_quarter_plan;
-    const BilinearBlend* bilinear_blend;  // these two for samples of 1, 2 and 4 bytes
+    const BilinearBlend* bilinear_blend;  // these three for samples of 1, 2 and 4 bytes
     const BilinearEdges* bilinear_edges;
+    const BilinearCopy* bilinear_copy;
     const LanczosKernels* lanczos;
 };
 

@@ -5,16 +5,16 @@
 namespace ovrin {
 
 const Kernels scalar_kernels = {begin_quarter_plan_scalar, bilinear_blend_scalar,
-                                bilinear_edges_scalar, &lanczos_scalar};
+                                bilinear_edges_scalar, bilinear_copy_scalar, &lanczos_scalar};
 
 namespace {
 
 #if defined(__x86_64__)
 
 constexpr Kernels kAvx2Kernels = {begin_quarter_plan_avx2, bilinear_blend_avx2,
-                                  bilinear_edges_scalar, &lanczos_avx2};
+                                  bilinear_edges_scalar, bilinear_copy_avx2, &lanczos_avx2};
 constexpr Kernels kAvx512Kernels = {begin_quarter_plan_avx512, bilinear_blend_avx512,
-                                    bilinear_edges_scalar, &lanczos_avx512};
+                                    bilinear_edges_scalar, bilinear_copy_avx512, &lanczos_avx512};
 
 const Kernels* best_kernels() {
     const CpuFeatures cpu = cpu_features();
@@ -26,7 +26,7 @@ const Kernels* best_kernels() {
 #elif defined(__aarch64__)
 
 constexpr Kernels kNeonKernels = {begin_quarter_plan_neon, bilinear_blend_neon,
-                                  bilinear_edges_scalar, &lanczos_neon};
+                                  bilinear_edges_scalar, bilinear_copy_neon, &lanczos_neon};
 
 const Kernels* best_kernels() {
     return &kNeonKernels;

@@ -16,6 +16,10 @@ extern const BilinearBlend bilinear_blend_avx2[3];
 extern const BilinearBlend bilinear_blend_avx512[3];
 extern const BilinearBlend bilinear_blend_neon[3];
 extern const BilinearEdges bilinear_edges_scalar[3];
+extern const BilinearCopy bilinear_copy_scalar[3];
+extern const BilinearCopy bilinear_copy_avx2[3];
+extern const BilinearCopy bilinear_copy_avx512[3];
+extern const BilinearCopy bilinear_copy_neon[3];
 
 extern const LanczosKernels lanczos_scalar;
 extern const LanczosKernels lanczos_avx2;

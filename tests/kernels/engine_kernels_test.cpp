@@ -80,6 +80,8 @@ TEST_F(EngineKernels, TheSetsHaveKernelsOfTheirOwn) {
             const BilinearBlend& blend = set.kernels->bilinear_blend[i];
             EXPECT_NE(blend.across, scalar_kernels.bilinear_blend[i].across) << set.name;
             EXPECT_NE(blend.down, scalar_kernels.bilinear_blend[i].down) << set.name;
+            EXPECT_NE(set.kernels->bilinear_copy[i].copy, scalar_kernels.bilinear_copy[i].copy)
+                << set.name;
         }
     }
 }
