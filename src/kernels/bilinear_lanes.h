@@ -38,7 +38,7 @@ bool plan_lane(BilinearColumns& columns, int32_t lane, int64_t base, int32_t win
         const int32_t wanted = lane * kLaneBytes + i;
         const int32_t byte = wanted < bytes ? wanted : bytes - 1;
         const int64_t left = int64_t{N} * columns.index[byte / N] + byte % N - base;
-        if (left + N >= window_bytes) return false;
+        if (left < 0 || left + N >= window_bytes) return false;
         uint8_t* shuffle = columns.lane_shuffle[lane] + i * 4;
         shuffle[0] = static_cast<uint8_t>(left);
         shuffle[1] = kZeroByte;
@@ -90,7 +90,7 @@ bool prepare_groups(BilinearColumns& columns, int32_t group_bytes, int32_t windo
         for (int32_t k = i; k < i + group_bytes; ++k) {
             const int32_t byte = k < bytes ? k : bytes - 1;
             const int64_t from = int64_t{N} * columns.index[byte / N] + byte % N - base;
-            if (from >= window_bytes) return false;
+            if (from < 0 || from >= window_bytes) return false;
             shuffle[k] = static_cast<uint8_t>(from);
         }
     }

@@ -19,16 +19,31 @@ void prepare(BilinearColumns& columns) {
     prepare_lanes<N, 1, kStepLanes>(columns, 16);
 }
 
-// Left and right samples of a lane, blended.
-uint32x4_t blend_lane(const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
-    const uint8x16_t window = vld1q_u8(row + columns.lane_base[lane]);
-    const uint8x16_t shuffle = vld1q_u8(columns.lane_shuffle[lane]);
+// What follows goes through four lanes in step: processors that work in order would wait for each
+// result before they use it.
+
+// Left and right samples of four lanes, blended.
+void blend_lanes(uint32_t* sums, const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
     // Lookups outside the table give 0: the high bytes of the 16-bit samples.
-    const int16x8_t samples = vreinterpretq_s16_u8(vqtbl1q_u8(window, shuffle));
-    const int16x8_t weights = vreinterpretq_s16_s32(vld1q_s32(columns.lane_weights[lane]));
-    const int32x4_t low = vmull_s16(vget_low_s16(samples), vget_low_s16(weights));
-    const int32x4_t high = vmull_high_s16(samples, weights);
-    return vreinterpretq_u32_s32(vpaddq_s32(low, high));
+    const auto samples = [&](int32_t k) {
+        return vreinterpretq_s16_u8(vqtbl1q_u8(vld1q_u8(row + columns.lane_base[lane + k]),
+                                               vld1q_u8(columns.lane_shuffle[lane + k])));
+    };
+    const auto weights = [&](int32_t k) {
+        return vreinterpretq_s16_s32(vld1q_s32(columns.lane_weights[lane + k]));
+    };
+    const int16x8_t s[] = {samples(0), samples(1), samples(2), samples(3)};
+    const int16x8_t w[] = {weights(0), weights(1), weights(2), weights(3)};
+    const auto low = [&](int32_t k) { return vmull_s16(vget_low_s16(s[k]), vget_low_s16(w[k])); };
+    const auto high = [&](int32_t k) { return vmull_high_s16(s[k], w[k]); };
+    const int32x4_t l[] = {low(0), low(1), low(2), low(3)};
+    const int32x4_t h[] = {high(0), high(1), high(2), high(3)};
+    const auto sum = [&](int32_t k) { return vreinterpretq_u32_s32(vpaddq_s32(l[k], h[k])); };
+    const uint32x4_t all[] = {sum(0), sum(1), sum(2), sum(3)};
+    vst1q_u32(sums, all[0]);
+    vst1q_u32(sums + 4, all[1]);
+    vst1q_u32(sums + 8, all[2]);
+    vst1q_u32(sums + 12, all[3]);
 }
 
 template <int N>
@@ -36,27 +51,27 @@ void across(BilinearSums& sums, const uint8_t* row, const BilinearColumns& colum
     if (columns.window_bytes == 0) return bilinear_blend_scalar[N >> 1].across(sums, row, columns);
     const int32_t count = whole_steps(columns.count * N, kStepSums);
     for (int32_t i = 0; i < count; i += kStepSums) {
-        for (int32_t k = 0; k < kStepLanes; ++k) {
-            vst1q_u32(sums.values + i + k * kLaneBytes,
-                      blend_lane(row, columns, i / kLaneBytes + k));
-        }
+        blend_lanes(sums.values + i, row, columns, i / kLaneBytes);
     }
 }
 
-// Four target bytes, the top ones of 32-bit numbers. upper * (4096 - wy) + lower * wy with one
-// multiplication.
-uint32x4_t blend_four(const uint32_t* upper, const uint32_t* lower, uint32_t wy) {
-    const uint32x4_t from = vld1q_u32(upper);
-    return vmlaq_n_u32(vshlq_n_u32(from, 12), vsubq_u32(vld1q_u32(lower), from), wy);
-}
-
+// upper * (4096 - wy) + lower * wy with one multiplication. The top bytes are the results.
 uint8x16_t blend_bytes(const uint32_t* upper, const uint32_t* lower, uint32_t wy) {
-    const auto four = [&](int32_t i) {
-        return vreinterpretq_u16_u32(blend_four(upper + i, lower + i, wy));
+    const auto load_upper = [&](int32_t k) { return vld1q_u32(upper + 4 * k); };
+    const auto load_lower = [&](int32_t k) { return vld1q_u32(lower + 4 * k); };
+    const uint32x4_t from[] = {load_upper(0), load_upper(1), load_upper(2), load_upper(3)};
+    const uint32x4_t to[] = {load_lower(0), load_lower(1), load_lower(2), load_lower(3)};
+    const auto shifted = [&](int32_t k) { return vshlq_n_u32(from[k], 12); };
+    const auto step = [&](int32_t k) { return vsubq_u32(to[k], from[k]); };
+    const uint32x4_t begin[] = {shifted(0), shifted(1), shifted(2), shifted(3)};
+    const uint32x4_t steps[] = {step(0), step(1), step(2), step(3)};
+    const auto sum = [&](int32_t k) {
+        return vreinterpretq_u16_u32(vmlaq_n_u32(begin[k], steps[k], wy));
     };
+    const uint16x8_t sums[] = {sum(0), sum(1), sum(2), sum(3)};
     // The odd 16-bit halves hold the top bytes; of those, the odd bytes are the results.
-    const uint16x8_t low = vuzp2q_u16(four(0), four(4));
-    const uint16x8_t high = vuzp2q_u16(four(8), four(12));
+    const uint16x8_t low = vuzp2q_u16(sums[0], sums[1]);
+    const uint16x8_t high = vuzp2q_u16(sums[2], sums[3]);
     return vuzp2q_u8(vreinterpretq_u8_u16(low), vreinterpretq_u8_u16(high));
 }
 

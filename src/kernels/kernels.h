@@ -116,7 +116,8 @@ struct BilinearEdges {
     void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
 };
 
-// The same copies for columns whose index is set and that prepare has planned: for many rows.
+// The same copies for columns whose index is set and that prepare has planned: for many rows. The
+// columns may come from a caller, in any order.
 struct BilinearCopy {
     void (*prepare)(BilinearColumns& columns);
     void (*copy)(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns);
@@ -139,7 +140,8 @@ struct LanczosStrip {
     alignas(64) float weights[kLanczosColumns][8];  // with a zero behind the seven
 };
 
-// One destination row of a strip.
+// One destination row of a strip. Rows may come in any order; a source row has the same bytes in
+// all of them.
 struct LanczosRow {
     uint8_t* dst;
     const uint8_t* taps[7];  // source rows; pixel 0 of each lies three left of column 0

@@ -22,19 +22,36 @@ void convert_vector(float* floats, const uint8_t* bytes) {
     vst1q_f32(floats + 12, vcvtq_f32_u32(vmovl_high_u16(high)));
 }
 
-// Seven taps of a pixel.
-float32x4_t weigh_taps(const float* taps, const float* weights) {
-    const float32x4_t low = vld1q_f32(weights);       // taps 0 to 3
-    const float32x4_t high = vld1q_f32(weights + 4);  // taps 4 to 6
-    const auto pixel = [&](int32_t i) { return vld1q_f32(taps + i * kPixel); };
-    float32x4_t even = vmulq_laneq_f32(pixel(0), low, 0);
-    float32x4_t odd = vmulq_laneq_f32(pixel(1), low, 1);
-    even = vfmaq_laneq_f32(even, pixel(2), low, 2);
-    odd = vfmaq_laneq_f32(odd, pixel(3), low, 3);
-    even = vfmaq_laneq_f32(even, pixel(4), high, 0);
-    odd = vfmaq_laneq_f32(odd, pixel(5), high, 1);
-    even = vfmaq_laneq_f32(even, pixel(6), high, 2);
-    return vaddq_f32(even, odd);
+// What follows goes through four pixels in step: processors that work in order would wait for each
+// sum to be ready before they add to it.
+
+// Adds tap `kTap` of each pixel.
+template <int kTap>
+void add_tap(float32x4_t (&sums)[kGroup], const float* const (&taps)[kGroup],
+             const float32x4_t (&weights)[kGroup]) {
+    for (int32_t k = 0; k < kGroup; ++k) {
+        const float32x4_t pixel = vld1q_f32(taps[k] + kTap * kPixel);
+        sums[k] = vfmaq_laneq_f32(sums[k], pixel, weights[k], kTap % 4);
+    }
+}
+
+// Multiplies it.
+template <int kTap>
+void weigh_tap(float32x4_t (&sums)[kGroup], const float* const (&taps)[kGroup],
+               const float32x4_t (&weights)[kGroup]) {
+    for (int32_t k = 0; k < kGroup; ++k) {
+        const float32x4_t pixel = vld1q_f32(taps[k] + kTap * kPixel);
+        sums[k] = vmulq_laneq_f32(pixel, weights[k], kTap % 4);
+    }
+}
+
+// Adds row `kRow`, seven taps of which are weighed already, to each pixel.
+template <int kRow>
+void add_row(float32x4_t (&values)[kGroup], const float* sums, float32x4_t weights) {
+    for (int32_t k = 0; k < kGroup; ++k) {
+        const float32x4_t pixel = vld1q_f32(sums + k * kPixel);
+        values[k] = vfmaq_laneq_f32(values[k], pixel, weights, kRow % 4);
+    }
 }
 
 uint8x16_t narrow(uint32x4_t a, uint32x4_t b, uint32x4_t c, uint32x4_t d) {
@@ -58,12 +75,12 @@ public:
     }
 
     uint64_t add_block(uint8_t* dst, int32_t x) const {
-        uint32x4_t near[4];
-        for (int32_t i = 0; i < 4; ++i) {
-            near[i] = add_group(dst + i * kVectorBytes, x + i * kGroup);
-        }
+        const uint32x4_t first = add_group(dst, x);
+        const uint32x4_t second = add_group(dst + kVectorBytes, x + kGroup);
+        const uint32x4_t third = add_group(dst + 2 * kVectorBytes, x + 2 * kGroup);
+        const uint32x4_t fourth = add_group(dst + 3 * kVectorBytes, x + 3 * kGroup);
         // A byte for each pixel, then half of it.
-        const uint8x16_t pixels = narrow(near[0], near[1], near[2], near[3]);
+        const uint8x16_t pixels = narrow(first, second, third, fourth);
         const uint8x8_t halves = vshrn_n_u16(vreinterpretq_u16_u8(pixels), 4);
         return vget_lane_u64(vreinterpret_u64_u8(halves), 0);
     }
@@ -71,29 +88,24 @@ public:
 private:
     // Stores four pixels and tells which of them are uncertain.
     uint32x4_t add_group(uint8_t* dst, int32_t x) const {
-        const float32x4_t values[] = {add_pixel(x), add_pixel(x + 1), add_pixel(x + 2),
-                                      add_pixel(x + 3)};
+        const float32x4_t half = vdupq_n_f32(0.5F);
+        float32x4_t values[kGroup] = {half, half, half, half};
+        add_row<0>(values, rows_[0] + x * kPixel, low_);
+        add_row<1>(values, rows_[1] + x * kPixel, low_);
+        add_row<2>(values, rows_[2] + x * kPixel, low_);
+        add_row<3>(values, rows_[3] + x * kPixel, low_);
+        add_row<4>(values, rows_[4] + x * kPixel, high_);
+        add_row<5>(values, rows_[5] + x * kPixel, high_);
+        add_row<6>(values, rows_[6] + x * kPixel, high_);
+        // Below and above, results are 0 and 255 anyway, and so are these: far from others.
+        for (float32x4_t& value : values) value = vmaxq_f32(value, half);
+        for (float32x4_t& value : values) value = vminq_f32(value, vdupq_n_f32(255.5F));
         const auto whole = [&](int32_t i) { return vcvtq_u32_f32(values[i]); };
         vst1q_u8(dst, narrow(whole(0), whole(1), whole(2), whole(3)));
         const auto near = [&](int32_t i) {
             return vcltq_f32(vabdq_f32(values[i], vrndnq_f32(values[i])), uncertain_);
         };
         return vpmaxq_u32(vpmaxq_u32(near(0), near(1)), vpmaxq_u32(near(2), near(3)));
-    }
-
-    // One pixel, 0.5 added. Below and above, results are 0 and 255 anyway, and so are these: far
-    // from others.
-    float32x4_t add_pixel(int32_t x) const {
-        const auto row = [&](int32_t r) { return vld1q_f32(rows_[r] + x * kPixel); };
-        const float32x4_t half = vdupq_n_f32(0.5F);
-        float32x4_t value = vfmaq_laneq_f32(half, row(0), low_, 0);
-        value = vfmaq_laneq_f32(value, row(1), low_, 1);
-        value = vfmaq_laneq_f32(value, row(2), low_, 2);
-        value = vfmaq_laneq_f32(value, row(3), low_, 3);
-        value = vfmaq_laneq_f32(value, row(4), high_, 0);
-        value = vfmaq_laneq_f32(value, row(5), high_, 1);
-        value = vfmaq_laneq_f32(value, row(6), high_, 2);
-        return vminq_f32(vmaxq_f32(value, half), vdupq_n_f32(255.5F));
     }
 
     const float* rows_[kTaps];
@@ -159,9 +171,26 @@ struct Neon {
 
     static void sum_group(float* sums, const float* span, const LanczosStrip& strip, int32_t x,
                           int32_t first) {
-        for (int32_t i = 0; i < kGroup; ++i) {
-            const float* taps = span + (strip.index[x + i] - first) * kPixel;
-            vst1q_f32(sums + i * kPixel, weigh_taps(taps, strip.weights[x + i]));
+        const auto tap = [&](int32_t k) { return span + (strip.index[x + k] - first) * kPixel; };
+        const auto weights = [&](int32_t k, int32_t i) {
+            return vld1q_f32(strip.weights[x + k] + i);
+        };
+        const float* const taps[kGroup] = {tap(0), tap(1), tap(2), tap(3)};
+        const float32x4_t low[kGroup] = {weights(0, 0), weights(1, 0), weights(2, 0),
+                                         weights(3, 0)};
+        const float32x4_t high[kGroup] = {weights(0, 4), weights(1, 4), weights(2, 4),
+                                          weights(3, 4)};
+        float32x4_t even[kGroup];
+        float32x4_t odd[kGroup];
+        weigh_tap<0>(even, taps, low);
+        weigh_tap<1>(odd, taps, low);
+        add_tap<2>(even, taps, low);
+        add_tap<3>(odd, taps, low);
+        add_tap<4>(even, taps, high);
+        add_tap<5>(odd, taps, high);
+        add_tap<6>(even, taps, high);
+        for (int32_t k = 0; k < kGroup; ++k) {
+            vst1q_f32(sums + k * kPixel, vaddq_f32(even[k], odd[k]));
         }
     }
 
