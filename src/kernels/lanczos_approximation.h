@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 // How vector kernels decide the bytes of a Lanczos row without computing every one exactly.
 //
-// The result is defined by a chain of 49 double-precision operations per component. For four
+// The result is defined by a chain of 49 double-precision operations per component. For up to four
 // components a pixel is first computed in single precision, columns before rows: the sums of seven
 // taps within a source row are kept for all result rows that need them. Where the distance from the
 // exact result cannot matter, that decides the byte; elsewhere the chain does, for all such pixels
@@ -28,9 +28,9 @@ namespace ovrin {
 
 namespace {
 
-constexpr int32_t kPixel = 4;         // components
+constexpr int32_t kPixel = 4;         // components, most of them; what follows is made for those
 constexpr int32_t kGroup = 4;         // pixels whose taps are weighed together
-constexpr int32_t kBlock = 16;        // pixels whose rows are added together
+constexpr int32_t kBlock = 16;        // pixels, or as many bytes, whose rows are added together
 constexpr int32_t kSpanPixels = 512;  // source pixels that are held as floats at once
 
 // Distance from a boundary between two bytes within which the chain decides.
@@ -77,9 +77,19 @@ void pad_columns(LanczosStrip& strip) {
     }
 }
 
+// Sums of components behind the last, up to a whole block.
+void clear_last_sums(LanczosStrip& strip) {
+    constexpr int32_t kBlockFloats = kBlock * kPixel;
+    for (float* sums : strip.sums) {
+        for (int32_t i = padded_count(strip) * strip.src_components; i % kBlockFloats != 0; ++i) {
+            sums[i] = 0.0F;
+        }
+    }
+}
+
 void prepare(LanczosStrip& strip) {
     strip.has_small_weights = false;
-    if (strip.src_components != kPixel || strip.dst_components != kPixel) return;
+    if (strip.src_components != strip.dst_components || strip.src_components > kPixel) return;
     strip.largest_weights = 0.0;
     for (int32_t x = 0; x < strip.count; ++x) {
         const double* weights = strip.column_weights + int64_t{x} * kTaps;
@@ -90,13 +100,40 @@ void prepare(LanczosStrip& strip) {
         strip.weights[x][kTaps] = 0.0F;
     }
     pad_columns(strip);
+    clear_last_sums(strip);
     for (int32_t& row : strip.held_rows) row = -1;
     strip.has_small_weights = spans_hold_groups(strip);
 }
 
-// Sums of one source row for all columns.
+// Sums of one source row of pixels with less than four components.
+template <int N>
+void sum_narrow_row(float* sums, const LanczosStrip& strip, const uint8_t* src) {
+    Span span;
+    for (int32_t x = 0; x < padded_count(strip);) {
+        const int32_t end = x + columns_in_span(strip, x);
+        const int32_t first = strip.index[x];
+        const int32_t floats = (strip.index[end - 1] - first + kTaps) * N;
+        const uint8_t* bytes = src + int64_t{first} * N;
+        for (int32_t i = 0; i < floats; ++i) span.values[i] = bytes[i];
+        for (; x < end; ++x) {
+            const float* weights = strip.weights[x];
+            for (int32_t c = 0; c < N; ++c) {
+                const float* taps = span.values + (strip.index[x] - first) * N + c;
+                float even = weights[0] * taps[0];
+                float odd = weights[1] * taps[N];
+                for (int32_t i = 2; i < kTaps; i += 2) {
+                    even = fmaf(weights[i], taps[i * N], even);
+                    if (i + 1 < kTaps) odd = fmaf(weights[i + 1], taps[(i + 1) * N], odd);
+                }
+                sums[x * N + c] = even + odd;
+            }
+        }
+    }
+}
+
+// Sums of one source row of pixels with four components.
 template <class Set>
-void sum_source_row(float* sums, const LanczosStrip& strip, const uint8_t* src) {
+void sum_pixel_row(float* sums, const LanczosStrip& strip, const uint8_t* src) {
     Span span;
     for (int32_t x = 0; x < padded_count(strip);) {
         const int32_t end = x + columns_in_span(strip, x);
@@ -110,21 +147,48 @@ void sum_source_row(float* sums, const LanczosStrip& strip, const uint8_t* src) 
     }
 }
 
+template <class Set>
+void sum_source_row(float* sums, const LanczosStrip& strip, const uint8_t* src) {
+    switch (strip.src_components) {
+        case 1:
+            return sum_narrow_row<1>(sums, strip, src);
+        case 2:
+            return sum_narrow_row<2>(sums, strip, src);
+        case 3:
+            return sum_narrow_row<3>(sums, strip, src);
+        default:
+            return sum_pixel_row<Set>(sums, strip, src);
+    }
+}
+
+// The chains of four neighbouring bytes, which belong to several pixels.
+void run_narrow_chains(const LanczosStrip& strip, const LanczosRow& row, int32_t first) {
+    const int32_t n = strip.src_components;
+    for (int32_t i = first; i < first + kPixel && i < strip.count * n; ++i) {
+        const double* weights = strip.column_weights + int64_t{i / n} * kTaps;
+        const int64_t tap = int64_t{strip.index[i / n]} * n + i % n;
+        row.dst[i] = rounded(sum_of_taps(row, weights, tap, n));
+    }
+}
+
 // Adds rows block by block. Where pixels are uncertain often it is hard to predict which, so a
-// block's are appended without branches. Returns the number of uncertain pixels.
+// block's are appended without branches. Returns the number of uncertain pixels. Where pixels have
+// less components, four neighbouring bytes take their place.
 template <class Set>
 int32_t add_rows(const LanczosStrip& strip, const LanczosRow& row, const typename Set::Sums& sums,
                  int32_t* uncertain) {
+    const int32_t bytes = strip.count * strip.dst_components;
     int32_t found = 0;
-    for (int32_t x = 0; x < strip.count; x += kBlock) {
+    for (int32_t x = 0; x * kPixel < bytes; x += kBlock) {
         uint8_t* dst = row.dst + x * kPixel;
+        const int32_t left = bytes - x * kPixel;
         uint64_t near;
-        if (strip.count - x >= kBlock) {
+        if (left >= kBlock * kPixel) {
             near = sums.add_block(dst, x);
         } else {
             uint8_t copy[kBlock * kPixel];
             near = sums.add_block(copy, x);
-            memcpy(dst, copy, static_cast<size_t>((strip.count - x) * kPixel));
+            memcpy(dst, copy, static_cast<size_t>(left));
         }
         if (near == 0) continue;
         for (int32_t i = x; i < x + kBlock; ++i, near >>= kPixel) {
@@ -163,7 +227,12 @@ void filter_row(LanczosStrip& strip, const LanczosRow& row) {
                                   uncertain_distance(row_weights, strip.largest_weights));
     int32_t uncertain[kLanczosColumns];
     const int32_t count = add_rows<Set>(strip, row, sums, uncertain);
-    if (count > 0) Set::run_chains(strip, row, uncertain, count);
+    if (count == 0) return;
+    if (strip.dst_components == kPixel) {
+        Set::run_chains(strip, row, uncertain, count);
+    } else {
+        for (int32_t i = 0; i < count; ++i) run_narrow_chains(strip, row, uncertain[i] * kPixel);
+    }
 }
 
 }  // namespace

@@ -200,6 +200,7 @@ TEST_F(EngineKernels, LanczosOnTheBoundariesOfRounding) {
         lanczos_alike(constant(20 * 10 * 4, value), 20, 10, 7, 5, 4);
     }
     const Bytes board = checkerboard(24, 12);
+    for (const int n : {1, 2, 3}) lanczos_alike(board, 24, 12, 48, 24, n);
     lanczos_alike(board, 24, 12, 48, 24, 4);
     lanczos_alike(board, 24, 12, 72, 36, 4);
     lanczos_alike(board, 24, 12, 12, 6, 4);
@@ -213,11 +214,14 @@ TEST_F(EngineKernels, LanczosOnTheBoundariesOfRounding) {
 // Strips that end with or beside a block, and source rows that serve several result rows.
 TEST_F(EngineKernels, LanczosAroundStripBorders) {
     Random random(48);
-    for (const int32_t dst_w : {15, 16, 17, 255, 256, 257, 272, 513}) {
-        const int32_t src_w = random.pick({dst_w / 3, dst_w / 2, dst_w * 2, dst_w * 5});
-        const int32_t src_h = random.between(2, 20);
-        const Bytes src = random.bytes(static_cast<size_t>(src_w) * static_cast<size_t>(src_h * 4));
-        lanczos_alike(src, src_w, src_h, dst_w, random.pick({5, 9, 30}), 4);
+    for (const int32_t n : {1, 2, 3, 4}) {
+        for (const int32_t dst_w : {15, 16, 17, 255, 256, 257, 272, 513}) {
+            const int32_t src_w = random.pick({dst_w / 3, dst_w / 2, dst_w * 2, dst_w * 5});
+            const int32_t src_h = random.between(2, 20);
+            const Bytes src =
+                random.bytes(static_cast<size_t>(src_w) * static_cast<size_t>(src_h * n));
+            lanczos_alike(src, src_w, src_h, dst_w, random.pick({5, 9, 30}), n);
+        }
     }
 }
 
