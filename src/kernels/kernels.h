@@ -127,15 +127,15 @@ struct BilinearCopy {
 // and what vector kernels keep of them from row to row.
 constexpr int32_t kLanczosColumns = 256;
 struct LanczosStrip {
+    const double* column_weights;  // per column: seven
+    double largest_weights;        // of any column, the sum of its absolute weights; for kernels
     int32_t src_components;
     int32_t dst_components;
     int32_t count;
-    const double* column_weights;    // per column: seven
     int32_t index[kLanczosColumns];  // per column: the first of its seven taps in a source row
-    // Set up by prepare.
+    // The rest is the kernels' own.
+    int32_t held_rows[7];    // the source row of each of the sums; negative: none
     bool has_small_weights;  // see kSmallWeights
-    double largest_weights;  // of any column, the sum of its absolute weights
-    int32_t held_rows[7];    // the source row in each of the following; negative: none
     alignas(64) float sums[7][kLanczosColumns * 4];
     alignas(64) float weights[kLanczosColumns][8];  // with a zero behind the seven
 };
@@ -144,8 +144,8 @@ struct LanczosStrip {
 // all of them.
 struct LanczosRow {
     uint8_t* dst;
-    const uint8_t* taps[7];  // source rows; pixel 0 of each lies three left of column 0
-    int32_t source_rows[7];  // their numbers, not negative: where they are equal, so are the rows
+    const uint8_t* taps[7];     // source rows; pixel 0 of each lies three left of column 0
+    int32_t source_rows[7];     // their numbers: consecutive, or the same at a border
     const double* row_weights;  // seven
 };
 
@@ -154,7 +154,7 @@ struct LanczosRow {
 // caller.
 constexpr double kSmallWeights = 1.9;
 
-// prepare is called once for a strip whose first five fields are set. Then row computes, for column
+// prepare is called once for a strip that says where its columns are. Then row computes, for column
 // x in [0, count), component k in [0, dst_components), with v the row weights and h the column's:
 //
 //   acc = 0; for r in [0, 7), for i in [0, 7), in this order:
