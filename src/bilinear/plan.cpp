@@ -148,7 +148,11 @@ BilinearExtent extent_of(const BilinearGeometry& geometry, const BilinearTables&
     return extent;
 }
 
-void clear_canvas(const BilinearGeometry& geometry) {
+void clear_canvas(const BilinearGeometry& geometry, const BilinearExtent& extent) {
+    const bool is_covered = geometry.dst_x == 0 && geometry.dst_y == 0 &&
+                            extent.columns == geometry.canvas_width &&
+                            extent.rows == geometry.canvas_height;
+    if (is_covered) return;
     if (geometry.layout != BilinearLayout::kPixels) {
         paint_black(geometry.canvas, geometry.canvas_planes());
     } else if (geometry.canvas_width > 0 && geometry.canvas_height > 0) {

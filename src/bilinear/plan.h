@@ -86,6 +86,7 @@ struct BilinearExtent {
 
 BilinearExtent extent_of(const BilinearGeometry& geometry, const BilinearTables& tables);
 
-void clear_canvas(const BilinearGeometry& geometry);
+// Paints what the rows of the extent do not: nothing, or the whole canvas.
+void clear_canvas(const BilinearGeometry& geometry, const BilinearExtent& extent);
 
 }  // namespace ovrin

@@ -90,6 +90,40 @@ void for_each_strip(const Plane& plane, const BilinearAxes& axes, int32_t first,
     }
 }
 
+// A strip's part of a row lies a whole row behind the last one, where the processor does not look
+// by itself.
+void prefetch(const Plane& plane, const BilinearColumns& columns, const uint8_t* row) {
+    constexpr int64_t kCacheLine = 64;
+    const int64_t end = plane.sample_bytes * (columns.index[columns.count - 1] + int64_t{2});
+    for (int64_t i = plane.sample_bytes * int64_t{columns.index[0]}; i < end; i += kCacheLine) {
+        __builtin_prefetch(row + i);
+    }
+}
+
+// Two source rows of a strip, blended horizontally. A result row takes two neighbouring rows, and
+// the next one often takes one or both of them again.
+class BlendedRows {
+public:
+    BlendedRows(const BilinearBlend& blend, const BilinearColumns& columns)
+        : blend_(blend), columns_(columns) {}
+
+    // The sums of `row`; those of `kept` stay as well if they are there.
+    const BilinearSums& sums(const uint8_t* row, const uint8_t* kept) {
+        const int held = row == rows_[0] ? 0 : 1;
+        if (row == rows_[held]) return sums_[held];
+        const int free = kept == rows_[0] ? 1 : 0;
+        blend_.across(sums_[free], row, columns_);
+        rows_[free] = row;
+        return sums_[free];
+    }
+
+private:
+    const BilinearBlend& blend_;
+    const BilinearColumns& columns_;
+    const uint8_t* rows_[2] = {nullptr, nullptr};
+    BilinearSums sums_[2];
+};
+
 void blend_plane(const Plane& plane, const BilinearAxes& axes, const BilinearExtent& extent) {
     const BilinearBlend& blend = kernels().bilinear_blend[plane.sample_bytes >> 1];
     const BilinearEdges& edges = kernels().bilinear_edges[plane.sample_bytes >> 1];
@@ -101,21 +135,38 @@ void blend_plane(const Plane& plane, const BilinearAxes& axes, const BilinearExt
         return plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes;
     };
     const auto src = [&](int32_t r) { return plane.src_row(axes.row_index[r]); };
+    // A row without vertical blend is blended with itself.
+    const auto blend_edge_rows = [&](BlendedRows& rows, const BilinearColumns& s, int32_t first) {
+        for (int32_t r = plane.first_row(first_edge_row); r < extent.rows; r += plane.subsampling) {
+            const BilinearSums& row = rows.sums(src(r), nullptr);
+            blend.down(dst(r, first), row, row, 0, s.count * plane.sample_bytes);
+        }
+    };
     for_each_strip(plane, axes, 0, blended, [&](BilinearColumns& s, int32_t first) {
         blend.prepare(s);
+        BlendedRows rows(blend, s);
         for (int32_t r = 0; r < first_edge_row; r += plane.subsampling) {
-            blend.both(dst(r, first), src(r), src(r) + plane.src_pitch, axes.row_weight[r], s);
+            const uint8_t* top = src(r);
+            const uint8_t* bottom = top + plane.src_pitch;
+            const BilinearSums& upper = rows.sums(top, bottom);
+            const BilinearSums& lower = rows.sums(bottom, top);
+            if (r + plane.subsampling < first_edge_row) {
+                const uint8_t* next = src(r + plane.subsampling);
+                if (next > bottom) prefetch(plane, s, next);
+                if (next > top) prefetch(plane, s, next + plane.src_pitch);
+            }
+            blend.down(dst(r, first), upper, lower, axes.row_weight[r],
+                       s.count * plane.sample_bytes);
         }
+        blend_edge_rows(rows, s, first);
     });
     for_each_strip(plane, axes, blended, all, [&](BilinearColumns& s, int32_t first) {
         for (int32_t r = 0; r < first_edge_row; r += plane.subsampling) {
             edges.vertical(dst(r, first), src(r), src(r) + plane.edge_pitch, axes.row_weight[r], s);
         }
-    });
-    for_each_strip(plane, axes, 0, all, [&](BilinearColumns& s, int32_t first) {
-        for (int32_t r = plane.first_row(first_edge_row); r < extent.rows; r += plane.subsampling) {
-            edges.horizontal(dst(r, first), src(r), s);
-        }
+        blend.prepare(s);
+        BlendedRows rows(blend, s);
+        blend_edge_rows(rows, s, first);
     });
 }
 
@@ -129,14 +180,17 @@ void blend_rows(const BilinearGeometry& geometry, const BilinearAxes& axes,
 void copy_rows(const BilinearGeometry& geometry, const BilinearAxes& axes, int32_t columns,
                int32_t first_row, int32_t end_row) {
     for_each_plane(geometry, [&](const Plane& plane) {
-        const auto copy = kernels().bilinear_edges[plane.sample_bytes >> 1].copy;
-        for_each_strip(
-            plane, axes, 0, plane.samples(columns), [&](const BilinearColumns& s, int32_t first) {
-                for (int32_t r = plane.first_row(first_row); r < end_row; r += plane.subsampling) {
-                    copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
-                         plane.src_row(axes.row_index[r]), s.index, s.count);
-                }
-            });
+        const BilinearCopy& copy = kernels().bilinear_copy[plane.sample_bytes >> 1];
+        const auto strip = [&](BilinearColumns& s, int32_t first) {
+            copy.prepare(s);
+            for (int32_t r = plane.first_row(first_row); r < end_row; r += plane.subsampling) {
+                const int32_t next = r + plane.subsampling;
+                if (next < end_row) prefetch(plane, s, plane.src_row(axes.row_index[next]));
+                copy.copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
+                          plane.src_row(axes.row_index[r]), s);
+            }
+        };
+        for_each_strip(plane, axes, 0, plane.samples(columns), strip);
     });
 }
 

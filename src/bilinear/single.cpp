@@ -13,6 +13,7 @@ void ov_bilinear_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src
     BilinearTables tables(dst_w, dst_h);
     if (!tables.ready()) return;
     tables.fill(geometry);
-    clear_canvas(geometry);
-    blend_rows(geometry, axes_of(tables), extent_of(geometry, tables));
+    const BilinearExtent extent = extent_of(geometry, tables);
+    clear_canvas(geometry, extent);
+    blend_rows(geometry, axes_of(tables), extent);
 }

@@ -77,7 +77,7 @@ Outcome resize_on(ovrin_threadpool* pool, const BilinearCall& call,
     const BilinearExtent extent = extent_of(geometry, tables);
     fill_bands(bands, count, height, template_band(call, geometry, tables, extent),
                extent.edge_rows);
-    clear_canvas(geometry);
+    clear_canvas(geometry, extent);
     run_bands_with_caller(pool, _ov_bilinear_tp, bands, count, sizeof *bands);
     free(bands);
     return Outcome::kDone;

@@ -10,67 +10,123 @@ namespace ovrin {
 
 namespace {
 
-constexpr int32_t kStepLanes = 4;  // lanes whose bytes fill a vector
-constexpr int32_t kStepBytes = kStepLanes * kLaneBytes;
-
-// Left and right samples of a lane, blended: four sums with 12 fractional bits.
-uint32x4_t blend_right(const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
-    const uint8x16_t window = vld1q_u8(row + columns.lane_base[lane]);
-    const uint8x16_t shuffle = vld1q_u8(columns.lane_shuffle[lane]);
-    // Lookups outside the table give 0: the high bytes of the 16-bit samples.
-    const int16x8_t samples = vreinterpretq_s16_u8(vqtbl1q_u8(window, shuffle));
-    const int16x8_t weights = vreinterpretq_s16_s32(vld1q_s32(columns.lane_weights[lane]));
-    const int32x4_t low = vmull_s16(vget_low_s16(samples), vget_low_s16(weights));
-    const int32x4_t high = vmull_high_s16(samples, weights);
-    return vreinterpretq_u32_s32(vpaddq_s32(low, high));
-}
-
-// Four target bytes as 32-bit numbers, in their top bytes.
-uint32x4_t blend(const uint8_t* top, const uint8_t* bottom, uint32_t wy,
-                 const BilinearColumns& columns, int32_t lane) {
-    const uint32x4_t upper = vmulq_n_u32(blend_right(top, columns, lane), 4096 - wy);
-    return vmlaq_n_u32(upper, blend_right(bottom, columns, lane), wy);
-}
-
-// 16 target bytes.
-uint8x16_t blend_step(const uint8_t* top, const uint8_t* bottom, uint32_t wy,
-                      const BilinearColumns& columns, int32_t lane) {
-    const auto four = [&](int32_t i) {
-        return vreinterpretq_u16_u32(blend(top, bottom, wy, columns, lane + i));
-    };
-    // The odd 16-bit halves hold the top bytes; of those, the odd bytes are the results.
-    const uint16x8_t low = vuzp2q_u16(four(0), four(1));
-    const uint16x8_t high = vuzp2q_u16(four(2), four(3));
-    return vuzp2q_u8(vreinterpretq_u8_u16(low), vreinterpretq_u8_u16(high));
-}
+constexpr int32_t kStepLanes = 4;
+constexpr int32_t kStepSums = kStepLanes * kLaneBytes;
+constexpr int32_t kStepBytes = 16;  // of a finished row
 
 template <int N>
 void prepare(BilinearColumns& columns) {
-    prepare_lanes<N>(columns, kStepLanes);
+    prepare_lanes<N, 1, kStepLanes>(columns, 16);
+}
+
+// What follows goes through four lanes in step: processors that work in order would wait for each
+// result before they use it.
+
+// Left and right samples of four lanes, blended.
+void blend_lanes(uint32_t* sums, const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
+    // Lookups outside the table give 0: the high bytes of the 16-bit samples.
+    const auto samples = [&](int32_t k) {
+        return vreinterpretq_s16_u8(vqtbl1q_u8(vld1q_u8(row + columns.lane_base[lane + k]),
+                                               vld1q_u8(columns.lane_shuffle[lane + k])));
+    };
+    const auto weights = [&](int32_t k) {
+        return vreinterpretq_s16_s32(vld1q_s32(columns.lane_weights[lane + k]));
+    };
+    const int16x8_t s[] = {samples(0), samples(1), samples(2), samples(3)};
+    const int16x8_t w[] = {weights(0), weights(1), weights(2), weights(3)};
+    const auto low = [&](int32_t k) { return vmull_s16(vget_low_s16(s[k]), vget_low_s16(w[k])); };
+    const auto high = [&](int32_t k) { return vmull_high_s16(s[k], w[k]); };
+    const int32x4_t l[] = {low(0), low(1), low(2), low(3)};
+    const int32x4_t h[] = {high(0), high(1), high(2), high(3)};
+    const auto sum = [&](int32_t k) { return vreinterpretq_u32_s32(vpaddq_s32(l[k], h[k])); };
+    const uint32x4_t all[] = {sum(0), sum(1), sum(2), sum(3)};
+    vst1q_u32(sums, all[0]);
+    vst1q_u32(sums + 4, all[1]);
+    vst1q_u32(sums + 8, all[2]);
+    vst1q_u32(sums + 12, all[3]);
 }
 
 template <int N>
-void both(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
-          const BilinearColumns& columns) {
-    if (columns.lanes == 0)
-        return bilinear_blend_scalar[N >> 1].both(dst, top, bottom, wy, columns);
-    const uint32_t weight = static_cast<uint32_t>(wy);
-    const int32_t bytes = columns.count * N;
-    int32_t lane = 0;
-    for (int32_t done = kStepBytes; done <= bytes; done += kStepBytes, lane += kStepLanes) {
-        vst1q_u8(dst, blend_step(top, bottom, weight, columns, lane));
-        dst += kStepBytes;
+void across(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns) {
+    if (columns.window_bytes == 0) return bilinear_blend_scalar[N >> 1].across(sums, row, columns);
+    const int32_t count = whole_steps(columns.count * N, kStepSums);
+    for (int32_t i = 0; i < count; i += kStepSums) {
+        blend_lanes(sums.values + i, row, columns, i / kLaneBytes);
     }
-    if (bytes % kStepBytes != 0) {
+}
+
+// upper * (4096 - wy) + lower * wy with one multiplication. The top bytes are the results.
+uint8x16_t blend_bytes(const uint32_t* upper, const uint32_t* lower, uint32_t wy) {
+    const auto load_upper = [&](int32_t k) { return vld1q_u32(upper + 4 * k); };
+    const auto load_lower = [&](int32_t k) { return vld1q_u32(lower + 4 * k); };
+    const uint32x4_t from[] = {load_upper(0), load_upper(1), load_upper(2), load_upper(3)};
+    const uint32x4_t to[] = {load_lower(0), load_lower(1), load_lower(2), load_lower(3)};
+    const auto shifted = [&](int32_t k) { return vshlq_n_u32(from[k], 12); };
+    const auto step = [&](int32_t k) { return vsubq_u32(to[k], from[k]); };
+    const uint32x4_t begin[] = {shifted(0), shifted(1), shifted(2), shifted(3)};
+    const uint32x4_t steps[] = {step(0), step(1), step(2), step(3)};
+    const auto sum = [&](int32_t k) {
+        return vreinterpretq_u16_u32(vmlaq_n_u32(begin[k], steps[k], wy));
+    };
+    const uint16x8_t sums[] = {sum(0), sum(1), sum(2), sum(3)};
+    // The odd 16-bit halves hold the top bytes; of those, the odd bytes are the results.
+    const uint16x8_t low = vuzp2q_u16(sums[0], sums[1]);
+    const uint16x8_t high = vuzp2q_u16(sums[2], sums[3]);
+    return vuzp2q_u8(vreinterpretq_u8_u16(low), vreinterpretq_u8_u16(high));
+}
+
+void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
+          int32_t bytes) {
+    const uint32_t weight = static_cast<uint32_t>(wy);
+    int32_t i = 0;
+    for (; i + kStepBytes <= bytes; i += kStepBytes) {
+        vst1q_u8(dst + i, blend_bytes(upper.values + i, lower.values + i, weight));
+    }
+    if (i < bytes) {
         uint8_t copy[kStepBytes];
-        vst1q_u8(copy, blend_step(top, bottom, weight, columns, lane));
-        memcpy(dst, copy, static_cast<size_t>(bytes % kStepBytes));
+        vst1q_u8(copy, blend_bytes(upper.values + i, lower.values + i, weight));
+        memcpy(dst + i, copy, static_cast<size_t>(bytes - i));
+    }
+}
+
+template <int N>
+void prepare_copy(BilinearColumns& columns) {
+    for (int32_t window_bytes = 16; window_bytes <= 64; window_bytes *= 2) {
+        if (prepare_groups<N>(columns, 16, window_bytes)) return;
+    }
+}
+
+void copy_of_16(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    vst1q_u8(dst, vqtbl1q_u8(vld1q_u8(window), vld1q_u8(shuffle)));
+}
+
+void copy_of_32(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    vst1q_u8(dst, vqtbl2q_u8(vld1q_u8_x2(window), vld1q_u8(shuffle)));
+}
+
+void copy_of_64(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
+    vst1q_u8(dst, vqtbl4q_u8(vld1q_u8_x4(window), vld1q_u8(shuffle)));
+}
+
+template <int N>
+void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    if (columns.window_bytes == 0) {
+        bilinear_copy_scalar[N >> 1].copy(dst, row, columns);
+    } else if (columns.window_bytes == 16) {
+        copy_groups<N, 16>(dst, row, columns, copy_of_16);
+    } else if (columns.window_bytes == 32) {
+        copy_groups<N, 16>(dst, row, columns, copy_of_32);
+    } else {
+        copy_groups<N, 16>(dst, row, columns, copy_of_64);
     }
 }
 
 }  // namespace
 
 const BilinearBlend bilinear_blend_neon[3] = {
-    {prepare<1>, both<1>}, {prepare<2>, both<2>}, {prepare<4>, both<4>}};
+    {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
+
+const BilinearCopy bilinear_copy_neon[3] = {
+    {prepare_copy<1>, copy<1>}, {prepare_copy<2>, copy<2>}, {prepare_copy<4>, copy<4>}};
 
 }  // namespace ovrin

@@ -14,26 +14,24 @@ uint32_t blend(uint32_t first, uint32_t second, int32_t weight) {
     return first * (kOne - w) + second * w;
 }
 
-// Byte c of column i, blended with the sample to its right.
-template <int N>
-uint32_t blend_right(const uint8_t* row, const BilinearColumns& columns, int32_t i, int c) {
-    const uint8_t* sample = row + int64_t{N} * columns.index[i] + c;
-    return blend(sample[0], sample[N], columns.weight[i]);
-}
-
 void prepare(BilinearColumns& columns) {
-    columns.lanes = 0;
+    columns.window_bytes = 0;
 }
 
 template <int N>
-void both(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
-          const BilinearColumns& columns) {
-    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
+void across(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns) {
+    for (int32_t i = 0; i < columns.count; ++i) {
         for (int c = 0; c < N; ++c) {
-            const uint32_t upper = blend_right<N>(top, columns, i, c);
-            const uint32_t lower = blend_right<N>(bottom, columns, i, c);
-            dst[c] = static_cast<uint8_t>(blend(upper, lower, wy) >> 24);
+            const uint8_t* sample = row + int64_t{N} * columns.index[i] + c;
+            sums.values[N * i + c] = blend(sample[0], sample[N], columns.weight[i]);
         }
+    }
+}
+
+void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
+          int32_t bytes) {
+    for (int32_t i = 0; i < bytes; ++i) {
+        dst[i] = static_cast<uint8_t>(blend(upper.values[i], lower.values[i], wy) >> 24);
     }
 }
 
@@ -49,26 +47,24 @@ void vertical(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t w
 }
 
 template <int N>
-void horizontal(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
-    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
-        for (int c = 0; c < N; ++c) {
-            dst[c] = static_cast<uint8_t>(blend_right<N>(row, columns, i, c) << 12 >> 24);
-        }
-    }
+void copy(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count) {
+    for (int32_t i = 0; i < count; ++i, dst += N) memcpy(dst, row + int64_t{N} * index[i], N);
 }
 
 template <int N>
-void copy(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count) {
-    for (int32_t i = 0; i < count; ++i, dst += N) memcpy(dst, row + int64_t{N} * index[i], N);
+void copy_columns(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    copy<N>(dst, row, columns.index, columns.count);
 }
 
 }  // namespace
 
 const BilinearBlend bilinear_blend_scalar[3] = {
-    {prepare, both<1>}, {prepare, both<2>}, {prepare, both<4>}};
+    {prepare, across<1>, down}, {prepare, across<2>, down}, {prepare, across<4>, down}};
 
-const BilinearEdges bilinear_edges_scalar[3] = {{vertical<1>, horizontal<1>, copy<1>},
-                                                {vertical<2>, horizontal<2>, copy<2>},
-                                                {vertical<4>, horizontal<4>, copy<4>}};
+const BilinearEdges bilinear_edges_scalar[3] = {
+    {vertical<1>, copy<1>}, {vertical<2>, copy<2>}, {vertical<4>, copy<4>}};
+
+const BilinearCopy bilinear_copy_scalar[3] = {
+    {prepare, copy_columns<1>}, {prepare, copy_columns<2>}, {prepare, copy_columns<4>}};
 
 }  // namespace ovrin

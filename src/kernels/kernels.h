@@ -76,48 +76,78 @@ struct BilinearColumns {
     int32_t count;
     int32_t index[kBilinearColumns];
     int32_t weight[kBilinearColumns];
-    // How vector kernels gather four bytes at a time; set by prepare. No lanes: not at all.
-    int32_t lanes;
+    // How vector kernels gather four bytes, a lane, at a time, or groups of bytes to be copied; set
+    // by prepare.
+    int32_t window_bytes;  // from which some lanes or a group take theirs; 0: no plan
+    int32_t group_bytes;
     int32_t lane_base[kBilinearLanes];
     alignas(64) uint8_t lane_shuffle[kBilinearLanes][16];
     alignas(64) int32_t lane_weights[kBilinearLanes][4];
+};
+
+// A source row, blended horizontally for the columns of a strip: for every destination byte a sum
+// with 12 fractional bits. What lies behind the last one up to a vector may be overwritten.
+struct BilinearSums {
+    alignas(64) uint32_t values[kBilinearColumns * 4];
 };
 
 // Bilinear rows of samples of N bytes. prepare is called once for columns whose index and weight
 // are set; then, with wx and index those of column i, wy the weight of the lower row, and P(row, k)
 // = row[N*(index + k) + c], for i in [0, count) and c in [0, N), all modulo 2^32:
 //
-//   both        dst = ((P(top, 0) * (4096 - wx) + P(top, 1) * wx) * (4096 - wy) +
-//                      (P(bottom, 0) * (4096 - wx) + P(bottom, 1) * wx) * wy) >> 24
+//   across      sums = P(row, 0) * (4096 - wx) + P(row, 1) * wx
 //   vertical    dst = (P(top, 0) * (4096 - wy) + P(bottom, 0) * wy) << 12 >> 24
-//   horizontal  dst = (P(row, 0) * (4096 - wx) + P(row, 1) * wx) << 12 >> 24
 //   copy        dst = P(row, 0)
 //
-// at dst[N*i + c]. Of the rows only bytes from the first to the last of those named are read; only
-// the bytes named are written. No alignment is needed.
+// at sums or dst[N*i + c], and for i in [0, bytes):
+//
+//   down        dst[i] = (upper[i] * (4096 - wy) + lower[i] * wy) >> 24
+//
+// Of the rows only bytes from the first to the last of those named are read; of dst only the bytes
+// named are written. No alignment is needed.
 struct BilinearBlend {
     void (*prepare)(BilinearColumns& columns);
-    void (*both)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
-                 const BilinearColumns& columns);
+    void (*across)(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns);
+    void (*down)(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
+                 int32_t bytes);
 };
 struct BilinearEdges {
     void (*vertical)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
                      const BilinearColumns& columns);
-    void (*horizontal)(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns);
     void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
 };
 
-// One row of a seven-tap filter over interleaved components, or part of it.
-struct LanczosRow {
-    uint8_t* dst;
-    const uint8_t* taps[7];  // source rows; pixel 0 of each lies three left of column 0
+// The same copies for columns whose index is set and that prepare has planned: for many rows. The
+// columns may come from a caller, in any order.
+struct BilinearCopy {
+    void (*prepare)(BilinearColumns& columns);
+    void (*copy)(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns);
+};
+
+// Neighbouring columns of a picture that a seven-tap filter makes out of interleaved components,
+// and what vector kernels keep of them from row to row.
+constexpr int32_t kLanczosColumns = 256;
+struct LanczosStrip {
+    const double* column_weights;  // per column: seven
+    double largest_weights;        // of any column, the sum of its absolute weights; for kernels
     int32_t src_components;
     int32_t dst_components;
-    const int32_t* index;          // per pixel: the first of its seven taps in a row
-    const double* column_weights;  // per pixel: seven
-    const double* row_weights;     // seven
     int32_t count;
+    int32_t index[kLanczosColumns];  // per column: the first of its seven taps in a source row
+    // The rest is the kernels' own.
+    int32_t held_rows[7];    // the source row of each of the sums; negative: none
     bool has_small_weights;  // see kSmallWeights
+    alignas(64) float sums[7][kLanczosColumns * 4];
+    alignas(64) float weights[kLanczosColumns][8];  // with a zero behind the seven
+};
+
+// One destination row of a strip. Rows may come in any order; a source row has the same bytes in
+// all of them.
+struct LanczosRow {
+    uint8_t* dst;
+    const uint8_t* taps[7];     // source rows; pixel 0 of each lies three left of column 0
+    int32_t source_rows[7];     // their numbers: consecutive, or the same at a border
+    const double* row_weights;  // seven
 };
 
 // Weights of which no seven add up to more than this in absolute value leave room for shortcuts
@@ -125,16 +155,19 @@ struct LanczosRow {
 // caller.
 constexpr double kSmallWeights = 1.9;
 
-// For pixel x in [0, count), component k in [0, dst_components), with v the row weights and h the
-// pixel's column weights:
+// prepare is called once for a strip that says where its columns are. Then row computes, for column
+// x in [0, count), component k in [0, dst_components), with v the row weights and h the column's:
 //
 //   acc = 0; for r in [0, 7), for i in [0, 7), in this order:
 //       acc = fma(v[r] * h[i], taps[r][index[x] * src_components + i * dst_components + k], acc)
 //   dst = acc + 0.5, truncated, clamped to 0 ... 255
 //
 // in double precision, each operation rounded once: the order and the fusing are part of the
-// result.
-using LanczosRowKernel = void(const LanczosRow& row);
+// result. Of the source rows only bytes from the first to the last of those named are read.
+struct LanczosKernels {
+    void (*prepare)(LanczosStrip& strip);
+    void (*row)(LanczosStrip& strip, const LanczosRow& row);
+};
 
 // dst[i] = src[i * step], for i in [0, count) and a step of 0 or more. `next` is the row that will
 // be asked for next. Reads nothing behind the last of these words.
@@ -143,9 +176,10 @@ using CopyEvery = void(uint32_t* dst, const uint32_t* src, int32_t step, int32_t
 
 struct Kernels {
     PlanQuarters* plan_quarters;
-    const BilinearBlend* bilinear_blend;  // these two for samples of 1, 2 and 4 bytes
+    const BilinearBlend* bilinear_blend;  // these three for samples of 1, 2 and 4 bytes
     const BilinearEdges* bilinear_edges;
-    LanczosRowKernel* lanczos_row;
+    const BilinearCopy* bilinear_copy;
+    const LanczosKernels* lanczos;
     CopyEvery* copy_every;
 };
 

@@ -10,106 +10,201 @@ namespace ovrin {
 
 namespace {
 
-// Sums of `floats` bytes from `first` on, weighted by row. floats is a multiple of 4.
-void sum_columns(ColumnSums& sums, const LanczosRow& row, int64_t first, int32_t floats) {
-    float weights[kTaps];
-    for (int32_t r = 0; r < kTaps; ++r) weights[r] = static_cast<float>(row.row_weights[r]);
-    int32_t i = 0;
-    for (; i + 8 <= floats; i += 8) {
-        float32x4_t low = vdupq_n_f32(0.0F);
-        float32x4_t high = low;
+constexpr int32_t kVectorBytes = 16;
+
+void convert_vector(float* floats, const uint8_t* bytes) {
+    const uint8x16_t sixteen = vld1q_u8(bytes);
+    const uint16x8_t low = vmovl_u8(vget_low_u8(sixteen));
+    const uint16x8_t high = vmovl_high_u8(sixteen);
+    vst1q_f32(floats, vcvtq_f32_u32(vmovl_u16(vget_low_u16(low))));
+    vst1q_f32(floats + 4, vcvtq_f32_u32(vmovl_high_u16(low)));
+    vst1q_f32(floats + 8, vcvtq_f32_u32(vmovl_u16(vget_low_u16(high))));
+    vst1q_f32(floats + 12, vcvtq_f32_u32(vmovl_high_u16(high)));
+}
+
+// What follows goes through four pixels in step: processors that work in order would wait for each
+// sum to be ready before they add to it.
+
+// Adds tap `kTap` of each pixel.
+template <int kTap>
+void add_tap(float32x4_t (&sums)[kGroup], const float* const (&taps)[kGroup],
+             const float32x4_t (&weights)[kGroup]) {
+    for (int32_t k = 0; k < kGroup; ++k) {
+        const float32x4_t pixel = vld1q_f32(taps[k] + kTap * kPixel);
+        sums[k] = vfmaq_laneq_f32(sums[k], pixel, weights[k], kTap % 4);
+    }
+}
+
+// Multiplies it.
+template <int kTap>
+void weigh_tap(float32x4_t (&sums)[kGroup], const float* const (&taps)[kGroup],
+               const float32x4_t (&weights)[kGroup]) {
+    for (int32_t k = 0; k < kGroup; ++k) {
+        const float32x4_t pixel = vld1q_f32(taps[k] + kTap * kPixel);
+        sums[k] = vmulq_laneq_f32(pixel, weights[k], kTap % 4);
+    }
+}
+
+// Adds row `kRow`, seven taps of which are weighed already, to each pixel.
+template <int kRow>
+void add_row(float32x4_t (&values)[kGroup], const float* sums, float32x4_t weights) {
+    for (int32_t k = 0; k < kGroup; ++k) {
+        const float32x4_t pixel = vld1q_f32(sums + k * kPixel);
+        values[k] = vfmaq_laneq_f32(values[k], pixel, weights, kRow % 4);
+    }
+}
+
+uint8x16_t narrow(uint32x4_t a, uint32x4_t b, uint32x4_t c, uint32x4_t d) {
+    const uint16x8_t low = vuzp1q_u16(vreinterpretq_u16_u32(a), vreinterpretq_u16_u32(b));
+    const uint16x8_t high = vuzp1q_u16(vreinterpretq_u16_u32(c), vreinterpretq_u16_u32(d));
+    return vuzp1q_u8(vreinterpretq_u8_u16(low), vreinterpretq_u8_u16(high));
+}
+
+// Seven rows of sums, to be weighed and added.
+class NeonSums {
+public:
+    NeonSums(const float* const* rows, const double* weights, float uncertain)
+        : low_(vdupq_n_f32(0.0F)), high_(low_), uncertain_(vdupq_n_f32(uncertain)) {
+        float floats[kTaps + 1] = {};
         for (int32_t r = 0; r < kTaps; ++r) {
-            const uint16x8_t words = vmovl_u8(vld1_u8(row.taps[r] + first + i));
-            low = vfmaq_n_f32(low, vcvtq_f32_u32(vmovl_u16(vget_low_u16(words))), weights[r]);
-            high = vfmaq_n_f32(high, vcvtq_f32_u32(vmovl_high_u16(words)), weights[r]);
+            rows_[r] = rows[r];
+            floats[r] = static_cast<float>(weights[r]);
         }
-        vst1q_f32(sums.values + i, low);
-        vst1q_f32(sums.values + i + 4, high);
+        low_ = vld1q_f32(floats);
+        high_ = vld1q_f32(floats + 4);
     }
-    sum_last_columns(sums, row, first, i, floats);
-}
 
-// One pixel in single precision, 0.5 added.
-float32x4_t approximate_pixel(const float* sums, const double* weights) {
-    const auto pair = [&](int32_t i) { return vcvt_f32_f64(vld1q_f64(weights + i)); };
-    const float32x4_t low = vcombine_f32(pair(0), pair(2));   // taps 0 to 3
-    const float32x4_t high = vcombine_f32(pair(3), pair(5));  // taps 3 to 6
-    const auto pixel = [&](int32_t i) { return vld1q_f32(sums + i * kPixel); };
-    float32x4_t even = vmulq_laneq_f32(pixel(0), low, 0);
-    float32x4_t odd = vmulq_laneq_f32(pixel(1), low, 1);
-    even = vfmaq_laneq_f32(even, pixel(2), low, 2);
-    odd = vfmaq_laneq_f32(odd, pixel(3), low, 3);
-    even = vfmaq_laneq_f32(even, pixel(4), high, 1);
-    odd = vfmaq_laneq_f32(odd, pixel(5), high, 2);
-    even = vfmaq_laneq_f32(even, pixel(6), high, 3);
-    return vaddq_f32(vaddq_f32(even, odd), vdupq_n_f32(0.5F));
-}
+    uint64_t add_block(uint8_t* dst, int32_t x) const {
+        const uint32x4_t first = add_group(dst, x);
+        const uint32x4_t second = add_group(dst + kVectorBytes, x + kGroup);
+        const uint32x4_t third = add_group(dst + 2 * kVectorBytes, x + 2 * kGroup);
+        const uint32x4_t fourth = add_group(dst + 3 * kVectorBytes, x + 3 * kGroup);
+        // A byte for each pixel, then half of it.
+        const uint8x16_t pixels = narrow(first, second, third, fourth);
+        const uint8x8_t halves = vshrn_n_u16(vreinterpretq_u16_u8(pixels), 4);
+        return vget_lane_u64(vreinterpret_u64_u8(halves), 0);
+    }
 
-bool is_uncertain(float32x4_t value) {
-    const float32x4_t whole = vrndnq_f32(value);
-    const uint32x4_t near = vcltq_f32(vabdq_f32(value, whole), vdupq_n_f32(kUncertain));
-    const uint32x4_t inside =
-        vandq_u32(vcgeq_f32(whole, vdupq_n_f32(1.0F)), vcleq_f32(whole, vdupq_n_f32(255.0F)));
-    return vmaxvq_u32(vandq_u32(near, inside)) != 0;
-}
+private:
+    // Stores four pixels and tells which of them are uncertain.
+    uint32x4_t add_group(uint8_t* dst, int32_t x) const {
+        const float32x4_t half = vdupq_n_f32(0.5F);
+        float32x4_t values[kGroup] = {half, half, half, half};
+        add_row<0>(values, rows_[0] + x * kPixel, low_);
+        add_row<1>(values, rows_[1] + x * kPixel, low_);
+        add_row<2>(values, rows_[2] + x * kPixel, low_);
+        add_row<3>(values, rows_[3] + x * kPixel, low_);
+        add_row<4>(values, rows_[4] + x * kPixel, high_);
+        add_row<5>(values, rows_[5] + x * kPixel, high_);
+        add_row<6>(values, rows_[6] + x * kPixel, high_);
+        // Below and above, results are 0 and 255 anyway, and so are these: far from others.
+        for (float32x4_t& value : values) value = vmaxq_f32(value, half);
+        for (float32x4_t& value : values) value = vminq_f32(value, vdupq_n_f32(255.5F));
+        const auto whole = [&](int32_t i) { return vcvtq_u32_f32(values[i]); };
+        vst1q_u8(dst, narrow(whole(0), whole(1), whole(2), whole(3)));
+        const auto near = [&](int32_t i) {
+            return vcltq_f32(vabdq_f32(values[i], vrndnq_f32(values[i])), uncertain_);
+        };
+        return vpmaxq_u32(vpmaxq_u32(near(0), near(1)), vpmaxq_u32(near(2), near(3)));
+    }
 
-void store_pixel(uint8_t* dst, int16x4_t whole) {
-    const uint8x8_t bytes = vqmovun_s16(vcombine_s16(whole, whole));
-    const uint32_t word = vget_lane_u32(vreinterpret_u32_u8(bytes), 0);
-    memcpy(dst, &word, sizeof word);
-}
+    const float* rows_[kTaps];
+    float32x4_t low_;
+    float32x4_t high_;
+    float32x4_t uncertain_;
+};
 
-// The chain itself, one component per lane. `first`: byte of the first tap in each row.
-void exact_pixel(uint8_t* dst, const LanczosRow& row, const double* weights, int64_t first) {
+// The chain of one pixel, two components per vector.
+struct Chain {
     float64x2_t low = vdupq_n_f64(0.0);
-    float64x2_t high = low;
+    float64x2_t high = vdupq_n_f64(0.0);
+
+    void add(const uint8_t* pixel, double weight) {
+        uint32_t bytes;
+        memcpy(&bytes, pixel, sizeof bytes);
+        const uint8x8_t eight = vcreate_u8(bytes);
+        const uint32x4_t words = vmovl_u16(vget_low_u16(vmovl_u8(eight)));
+        low = vfmaq_n_f64(low, vcvtq_f64_u64(vmovl_u32(vget_low_u32(words))), weight);
+        high = vfmaq_n_f64(high, vcvtq_f64_u64(vmovl_high_u32(words)), weight);
+    }
+
+    void store(uint8_t* dst) const {
+        const float64x2_t half = vdupq_n_f64(0.5);
+        const int32x4_t whole = vcombine_s32(vqmovn_s64(vcvtq_s64_f64(vaddq_f64(low, half))),
+                                             vqmovn_s64(vcvtq_s64_f64(vaddq_f64(high, half))));
+        const int16x4_t words = vqmovn_s32(whole);
+        const uint8x8_t bytes = vqmovun_s16(vcombine_s16(words, words));
+        const uint32_t pixel = vget_lane_u32(vreinterpret_u32_u8(bytes), 0);
+        memcpy(dst, &pixel, sizeof pixel);
+    }
+};
+
+// Two pixels side by side, to hide the latency.
+void run_two_chains(const LanczosStrip& strip, const LanczosRow& row, int32_t a, int32_t b) {
+    const double* weights_a = strip.column_weights + int64_t{a} * kTaps;
+    const double* weights_b = strip.column_weights + int64_t{b} * kTaps;
+    Chain chain_a;
+    Chain chain_b;
     for (int32_t r = 0; r < kTaps; ++r) {
-        const uint8_t* taps = row.taps[r] + first;
-        for (int32_t i = 0; i < kTaps; ++i, taps += kPixel) {
-            const double weight = row.row_weights[r] * weights[i];
-            const float64x2_t first_two = {static_cast<double>(taps[0]),
-                                           static_cast<double>(taps[1])};
-            const float64x2_t last_two = {static_cast<double>(taps[2]),
-                                          static_cast<double>(taps[3])};
-            low = vfmaq_n_f64(low, first_two, weight);
-            high = vfmaq_n_f64(high, last_two, weight);
+        const double weight = row.row_weights[r];
+        const uint8_t* taps_a = row.taps[r] + int64_t{strip.index[a]} * kPixel;
+        const uint8_t* taps_b = row.taps[r] + int64_t{strip.index[b]} * kPixel;
+        for (int32_t i = 0; i < kTaps; ++i) {
+            chain_a.add(taps_a + i * kPixel, weight * weights_a[i]);
+            chain_b.add(taps_b + i * kPixel, weight * weights_b[i]);
         }
     }
-    const float64x2_t half = vdupq_n_f64(0.5);
-    const int32x4_t whole = vcombine_s32(vqmovn_s64(vcvtq_s64_f64(vaddq_f64(low, half))),
-                                         vqmovn_s64(vcvtq_s64_f64(vaddq_f64(high, half))));
-    store_pixel(dst, vqmovn_s32(whole));
+    chain_a.store(row.dst + int64_t{a} * kPixel);
+    chain_b.store(row.dst + int64_t{b} * kPixel);
 }
 
-void filter_pixels(const LanczosRow& row) {
-    ColumnSums sums;
-    for (int32_t x = 0; x < row.count;) {
-        const int32_t end = x + pixels_in_span(row, x);
-        const int32_t first = row.index[x];
-        sum_columns(sums, row, int64_t{first} * kPixel,
-                    (row.index[end - 1] - first + kTaps) * kPixel);
-        for (; x < end; ++x) {
-            const double* weights = row.column_weights + int64_t{x} * kTaps;
-            uint8_t* dst = row.dst + int64_t{x} * kPixel;
-            const float32x4_t value =
-                approximate_pixel(sums.values + (row.index[x] - first) * kPixel, weights);
-            if (is_uncertain(value)) {
-                exact_pixel(dst, row, weights, int64_t{row.index[x]} * kPixel);
-            } else {
-                store_pixel(dst, vqmovn_s32(vcvtq_s32_f32(value)));
-            }
+struct Neon {
+    using Sums = NeonSums;
+
+    static void convert(float* floats, const uint8_t* bytes, int32_t count) {
+        for (int32_t i = 0; i < count - kVectorBytes; i += kVectorBytes) {
+            convert_vector(floats + i, bytes + i);
+        }
+        const int32_t last = count - kVectorBytes;
+        convert_vector(floats + last, bytes + last);
+    }
+
+    static void sum_group(float* sums, const float* span, const LanczosStrip& strip, int32_t x,
+                          int32_t first) {
+        const auto tap = [&](int32_t k) { return span + (strip.index[x + k] - first) * kPixel; };
+        const auto weights = [&](int32_t k, int32_t i) {
+            return vld1q_f32(strip.weights[x + k] + i);
+        };
+        const float* const taps[kGroup] = {tap(0), tap(1), tap(2), tap(3)};
+        const float32x4_t low[kGroup] = {weights(0, 0), weights(1, 0), weights(2, 0),
+                                         weights(3, 0)};
+        const float32x4_t high[kGroup] = {weights(0, 4), weights(1, 4), weights(2, 4),
+                                          weights(3, 4)};
+        float32x4_t even[kGroup];
+        float32x4_t odd[kGroup];
+        weigh_tap<0>(even, taps, low);
+        weigh_tap<1>(odd, taps, low);
+        add_tap<2>(even, taps, low);
+        add_tap<3>(odd, taps, low);
+        add_tap<4>(even, taps, high);
+        add_tap<5>(odd, taps, high);
+        add_tap<6>(even, taps, high);
+        for (int32_t k = 0; k < kGroup; ++k) {
+            vst1q_f32(sums + k * kPixel, vaddq_f32(even[k], odd[k]));
         }
     }
-}
+
+    // The last pixel may be computed twice.
+    static void run_chains(const LanczosStrip& strip, const LanczosRow& row, const int32_t* columns,
+                           int32_t count) {
+        for (int32_t i = 0; i < count; i += 2) {
+            run_two_chains(strip, row, columns[i], columns[i + 1 < count ? i + 1 : i]);
+        }
+    }
+};
 
 }  // namespace
 
-void lanczos_row_neon(const LanczosRow& row) {
-    if (row.has_small_weights && row.src_components == kPixel && row.dst_components == kPixel) {
-        filter_pixels(row);
-    } else {
-        lanczos_row_scalar(row);
-    }
-}
+const LanczosKernels lanczos_neon = {prepare, filter_row<Neon>};
 
 }  // namespace ovrin

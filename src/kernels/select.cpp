@@ -5,16 +5,17 @@
 namespace ovrin {
 
 const Kernels scalar_kernels = {plan_quarters_scalar, bilinear_blend_scalar, bilinear_edges_scalar,
-                                lanczos_row_scalar, copy_every_scalar};
+                                bilinear_copy_scalar, &lanczos_scalar,       copy_every_scalar};
 
 namespace {
 
 #if defined(__x86_64__)
 
 constexpr Kernels kAvx2Kernels = {plan_quarters_avx2, bilinear_blend_avx2, bilinear_edges_scalar,
-                                  lanczos_row_avx2, copy_every_scalar};
-constexpr Kernels kAvx512Kernels = {plan_quarters_avx512, bilinear_blend_avx2,
-                                    bilinear_edges_scalar, lanczos_row_avx2, copy_every_avx512};
+                                  bilinear_copy_avx2, &lanczos_avx2,       copy_every_scalar};
+constexpr Kernels kAvx512Kernels = {plan_quarters_avx512,  bilinear_blend_avx512,
+                                    bilinear_edges_scalar, bilinear_copy_avx512,
+                                    &lanczos_avx512,       copy_every_avx512};
 
 const Kernels* best_kernels() {
     const CpuFeatures cpu = cpu_features();
@@ -26,7 +27,7 @@ const Kernels* best_kernels() {
 #elif defined(__aarch64__)
 
 constexpr Kernels kNeonKernels = {plan_quarters_neon, bilinear_blend_neon, bilinear_edges_scalar,
-                                  lanczos_row_neon, copy_every_neon};
+                                  bilinear_copy_neon, &lanczos_neon,       copy_every_neon};
 
 const Kernels* best_kernels() {
     return &kNeonKernels;

@@ -13,12 +13,18 @@ PlanQuarters plan_quarters_neon;
 
 extern const BilinearBlend bilinear_blend_scalar[3];
 extern const BilinearBlend bilinear_blend_avx2[3];
+extern const BilinearBlend bilinear_blend_avx512[3];
 extern const BilinearBlend bilinear_blend_neon[3];
 extern const BilinearEdges bilinear_edges_scalar[3];
+extern const BilinearCopy bilinear_copy_scalar[3];
+extern const BilinearCopy bilinear_copy_avx2[3];
+extern const BilinearCopy bilinear_copy_avx512[3];
+extern const BilinearCopy bilinear_copy_neon[3];
 
-LanczosRowKernel lanczos_row_scalar;
-LanczosRowKernel lanczos_row_avx2;
-LanczosRowKernel lanczos_row_neon;
+extern const LanczosKernels lanczos_scalar;
+extern const LanczosKernels lanczos_avx2;
+extern const LanczosKernels lanczos_avx512;
+extern const LanczosKernels lanczos_neon;
 
 CopyEvery copy_every_scalar;
 CopyEvery copy_every_avx512;

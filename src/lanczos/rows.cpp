@@ -1,31 +1,37 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "lanczos/rows.h"
 
-#include <math.h>
 #include <string.h>
-
-#include "kernels/kernels.h"
 
 namespace ovrin {
 
 namespace {
 
-// Columns are handed to the kernel in blocks; their positions are a running sum over the whole row.
-constexpr int32_t kColumnBlock = 1024;
+constexpr int32_t kCacheLine = 64;
 
-int64_t clamped(int64_t row, int32_t rows) {
+int32_t clamped(int64_t row, int32_t rows) {
     if (row < 0) return 0;
-    return row < rows ? row : int64_t{rows} - 1;
+    return row < rows ? static_cast<int32_t>(row) : rows - 1;
 }
 
-bool are_small(const double* weights, int64_t sets) {
-    for (int64_t i = 0; i < sets; ++i, weights += kLanczosTaps) {
-        double sum = 0.0;
-        for (int32_t j = 0; j < kLanczosTaps; ++j) sum += fabs(weights[j]);
-        if (!(sum <= kSmallWeights)) return false;
+// Columns lie at a running sum over the whole row.
+class ColumnPositions {
+public:
+    explicit ColumnPositions(const LanczosRows& picture)
+        : step_(static_cast<double>(picture.src_w) / picture.dst_w), src_w_(picture.src_w) {}
+
+    // Only rounding on absurdly wide rows could carry a position past the last column.
+    int32_t next() {
+        const int32_t column = position_ < src_w_ ? static_cast<int32_t>(position_) : src_w_ - 1;
+        position_ += step_;
+        return column;
     }
-    return true;
-}
+
+private:
+    double position_ = 0.0;
+    double step_;
+    int32_t src_w_;
+};
 
 }  // namespace
 
@@ -35,64 +41,76 @@ LanczosCache::LanczosCache(const LanczosRows& picture)
     : pitch_((picture.src_w + ptrdiff_t{2} * kLanczosMargin) * picture.src_components),
       data_(static_cast<uint8_t*>(
           calloc(static_cast<size_t>(pitch_ + picture.dst_components), kLanczosTaps))) {
-    for (int64_t& row : rows_) row = -1;
+    narrow_to(picture, 0, picture.src_w + int64_t{2} * kLanczosMargin);
 }
 
-void LanczosCache::copy_row(const LanczosRows& picture, int32_t slot, int64_t row) {
-    const size_t pixel = static_cast<size_t>(picture.src_components);
-    const size_t row_bytes = static_cast<size_t>(picture.src_w) * pixel;
+// Where taps run on into the slot behind theirs they need all of it.
+void LanczosCache::narrow_to(const LanczosRows& picture, int32_t first, int64_t end) {
+    const bool whole = picture.src_components != picture.dst_components;
+    first_ = whole ? 0 : first;
+    end_ = whole ? picture.src_w + int64_t{2} * kLanczosMargin : end;
+    for (int32_t& row : rows_) row = -1;
+}
+
+void LanczosCache::copy_row(const LanczosRows& picture, int32_t slot, int32_t row) {
+    const int64_t pixel = picture.src_components;
     const uint8_t* src = picture.src + row * picture.src_pitch;
-    uint8_t* before = data_ + slot * pitch_;
-    uint8_t* middle = before + kLanczosMargin * pixel;
-    uint8_t* after = middle + row_bytes;
-    memcpy(middle, src, row_bytes);
-    for (int32_t i = 0; i < kLanczosMargin; ++i, before += pixel, after += pixel) {
-        memcpy(before, src, pixel);
-        memcpy(after, src + row_bytes - pixel, pixel);
+    uint8_t* dst = data_ + slot * pitch_;
+    const int64_t behind = kLanczosMargin + int64_t{picture.src_w};
+    const int64_t first = first_ < kLanczosMargin ? kLanczosMargin : first_;
+    const int64_t end = end_ < behind ? end_ : behind;
+    if (first < end) {
+        memcpy(dst + first * pixel, src + (first - kLanczosMargin) * pixel,
+               static_cast<size_t>((end - first) * pixel));
     }
+    const auto repeat = [&](int64_t column, int64_t source_column) {
+        memcpy(dst + column * pixel, src + source_column * pixel, static_cast<size_t>(pixel));
+    };
+    for (int64_t i = first_; i < kLanczosMargin; ++i) repeat(i, 0);
+    for (int64_t i = behind; i < end_; ++i) repeat(i, picture.src_w - 1);
     rows_[slot] = row;
+    // The row below lies a whole row further on, where the processor does not look by itself.
+    if (row + 1 == picture.src_h) return;
+    const uint8_t* next = src + picture.src_pitch + (first - kLanczosMargin) * pixel;
+    for (int64_t i = 0; i < (end - first) * pixel; i += kCacheLine) __builtin_prefetch(next + i);
 }
 
 // Rows that stay are not copied again: of seven rows in a row no two share a slot. Only where taps
 // run on into the slot behind theirs must slots lie in the order of the taps.
-void LanczosCache::load(const LanczosRows& picture, int64_t middle_row,
-                        const uint8_t* taps[kLanczosTaps]) {
+void LanczosCache::load(const LanczosRows& picture, int64_t middle_row, LanczosRow& row) {
     const bool in_order = picture.src_components != picture.dst_components;
     for (int32_t k = 0; k < kLanczosTaps; ++k) {
-        const int64_t row = clamped(middle_row - kLanczosMargin + k, picture.src_h);
-        const int32_t slot = in_order ? k : static_cast<int32_t>(row % kLanczosTaps);
-        if (rows_[slot] != row) copy_row(picture, slot, row);
-        taps[k] = data_ + slot * pitch_;
+        const int32_t source_row = clamped(middle_row - kLanczosMargin + k, picture.src_h);
+        const int32_t slot = in_order ? k : source_row % kLanczosTaps;
+        if (rows_[slot] != source_row) copy_row(picture, slot, source_row);
+        row.taps[k] = data_ + slot * pitch_;
+        row.source_rows[k] = source_row;
     }
 }
 
+// Strip by strip: what kernels keep of a strip and its source rows stays small.
 void filter_rows(const LanczosRows& picture, LanczosCache& cache, int32_t first, int32_t end) {
     const double row_step = static_cast<double>(picture.src_h) / picture.dst_h;
-    const double column_step = static_cast<double>(picture.src_w) / picture.dst_w;
-    // Only rounding on absurdly wide rows could carry a position past the last column.
-    const int32_t last_column = picture.src_w - 1;
-    const auto filter = kernels().lanczos_row;
-    int32_t index[kColumnBlock];
-    const bool columns_are_small = are_small(picture.column_weights, picture.dst_w);
-    LanczosRow row = {};
-    row.src_components = picture.src_components;
-    row.dst_components = picture.dst_components;
-    row.index = index;
-    for (int32_t y = first; y < end; ++y) {
-        cache.load(picture, static_cast<int64_t>(row_step * y), row.taps);
-        row.dst = picture.dst + ptrdiff_t{y - first} * picture.dst_pitch;
-        row.column_weights = picture.column_weights;
-        row.row_weights = picture.row_weights + int64_t{y} * kLanczosTaps;
-        row.has_small_weights = columns_are_small && are_small(row.row_weights, 1);
-        double position = 0.0;
-        for (int32_t x = 0; x < picture.dst_w; x += row.count) {
-            row.count = picture.dst_w - x < kColumnBlock ? picture.dst_w - x : kColumnBlock;
-            for (int32_t i = 0; i < row.count; ++i, position += column_step) {
-                index[i] = position < picture.src_w ? static_cast<int32_t>(position) : last_column;
-            }
-            filter(row);
-            row.dst += ptrdiff_t{row.count} * picture.dst_components;
-            row.column_weights += int64_t{row.count} * kLanczosTaps;
+    const LanczosKernels& kernel = *kernels().lanczos;
+    ColumnPositions columns(picture);
+    LanczosStrip strip;
+    strip.src_components = picture.src_components;
+    strip.dst_components = picture.dst_components;
+    for (int32_t x = 0; x < picture.dst_w; x += strip.count) {
+        const int32_t left = picture.dst_w - x;
+        strip.count = left < kLanczosColumns ? left : kLanczosColumns;
+        strip.column_weights = picture.column_weights + int64_t{x} * kLanczosTaps;
+        for (int32_t i = 0; i < strip.count; ++i) strip.index[i] = columns.next();
+        kernel.prepare(strip);
+        cache.narrow_to(picture, strip.index[0],
+                        int64_t{strip.index[strip.count - 1]} + kLanczosTaps);
+        for (int32_t y = first; y < end; ++y) {
+            LanczosRow row;
+            cache.load(picture, static_cast<int64_t>(row_step * y), row);
+            row.dst = picture.dst + ptrdiff_t{y - first} * picture.dst_pitch +
+                      ptrdiff_t{x} * picture.dst_components;
+            row.row_weights = picture.row_weights + int64_t{y} * kLanczosTaps;
+            kernel.row(strip, row);
         }
     }
 }

@@ -5,6 +5,7 @@
 #include <stddef.h>
 #include <stdint.h>
 
+#include "kernels/kernels.h"
 #include "lanczos/weights.h"
 
 namespace ovrin {
@@ -24,7 +25,8 @@ struct LanczosRows {
     const double* row_weights;
 };
 
-// Seven source rows with their first and last pixels repeated three times on either side.
+// Seven source rows with their first and last pixels repeated three times on either side, or the
+// part of them that a strip of the picture needs. Pixels count from the first of the repeated ones.
 class LanczosCache {
 public:
     explicit LanczosCache(const LanczosRows& picture);
@@ -34,15 +36,20 @@ public:
 
     bool ready() const { return data_ != nullptr; }
 
-    // Points taps[k] to source row middle_row - 3 + k, or the nearest one that exists.
-    void load(const LanczosRows& picture, int64_t middle_row, const uint8_t* taps[kLanczosTaps]);
+    // From now on rows are wanted from pixel `first` to before pixel `end`.
+    void narrow_to(const LanczosRows& picture, int32_t first, int64_t end);
+
+    // Points row.taps[k] to source row middle_row - 3 + k, or the nearest one that exists.
+    void load(const LanczosRows& picture, int64_t middle_row, LanczosRow& row);
 
 private:
-    void copy_row(const LanczosRows& picture, int32_t slot, int64_t row);
+    void copy_row(const LanczosRows& picture, int32_t slot, int32_t row);
 
     ptrdiff_t pitch_;
     uint8_t* data_;
-    int64_t rows_[kLanczosTaps];  // the source row in each slot; negative: none
+    int64_t first_;
+    int64_t end_;
+    int32_t rows_[kLanczosTaps];  // the source row in each slot; negative: none
 };
 
 // Computes destination rows [first, end).

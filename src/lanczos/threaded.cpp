@@ -55,7 +55,7 @@ Outcome resize_on(ovrin_threadpool* pool, const LanczosCall& call, int32_t count
         ovrin_threadpool_free(pool, 1);
         return Outcome::kUseSingleThread;
     }
-    plan.fill(call.src_w, call.src_h, call.dst_w, call.dst_h);
+    plan.fill(call.src_w, call.src_h);
     fill_bands(bands, count, height, call, plan);
     memset(call.dst, 0,
            static_cast<size_t>(call.dst_w) * static_cast<size_t>(call.dst_h) * kPlacedBytes);

@@ -37,7 +37,7 @@ void OvTransformLanczos(const lanczos_image* src, const lanczos_image* dst) {
         plan.columns.data(), plan.rows.data()};
     LanczosCache cache(picture);
     if (!plan.ready() || !cache.ready()) return;
-    plan.fill(src->width, src->height, dst->width, dst->height);
+    plan.fill(src->width, src->height);
     filter_rows(picture, cache, 0, dst->height);
 }
 

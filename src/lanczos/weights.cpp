@@ -22,19 +22,42 @@ double kernel(double x) {
     return x >= 3.0 ? 0.0 : sinc(x) * sinc(x / 3.0);
 }
 
-double look_up(const float* table, double distance) {
+int32_t entry_of(double distance) {
     const double step = fabs(distance) * kStepsPerPixel;
     const int32_t last = kTableEntries - 1;
-    return static_cast<double>(table[step > last ? last : static_cast<int32_t>(step)]);
+    return step > last ? last : static_cast<int32_t>(step);
 }
 
-// The weights of samples c - 3 ... c + 3 around a position with fraction `fraction`. A scale below
-// 1 stretches the kernel over them.
-void fill_taps(double* weights, const float* table, double fraction, float scale) {
+constexpr float kWanted = 1.0F;
+
+float* new_table() {
+    return static_cast<float*>(malloc(kTableEntries * sizeof(float)));
+}
+
+// Computes the entries that are kWanted. Distances are a running sum: it drifts below the exact
+// multiples, so that entry 12000 lies just short of 3 and is not 0.
+void fill_wanted(float* table) {
+    double x = 0.0;
+    for (int32_t i = 0; i < kTableEntries; ++i, x += kStep) {
+        if (table[i] == kWanted) table[i] = static_cast<float>(kernel(x));
+    }
+}
+
+// Marks the table's entries for samples c - 3 ... c + 3 around a position with fraction `fraction`,
+// and notes them in place of the weights. A scale below 1 stretches the kernel over the samples.
+void want_taps(double* weights, float* table, double fraction, float scale) {
     for (int32_t j = 0; j < kLanczosTaps; ++j) {
         double distance = fraction + (kLanczosMargin - j);
         if (scale < 1.0F) distance *= static_cast<double>(scale);
-        weights[j] = look_up(table, distance);
+        const int32_t entry = entry_of(distance);
+        table[entry] = kWanted;
+        weights[j] = entry;
+    }
+}
+
+void fill_taps(double* weights, const float* table) {
+    for (int32_t j = 0; j < kLanczosTaps; ++j) {
+        weights[j] = static_cast<double>(table[static_cast<int32_t>(weights[j])]);
     }
     // From the smallest distance up: the order is part of the result.
     double sum = weights[kLanczosTaps - 1];
@@ -52,25 +75,29 @@ float scale_of(int32_t src, int32_t dst) {
 
 }  // namespace
 
-void LanczosWeights::fill_columns(const float* table, int32_t src_w, int32_t dst_w) {
-    const double step = static_cast<double>(src_w) / dst_w;
+void LanczosWeights::want_columns(float* table, int32_t src_w) {
+    const double step = static_cast<double>(src_w) / count_;
     double position = 0.0;
-    for (int32_t x = 0; x < dst_w; ++x, position += step) {
-        fill_taps(data_ + int64_t{x} * kLanczosTaps, table, fraction_of(position),
-                  scale_of(src_w, dst_w));
+    for (int32_t x = 0; x < count_; ++x, position += step) {
+        want_taps(data_ + int64_t{x} * kLanczosTaps, table, fraction_of(position),
+                  scale_of(src_w, count_));
     }
 }
 
-void LanczosWeights::fill_rows(const float* table, int32_t src_h, int32_t dst_h) {
-    const double step = static_cast<double>(src_h) / dst_h;
-    for (int32_t y = 0; y < dst_h; ++y) {
-        fill_taps(data_ + int64_t{y} * kLanczosTaps, table, fraction_of(step * y),
-                  scale_of(src_h, dst_h));
+void LanczosWeights::want_rows(float* table, int32_t src_h) {
+    const double step = static_cast<double>(src_h) / count_;
+    for (int32_t y = 0; y < count_; ++y) {
+        want_taps(data_ + int64_t{y} * kLanczosTaps, table, fraction_of(step * y),
+                  scale_of(src_h, count_));
     }
+}
+
+void LanczosWeights::fill(const float* table) {
+    for (int32_t i = 0; i < count_; ++i) fill_taps(data_ + int64_t{i} * kLanczosTaps, table);
 }
 
 LanczosPlan::LanczosPlan(int32_t dst_w, int32_t dst_h)
-    : columns(dst_w), rows(dst_h), table(create_lanczos_lookup()) {}
+    : columns(dst_w), rows(dst_h), table(new_table()) {}
 
 LanczosPlan::~LanczosPlan() {
     free(table);
@@ -80,21 +107,23 @@ bool LanczosPlan::ready() const {
     return columns.data() != nullptr && rows.data() != nullptr && table != nullptr;
 }
 
-void LanczosPlan::fill(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h) {
-    columns.fill_columns(table, src_w, dst_w);
-    rows.fill_rows(table, src_h, dst_h);
+// A sine takes longer than to find out that nobody wants it: most ratios use a small part of the
+// table.
+void LanczosPlan::fill(int32_t src_w, int32_t src_h) {
+    for (int32_t i = 0; i < kTableEntries; ++i) table[i] = 0.0F;
+    columns.want_columns(table, src_w);
+    rows.want_rows(table, src_h);
+    fill_wanted(table);
+    columns.fill(table);
+    rows.fill(table);
 }
 
 }  // namespace ovrin
 
-// Distances are a running sum: it drifts below the exact multiples, so that entry 12000 lies just
-// short of 3 and is not 0.
 float* create_lanczos_lookup(void) {
-    auto* table = static_cast<float*>(malloc(ovrin::kTableEntries * sizeof(float)));
+    float* table = ovrin::new_table();
     if (table == nullptr) return nullptr;
-    double x = 0.0;
-    for (int32_t i = 0; i < ovrin::kTableEntries; ++i, x += ovrin::kStep) {
-        table[i] = static_cast<float>(ovrin::kernel(x));
-    }
+    for (int32_t i = 0; i < ovrin::kTableEntries; ++i) table[i] = ovrin::kWanted;
+    ovrin::fill_wanted(table);
     return table;
 }

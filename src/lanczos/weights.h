@@ -13,7 +13,8 @@ constexpr int32_t kLanczosMargin = 3;  // taps on either side of the middle one
 class LanczosWeights {
 public:
     explicit LanczosWeights(int32_t count)
-        : data_(static_cast<double*>(
+        : count_(count),
+          data_(static_cast<double*>(
               calloc(static_cast<size_t>(count), kLanczosTaps * sizeof(double)))) {}
     ~LanczosWeights() { free(data_); }
     LanczosWeights(const LanczosWeights&) = delete;
@@ -21,12 +22,15 @@ public:
 
     const double* data() const { return data_; }
 
+    // First what an axis wants of the kernel's table, then, when that is filled, the weights.
     // Columns lie at a running sum of src / dst, rows at a multiple of it: the two round
     // differently.
-    void fill_columns(const float* table, int32_t src_w, int32_t dst_w);
-    void fill_rows(const float* table, int32_t src_h, int32_t dst_h);
+    void want_columns(float* table, int32_t src_w);
+    void want_rows(float* table, int32_t src_h);
+    void fill(const float* table);
 
 private:
+    int32_t count_;
     double* data_;
 };
 
@@ -38,11 +42,11 @@ struct LanczosPlan {
     LanczosPlan& operator=(const LanczosPlan&) = delete;
 
     bool ready() const;
-    void fill(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h);
+    void fill(int32_t src_w, int32_t src_h);
 
     LanczosWeights columns;
     LanczosWeights rows;
-    float* table;
+    float* table;  // the kernel's, where it is wanted
 };
 
 }  // namespace ovrin

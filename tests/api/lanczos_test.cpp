@@ -189,6 +189,18 @@ TEST(Lanczos, OddRatiosEqualTheDefinition) {
     }
 }
 
+// Pictures are filtered in strips of columns.
+TEST(Lanczos, WidePicturesEqualTheDefinition) {
+    Random random(34);
+    SCOPED_TRACE(random.trace());
+    for (const int32_t dst_w : {255, 256, 257, 511, 512, 513, 800}) {
+        for (const int32_t bpp : {1, 2, 3, 4, 5}) {
+            const int32_t src_w = random.pick({7, dst_w / 2, dst_w, dst_w * 3 / 2, dst_w * 4});
+            check({src_w, random.between(1, 9), dst_w, random.between(1, 9), bpp}, random);
+        }
+    }
+}
+
 TEST(Lanczos, AnyNumberOfComponents) {
     Random random(84);
     SCOPED_TRACE(random.trace());

@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
 
+#include <algorithm>
 #include <vector>
 
 #include "kernels/kernels.h"
@@ -75,9 +76,12 @@ Bytes checkerboard(int32_t w, int32_t h) {
 
 TEST_F(EngineKernels, TheSetsHaveKernelsOfTheirOwn) {
     for (const NamedKernels& set : vector_sets_) {
-        EXPECT_NE(set.kernels->lanczos_row, scalar_kernels.lanczos_row) << set.name;
+        EXPECT_NE(set.kernels->lanczos->row, scalar_kernels.lanczos->row) << set.name;
         for (int i = 0; i < 3; ++i) {
-            EXPECT_NE(set.kernels->bilinear_blend[i].both, scalar_kernels.bilinear_blend[i].both)
+            const BilinearBlend& blend = set.kernels->bilinear_blend[i];
+            EXPECT_NE(blend.across, scalar_kernels.bilinear_blend[i].across) << set.name;
+            EXPECT_NE(blend.down, scalar_kernels.bilinear_blend[i].down) << set.name;
+            EXPECT_NE(set.kernels->bilinear_copy[i].copy, scalar_kernels.bilinear_copy[i].copy)
                 << set.name;
         }
     }
@@ -116,6 +120,67 @@ TEST_F(EngineKernels, BilinearRowsOfSeveralStrips) {
     }
 }
 
+// Rows that are reused, once or often, and strips that end with or beside a vector, for reductions
+// that fit into windows of all sizes, and more.
+TEST_F(EngineKernels, BilinearAroundStripBorders) {
+    Random random(46);
+    for (const int32_t format : {2, 7, 18}) {
+        for (const int32_t dst_w : {511, 512, 513, 1023, 1024, 1041}) {
+            const int32_t src_w = random.pick({dst_w / 3, dst_w, dst_w * 3 / 2, dst_w * 3, 4000});
+            const int32_t src_h = random.between(3, 12);
+            const int32_t dst_h = random.pick({5, 13, 40});
+            const Bytes src = random.bytes(static_cast<size_t>(src_w) * 16 * 4);
+            SCOPED_TRACE(::testing::Message() << "format " << format << ", " << src_w << "x"
+                                              << src_h << " to " << dst_w << "x" << dst_h);
+            expect_alike(static_cast<size_t>(dst_w + 1) * static_cast<size_t>(dst_h + 1) * 4,
+                         [&](uint8_t* dst) {
+                             ov_bilinear_sg(src.data(), dst, src_w, src_h, dst_w, dst_h, format,
+                                            nullptr);
+                         });
+        }
+    }
+}
+
+// A band copies samples from where its tables say, in whatever order.
+TEST_F(EngineKernels, BilinearCopiesInAnyOrder) {
+    Random random(47);
+    constexpr int32_t kSrcW = 600, kSrcH = 12, kDstW = 531, kDstH = 10;
+    const GuardedBuffer<uint8_t> src(random.bytes(kSrcW * kSrcH * 4));
+    const std::vector<int32_t> weights(kDstW);
+    for (const int32_t format : {2, 7, 18}) {
+        for (const int order : {0, 1, 2, 3}) {
+            std::vector<int32_t> columns;
+            std::vector<int32_t> rows;
+            for (int32_t i = 0; i < kDstW; ++i) {
+                const int32_t orders[] = {i, kDstW - i, i ^ 1, random.between(0, kDstW)};
+                columns.push_back(orders[order]);
+                rows.push_back(random.between(0, kSrcH - 1));
+            }
+            ovrin_resize_target target = {};
+            target.src_vu_plane = target.src_u_plane = target.src_v_plane = src.data();
+            target.src_width = target.src_stride = kSrcW;
+            target.src_height = kSrcH;
+            target.format = format;
+            target.canvas_width = kDstW;
+            target.canvas_height = kDstH;
+            ovrin_bilinear_band band = {};
+            band.target = &target;
+            band.dst_w = kDstW;
+            band.dst_h = band.end_row = kDstH;
+            band.src = src.data();
+            band.format = format;
+            band.col_weight = band.row_weight = const_cast<int32_t*>(weights.data());
+            band.col_index = columns.data();
+            band.row_index = rows.data();
+            SCOPED_TRACE(::testing::Message() << "format " << format << ", order " << order);
+            expect_alike(kDstW * kDstH * 4, [&](uint8_t* dst) {
+                band.dst = dst;
+                _ov_bilinear_tp(&band);
+            });
+        }
+    }
+}
+
 TEST_F(EngineKernels, LanczosOfRandomSizes) {
     Random random(43);
     SCOPED_TRACE(random.trace());
@@ -135,6 +200,7 @@ TEST_F(EngineKernels, LanczosOnTheBoundariesOfRounding) {
         lanczos_alike(constant(20 * 10 * 4, value), 20, 10, 7, 5, 4);
     }
     const Bytes board = checkerboard(24, 12);
+    for (const int n : {1, 2, 3}) lanczos_alike(board, 24, 12, 48, 24, n);
     lanczos_alike(board, 24, 12, 48, 24, 4);
     lanczos_alike(board, 24, 12, 72, 36, 4);
     lanczos_alike(board, 24, 12, 12, 6, 4);
@@ -143,6 +209,54 @@ TEST_F(EngineKernels, LanczosOnTheBoundariesOfRounding) {
     for (int i = 0; i < 256 * 4 * 4; ++i) steps.push_back(static_cast<uint8_t>(i / 4 % 256));
     lanczos_alike(steps, 256, 4, 512, 8, 4);
     lanczos_alike(steps, 256, 4, 128, 2, 4);
+}
+
+// Strips that end with or beside a block, and source rows that serve several result rows.
+TEST_F(EngineKernels, LanczosAroundStripBorders) {
+    Random random(48);
+    for (const int32_t n : {1, 2, 3, 4}) {
+        for (const int32_t dst_w : {15, 16, 17, 255, 256, 257, 272, 513}) {
+            const int32_t src_w = random.pick({dst_w / 3, dst_w / 2, dst_w * 2, dst_w * 5});
+            const int32_t src_h = random.between(2, 20);
+            const Bytes src =
+                random.bytes(static_cast<size_t>(src_w) * static_cast<size_t>(src_h * n));
+            lanczos_alike(src, src_w, src_h, dst_w, random.pick({5, 9, 30}), n);
+        }
+    }
+}
+
+// Sums of source rows that are still held must not be taken for those of others.
+TEST_F(EngineKernels, LanczosRowsInAnyOrder) {
+    Random random(49);
+    constexpr int32_t kColumns = 37, kPixels = 90, kRows = 25, kResults = 60;
+    const Bytes src = random.bytes(kPixels * kRows * 4);
+    std::vector<double> columns;
+    for (int32_t i = 0; i < kColumns * 7; ++i) columns.push_back(random.between(-30, 60) / 250.0);
+    std::vector<std::vector<double>> weights(kResults, std::vector<double>(7));
+    std::vector<int32_t> middles;
+    for (std::vector<double>& row : weights) {
+        for (double& weight : row) weight = random.between(-30, 60) / 250.0;
+        middles.push_back(random.between(0, kRows - 1));
+    }
+    LanczosStrip strip;
+    strip.src_components = strip.dst_components = 4;
+    strip.count = kColumns;
+    strip.column_weights = columns.data();
+    for (int32_t x = 0; x < kColumns; ++x) strip.index[x] = x * (kPixels - 7) / (kColumns - 1);
+    expect_alike(kResults * kColumns * 4, [&](uint8_t* dst) {
+        const LanczosKernels& kernel = *kernels().lanczos;
+        kernel.prepare(strip);
+        for (size_t i = 0; i < kResults; ++i) {
+            LanczosRow row;
+            row.dst = dst + i * kColumns * 4;
+            row.row_weights = weights[i].data();
+            for (int32_t k = 0; k < 7; ++k) {
+                row.source_rows[k] = std::min(std::max(middles[i] - 3 + k, 0), kRows - 1);
+                row.taps[k] = src.data() + row.source_rows[k] * kPixels * 4;
+            }
+            kernel.row(strip, row);
+        }
+    });
 }
 
 TEST_F(EngineKernels, LanczosRowsWiderThanASpan) {
