@@ -60,6 +60,12 @@ elseif(CMAKE_SYSTEM_PROCESSOR MATCHES "x86_64|AMD64")
   set_source_files_properties(${avx512_sources} PROPERTIES COMPILE_OPTIONS
     "-mavx2;-mfma;-mavx512f;-mavx512bw;-mavx512dq;-mavx512vl;-mavx512vbmi")
 endif()
+set(OVRINRESIZE_KERNELS "" CACHE STRING
+  "For tests: the only kernels to use (scalar, avx2, avx512, neon); empty: the processor's best")
+if(OVRINRESIZE_KERNELS)
+  set_source_files_properties(src/kernels/select.cpp PROPERTIES COMPILE_DEFINITIONS
+    OVRIN_KERNELS="${OVRINRESIZE_KERNELS}")
+endif()
 set_target_properties(ovrinresize_objects PROPERTIES
   POSITION_INDEPENDENT_CODE ON
   CXX_VISIBILITY_PRESET hidden

@@ -47,13 +47,10 @@ void vertical(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t w
 }
 
 template <int N>
-void copy(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count) {
-    for (int32_t i = 0; i < count; ++i, dst += N) memcpy(dst, row + int64_t{N} * index[i], N);
-}
-
-template <int N>
-void copy_columns(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
-    copy<N>(dst, row, columns.index, columns.count);
+void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
+    for (int32_t i = 0; i < columns.count; ++i, dst += N) {
+        memcpy(dst, row + int64_t{N} * columns.index[i], N);
+    }
 }
 
 }  // namespace
@@ -61,10 +58,9 @@ void copy_columns(uint8_t* dst, const uint8_t* row, const BilinearColumns& colum
 const BilinearBlend bilinear_blend_scalar[3] = {
     {prepare, across<1>, down}, {prepare, across<2>, down}, {prepare, across<4>, down}};
 
-const BilinearEdges bilinear_edges_scalar[3] = {
-    {vertical<1>, copy<1>}, {vertical<2>, copy<2>}, {vertical<4>, copy<4>}};
+const BilinearEdges bilinear_edges_scalar[3] = {{vertical<1>}, {vertical<2>}, {vertical<4>}};
 
 const BilinearCopy bilinear_copy_scalar[3] = {
-    {prepare, copy_columns<1>}, {prepare, copy_columns<2>}, {prepare, copy_columns<4>}};
+    {prepare, copy<1>}, {prepare, copy<2>}, {prepare, copy<4>}};
 
 }  // namespace ovrin

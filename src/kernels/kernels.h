@@ -114,11 +114,9 @@ struct BilinearBlend {
 struct BilinearEdges {
     void (*vertical)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
                      const BilinearColumns& columns);
-    void (*copy)(uint8_t* dst, const uint8_t* row, const int32_t* index, int32_t count);
 };
 
-// The same copies for columns whose index is set and that prepare has planned: for many rows. The
-// columns may come from a caller, in any order.
+// Here prepare plans columns whose index is set, which may come from a caller, in any order.
 struct BilinearCopy {
     void (*prepare)(BilinearColumns& columns);
     void (*copy)(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns);
