@@ -85,7 +85,7 @@ OVRIN_ALWAYS_INLINE __m256i gather(const QuarterRows& rows, const QuarterPlan& p
     for (int w = 0; w < kWindows; ++w) {
         __m256i sums = quarter(load_lanes(rows.top, entry, w));
         if (kPair) sums = _mm256_add_epi8(sums, quarter(load_lanes(rows.bottom, entry, w)));
-        if (w % 4 == 0) {
+        if (kWindows > 1 && w % 4 == 0) {
             fetch_lanes(rows.next_top, entry, w);
             if (kPair) fetch_lanes(rows.next_bottom, entry, w);
         }

@@ -66,7 +66,8 @@ OVRIN_ALWAYS_INLINE uint8x16_t look_up(uint8x16_t taps, const QuarterRows& rows,
     }
 }
 
-// A cache line holds four windows, so only one fetch in four is needed for the next rows.
+// A cache line holds four windows, so only one fetch in four is needed for the next rows. Enlarging,
+// they are mostly those of now.
 template <int kWindows, bool kPair>
 OVRIN_ALWAYS_INLINE void fetch(const QuarterRows& rows, ptrdiff_t offset) {
     for (int32_t w = 0; w < kWindows; w += 4) {
@@ -82,7 +83,7 @@ OVRIN_ALWAYS_INLINE uint8x16_t gather(const QuarterRows& rows, const QuarterPlan
     const auto& offsets = *reinterpret_cast<const Offsets*>(plan.bytes + entry.masks);
     const uint8x16_t left = vld1q_u8(offsets.left);
     const uint8x16_t right = vld1q_u8(offsets.right);
-    fetch<kWindows, kPair>(rows, entry.base);
+    if (kWindows > 1) fetch<kWindows, kPair>(rows, entry.base);
     uint8x16_t taps = look_up<kFirst, kPair>(vdupq_n_u8(0), rows, left, right, entry.base);
     if constexpr (kWindows > kTableWindows) {
         // Offsets below the second table wrap to values that lie outside it.
