@@ -42,7 +42,7 @@ struct Outcome {
     std::function<bool(const Bytes&)> matches;
 };
 
-Outcome exactly(const char* name, Bytes bytes) {
+Outcome exactly(const char* name, const Bytes& bytes) {
     return {name, [bytes](const Bytes& result) { return result == bytes; }};
 }
 
