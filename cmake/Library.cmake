@@ -76,6 +76,12 @@ target_include_directories(ovrinresize_objects
 # No C++ run-time library: no exceptions, no RTTI, no guarded statics.
 target_compile_options(ovrinresize_objects PRIVATE
   -fno-exceptions -fno-rtti -fno-threadsafe-statics)
+# The same bytes wherever it is built: debug information names files by their place in the project.
+# Debug builds, and coverage with them, keep full names.
+set(OVRINRESIZE_PREFIX_MAPS
+  -ffile-prefix-map=${PROJECT_SOURCE_DIR}=. -ffile-prefix-map=${PROJECT_BINARY_DIR}=build)
+target_compile_options(ovrinresize_objects PRIVATE
+  "$<$<NOT:$<CONFIG:Debug>>:${OVRINRESIZE_PREFIX_MAPS}>")
 target_link_libraries(ovrinresize_objects PRIVATE ovrinresize_warnings ${OVRINRESIZE_THREADS})
 
 # The version script lists the functions that the public header declares, and nothing else.

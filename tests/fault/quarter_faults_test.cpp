@@ -1,14 +1,13 @@
 // SPDX-License-Identifier: Apache-2.0
-// The quarter-point formats when memory or threads are refused, and what they ask for at all.
+// What the quarter-point formats ask the system for, by size and placement, and how drivers without
+// threads behave. Each single refusal is every_entry_point_test.cpp's business.
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
 
 #include <functional>
 
-#include "reference/keep_ratio_rgba.h"
 #include "reference/nv21.h"
 #include "reference/yuv.h"
-#include "support/compare.h"
 #include "support/faults.h"
 #include "support/letterbox.h"
 #include "support/random.h"
@@ -19,7 +18,6 @@ using namespace ovrin_test;
 namespace {
 
 constexpr uint8_t kOld = 0xEE;
-constexpr Kind kMemory[] = {Kind::kMalloc, Kind::kCalloc};
 
 int allocations() {
     return faults::calls(Kind::kMalloc) + faults::calls(Kind::kCalloc);
@@ -36,12 +34,6 @@ struct Source {
     }
     reference::YuvSource planes() const { return reference::i420_source(bytes.data(), w, h); }
     reference::Nv21Source pairs() const { return reference::nv21_source(bytes.data(), w, h); }
-};
-
-// A way to fill a destination from the source: a single-threaded function or a driver.
-struct Call {
-    const char* name;
-    std::function<std::vector<uint8_t>(bool threaded)> run;
 };
 
 using Bytes = std::vector<uint8_t>;
@@ -121,126 +113,11 @@ ovrin_resize_target on_canvas(int32_t w, int32_t h) {
     return target;
 }
 
-// Calls that need a work buffer: sizes beside the grid, and every letterbox of planes.
-std::vector<Call> calls_with_work_buffer(const Source& s) {
-    return {
-        {"yuv420", [&](bool threaded) { return run_yuv420(s, 6, 333, threaded); }},
-        {"y_u_v", [&](bool threaded) { return run_y_u_v(s, 8, 333, threaded); }},
-        {"y_u_v on a canvas",
-         [&](bool threaded) { return run_y_u_v_on(s, on_canvas(8, 332), threaded); }},
-        {"nv21", [&](bool threaded) { return run_nv21(s, 6, 332, threaded); }},
-        {"y_nv", [&](bool threaded) { return run_y_nv(s, 8, 333, threaded); }},
-        {"y_nv on a canvas",
-         [&](bool threaded) { return run_y_nv_on(s, on_canvas(8, 332), threaded); }},
-    };
-}
-
-// Calls that draw into the destination itself.
-std::vector<Call> calls_in_place(const Source& s) {
-    return {
-        {"rgba on a canvas",
-         [&](bool threaded) { return run_rgba(s, on_canvas(7, 333), threaded); }},
-        {"yuv420", [&](bool threaded) { return run_yuv420(s, 8, 332, threaded); }},
-        {"y_u_v", [&](bool threaded) { return run_y_u_v(s, 8, 332, threaded); }},
-        {"nv21", [&](bool threaded) { return run_nv21(s, 8, 332, threaded); }},
-        {"y_nv", [&](bool threaded) { return run_y_nv(s, 8, 332, threaded); }},
-    };
-}
-
-std::vector<Call> all_calls(const Source& s) {
-    std::vector<Call> calls = calls_in_place(s);
-    for (const Call& call : calls_with_work_buffer(s)) calls.push_back(call);
-    return calls;
-}
-
-// Nothing may be written where nothing can be drawn; both are told from the complete picture.
 bool untouched(const Bytes& bytes) {
     return bytes == Bytes(bytes.size(), kOld);
 }
 
 }  // namespace
-
-TEST(QuarterFaults, AnyOneRefusalStillGivesTheWholePicture) {
-    const Source s(9, 1100);
-    for (const Call& call : all_calls(s)) {
-        const Bytes expected = call.run(false);
-        ASSERT_FALSE(untouched(expected));
-        for (const Kind kind : faults::kAllKinds) {
-            for (int nth = 1;; ++nth) {
-                SCOPED_TRACE(::testing::Message()
-                             << call.name << ", " << faults::name(kind) << " call " << nth);
-                faults::fail(kind, nth);
-                const Bytes actual = call.run(true);
-                const bool failed = faults::has_failed();
-                faults::reset();
-                ASSERT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()));
-                EXPECT_EQ(faults::live_blocks(), 0);
-                if (!failed) break;
-            }
-        }
-    }
-}
-
-// From some moment on there is no more memory: with a work buffer to find, the picture is complete
-// or the destination untouched; without one it is complete. (Threads are left out: a pool that can
-// start neither its workers nor the thread that would end it stays behind on purpose.)
-TEST(QuarterFaults, LastingRefusalsLeaveNothingHalfDone) {
-    const Source s(9, 1100);
-    for (const bool work_buffer : {false, true}) {
-        for (const Call& call : work_buffer ? calls_with_work_buffer(s) : calls_in_place(s)) {
-            const Bytes expected = call.run(false);
-            bool ever_untouched = false;
-            for (const Kind kind : {Kind::kMalloc, Kind::kCalloc, Kind::kMutex, Kind::kCondition}) {
-                for (int nth = 1;; ++nth) {
-                    SCOPED_TRACE(::testing::Message() << call.name << ", " << faults::name(kind)
-                                                      << " from call " << nth);
-                    faults::fail(kind, nth, true);
-                    const Bytes actual = call.run(true);
-                    const bool failed = faults::has_failed();
-                    faults::reset();
-                    if (work_buffer && untouched(actual)) {
-                        EXPECT_TRUE(kind == Kind::kMalloc || kind == Kind::kCalloc);
-                        ever_untouched = true;
-                    } else {
-                        ASSERT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()));
-                    }
-                    EXPECT_EQ(faults::live_blocks(), 0);
-                    if (!failed) break;
-                }
-            }
-            EXPECT_EQ(ever_untouched, work_buffer) << call.name;
-        }
-    }
-}
-
-TEST(QuarterFaults, WithoutItsWorkBufferTheCallingThreadTouchesNothing) {
-    const Source s(9, 40);
-    for (const Call& call : calls_with_work_buffer(s)) {
-        SCOPED_TRACE(call.name);
-        faults::reset();
-        EXPECT_FALSE(untouched(call.run(false)));
-        EXPECT_EQ(allocations(), 1);
-        EXPECT_EQ(faults::calls(Kind::kThread), 0);
-        EXPECT_EQ(faults::live_blocks(), 0);
-        const Kind used = faults::calls(Kind::kMalloc) == 1 ? Kind::kMalloc : Kind::kCalloc;
-        faults::fail(used, 1);
-        const Bytes actual = call.run(false);
-        EXPECT_TRUE(faults::has_failed());
-        faults::reset();
-        EXPECT_TRUE(untouched(actual));
-        EXPECT_EQ(faults::live_blocks(), 0);
-    }
-}
-
-TEST(QuarterFaults, InPlaceTheCallingThreadAsksForNothing) {
-    const Source s(9, 40);
-    for (const Call& call : calls_in_place(s)) {
-        SCOPED_TRACE(call.name);
-        faults::reset();
-        EXPECT_FALSE(untouched(call.run(false)));
-        for (const Kind kind : faults::kAllKinds) EXPECT_EQ(faults::calls(kind), 0);
-    }
-}
 
 // Sizes that are multiples of 4 are drawn in place, all others and all letterboxes are not.
 TEST(QuarterFaults, OnlySizesBesideTheGridNeedAWorkBuffer) {
@@ -382,32 +259,4 @@ TEST(QuarterFaults, WithoutThreadsTheSingleThreadedRulesHold) {
         faults::reset();
         EXPECT_EQ(faults::live_blocks(), 0);
     }
-}
-
-// More bands than the pool has slots, and records that run out on the way.
-TEST(QuarterFaults, ManyBandsSurviveAMissingRecord) {
-    const Source s(1, 64100);
-    const Bytes expected = run_nv21(s, 1, 32100, false);
-    for (const Kind kind : kMemory) {
-        for (const int nth : {1, 2, 3, 4, 1000, 2003}) {
-            faults::fail(kind, nth);
-            const Bytes actual = run_nv21(s, 1, 32100, true);
-            faults::reset();
-            ASSERT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()));
-            EXPECT_EQ(faults::live_blocks(), 0);
-        }
-    }
-}
-
-TEST(QuarterFaults, Rgb888AndNearestStayOnTheCallingThread) {
-    const Source s(9, 3000);
-    std::vector<uint32_t> dst(8 * 3000);
-    std::vector<uint32_t> src(s.bytes.size() / 4);
-    memcpy(src.data(), s.bytes.data(), src.size() * 4);
-    faults::reset();
-    for (const int32_t h : {1, 1023, 1024, 3000}) {
-        ovrin_resize_rgb888(s.bytes.data(), reinterpret_cast<uint8_t*>(dst.data()), 9, h, 7, 333);
-        ovrin_resize_nearest_rgba8888(src.data(), dst.data(), 9, h, 7, 333);
-    }
-    for (const Kind kind : faults::kAllKinds) EXPECT_EQ(faults::calls(kind), 0);
 }

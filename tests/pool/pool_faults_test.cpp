@@ -1,27 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
-// A pool that cannot get what it needs.
+// What a pool asks the system for.
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
 
 #include "support/faults.h"
 
 using faults::Kind;
-
-TEST(PoolFaults, EveryRefusalEndsWithoutAPoolAndWithoutALeak) {
-    for (const Kind kind : faults::kAllKinds) {
-        for (int nth = 1;; ++nth) {
-            SCOPED_TRACE(::testing::Message() << faults::name(kind) << " call " << nth);
-            faults::fail(kind, nth);
-            ovrin_threadpool* pool = ovrin_threadpool_init(4);
-            const bool failed = faults::has_failed();
-            faults::reset();
-            EXPECT_EQ(pool == nullptr, failed);
-            if (pool != nullptr) ovrin_threadpool_free(pool, 1);
-            EXPECT_EQ(faults::live_blocks(), 0);
-            if (!failed) break;
-        }
-    }
-}
 
 TEST(PoolFaults, AllThingsThatCanBeRefusedAreAskedFor) {
     faults::reset();

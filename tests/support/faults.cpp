@@ -9,7 +9,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <mutex>
-#include <unordered_set>
+#include <unordered_map>
 
 extern "C" {
 void* __real_malloc(size_t size);
@@ -33,9 +33,9 @@ std::atomic<bool> failing_later{false};
 std::atomic<bool> failed{false};
 
 std::mutex blocks_mutex;
-std::unordered_set<void*>& blocks() {
-    static auto* set = new std::unordered_set<void*>;
-    return *set;
+std::unordered_map<void*, size_t>& blocks() {  // and their sizes
+    static auto* map = new std::unordered_map<void*, size_t>;
+    return *map;
 }
 
 int index_of(faults::Kind kind) {
@@ -56,9 +56,9 @@ void ask(size_t size) {
     }
 }
 
-void* remember(void* block) {
+void* remember(void* block, size_t size) {
     const std::lock_guard<std::mutex> lock(blocks_mutex);
-    if (block != nullptr) blocks().insert(block);
+    if (block != nullptr) blocks()[block] = size;
     return block;
 }
 
@@ -76,12 +76,13 @@ void* __wrap_malloc(size_t size) {
     void* block = refuses(faults::Kind::kMalloc) ? nullptr : __real_malloc(size);
     // Whoever counts on fresh memory being zero is found out.
     if (block != nullptr) memset(block, 0xA5, size);
-    return remember(block);
+    return remember(block, size);
 }
 
 void* __wrap_calloc(size_t count, size_t size) {
     ask(count * size);
-    return refuses(faults::Kind::kCalloc) ? nullptr : remember(__real_calloc(count, size));
+    if (refuses(faults::Kind::kCalloc)) return nullptr;
+    return remember(__real_calloc(count, size), count * size);
 }
 
 void __wrap_free(void* block) {
@@ -146,6 +147,15 @@ bool has_failed() {
 int live_blocks(int seconds) {
     for (int i = 0; i < seconds * 1000 && block_count() > 0; ++i) usleep(1000);
     return block_count();
+}
+
+std::vector<void*> live_blocks_of(size_t size) {
+    const std::lock_guard<std::mutex> lock(blocks_mutex);
+    std::vector<void*> result;
+    for (const auto& [block, block_size] : blocks()) {
+        if (block_size == size) result.push_back(block);
+    }
+    return result;
 }
 
 }  // namespace faults
