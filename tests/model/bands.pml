@@ -4,8 +4,10 @@
 // ever.
 //
 // DRIVER says who may take which band:
-//     QUEUED   run_bands in src/dispatch/band_schedule.cpp: even bands first, an odd one when its
-//              neighbours are finished; whoever comes across a band claims it before running it
+//     QUEUED   run_bands in src/dispatch/band_schedule.cpp: even bands and those that share no row
+//              first, an odd one when the neighbours that it shares a row with are finished; whoever
+//              comes across a band claims it before running it, the caller those that it has
+//              released
 //     CLAIMED  the rule by itself, in any order: a thread claims any band none of whose neighbours
 //              in a shared row is running, and looks again after each band; it may leave when it
 //              finds none; the caller is one of these threads and waits for the rest. Holds for
@@ -26,6 +28,7 @@ byte workers, bands;
 
 bool shares[MAX_BANDS + 1];   /* this band and the one before it add into one row */
 bool skips_last;              /* nothing is left for the last band */
+bool released[MAX_BANDS];
 bool claimed[MAX_BANDS];
 bool running[MAX_BANDS + 1];
 bool by_worker[MAX_BANDS];    /* it is a worker that runs it */
@@ -50,7 +53,7 @@ inline end(k) {
     finished[k] = true
 }
 
-/* run_once in band_schedule.cpp */
+/* run_if_unclaimed in band_schedule.cpp */
 #ifdef BREAK_CLAIM
 inline claim(k) {
     mine = !claimed[k];       /* looks and claims in two steps */
@@ -166,65 +169,90 @@ proctype pool() {
     workers_gone = true
 }
 
-inline submit(k) {
-    if
-    :: queue ! k
 #if DRIVER == QUEUED
-    :: queue ! k; run_once(k) /* taken, and an error reported all the same */
-#endif
-#ifdef BREAK_REFUSED
-    :: true                   /* refused, and forgotten */
-#elif DRIVER == QUEUED
-    :: run_once(k)            /* refused */
-#else
-    :: run_always(k)          /* refused */
-#endif
+inline release(b) {
+    if
+    :: skips_last && b == bands - 1
+    :: else ->
+        released[b] = true;
+        if
+        :: queue ! b
+        :: true               /* refused: left to the caller */
+        fi
     fi
 }
 
-#if DRIVER == QUEUED
-inline finish(k) {
-#ifndef BREAK_REFUSED
-    run_once(k);
-#endif
-    finished[k]               /* polled */
+#define LEFT(b) (released[b] && !claimed[b])
+
+/* Chooses a band that no thread has taken into k, or MAX_BANDS. */
+inline look_for_work() {
+    atomic {
+        if
+        :: LEFT(0) -> k = 0
+        :: LEFT(1) -> k = 1
+        :: LEFT(2) -> k = 2
+        :: LEFT(3) -> k = 3
+        :: LEFT(4) -> k = 4
+        :: LEFT(5) -> k = 5
+        :: else -> k = MAX_BANDS
+        fi
+    }
 }
 
+inline help() {
+#ifndef BREAK_REFUSED
+    look_for_work();
+    if
+    :: k < MAX_BANDS -> run_once(k)
+    :: else
+    fi;
+#endif
+    k = 0
+}
+
+inline wait_for(b) {
+    do
+    :: !released[b] || finished[b] -> break
+    :: released[b] && !finished[b] -> help() /* sleeps a little when there is nothing to do */
+    od
+}
+
+#define MAY_RUN_AT_ONCE(b) ((b % 2 == 0 && b != bands - 1) || (!shares[b] && !shares[b + 1]))
+
 inline drive() {
-    byte last = bands - 1;
-    for (band : 0 .. last - 1) {
+    for (band : 0 .. bands - 1) {
         if
-        :: band % 2 == 0 -> submit(band)
+        :: MAY_RUN_AT_ONCE(band) -> release(band)
         :: else
         fi
     };
-    band = 1;
-    do
-    :: band < last ->
-#ifndef BREAK_ORDER
-        finish(band - 1);
+    for (band : 1 .. bands - 1) {
         if
-        :: band + 1 < last && shares[band + 1] -> finish(band + 1)
-        :: else
-        fi;
-#endif
-        submit(band);
-        band = band + 2
-    :: else -> break
-    od;
+        :: MAY_RUN_AT_ONCE(band)
+        :: else ->
 #ifndef BREAK_ORDER
-    finish(last - 1);
+            if
+            :: shares[band] -> wait_for(band - 1)
+            :: else
+            fi;
+            if
+            :: band + 1 < bands && shares[band + 1] -> wait_for(band + 1)
+            :: else
+            fi;
 #endif
-    if
-    :: skips_last
-    :: else -> submit(last)
-    fi;
-    for (band : 0 .. last) {
-        if
-        :: skips_last && band == last
-        :: else -> finish(band)
+            release(band)
         fi
-    }
+    };
+#ifndef BREAK_REFUSED
+    do
+    :: look_for_work();
+        if
+        :: k < MAX_BANDS -> run_once(k)
+        :: else -> break
+        fi
+    od;
+#endif
+    k = 0
 }
 #elif DRIVER == CLAIMED
 inline drive() {
@@ -255,6 +283,17 @@ inline drive() {
     }
 }
 #else
+inline submit(b) {
+    if
+    :: queue ! b
+#ifdef BREAK_REFUSED
+    :: true                   /* refused, and forgotten */
+#else
+    :: run_always(b)          /* refused */
+#endif
+    fi
+}
+
 inline drive() {
     for (band : 0 .. bands - 1) { submit(band) };
     do
