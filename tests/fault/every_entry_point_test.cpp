@@ -33,7 +33,7 @@ using Names = std::set<std::string>;
 
 constexpr uint8_t kOld = 0xEE;
 constexpr int32_t kSrcW = 9;
-constexpr int32_t kTall = 1100;  // rows: threaded
+constexpr int32_t kTall = 1100;  // rows: in bands where the picture is wide enough
 constexpr int32_t kLow = 60;     // rows: on the calling thread
 
 // What a call may leave behind, by name. "whole" is what it gives when nothing is refused.
@@ -300,6 +300,27 @@ Bytes lanczos_band_task() {
     });
 }
 
+// Large enough for the wrappers to use threads.
+const uint8_t* wide_source() {
+    static const Bytes bytes = [] {
+        Bytes wide(bytes_of(int64_t{17000} * kTall * 3 / 2));
+        for (size_t i = 0; i < wide.size(); ++i) wide[i] = static_cast<uint8_t>(i ^ (i >> 9));
+        return wide;
+    }();
+    return bytes.data();
+}
+
+Bytes wide_rgba() {
+    return drawn(7 * 333 * 4, [](uint8_t* dst) {
+        ovrin_resize_rgba8888(wide_source(), words(dst), 6350, kTall, 7, 333);
+    });
+}
+
+Bytes wide_nv21() {
+    return drawn(reference::nv21_size(8, 332),
+                 [](uint8_t* dst) { ovrin_resize_nv21(wide_source(), dst, 17000, kTall, 8, 332); });
+}
+
 // ---- Engines --------------------------------------------------------------------------------
 
 using Bilinear = decltype(ov_bilinear_sg);
@@ -531,12 +552,13 @@ void add_rgba(std::vector<Way>& ways) {
     ways.insert(
         ways.end(),
         {{"ovrin_resize_rgba8888", "low", kAsksForNothing, rgba(ovrin_resize_rgba8888, kLow)},
-         {"ovrin_resize_rgba8888", "tall", kAlwaysWhole, rgba(ovrin_resize_rgba8888, kTall)},
+         {"ovrin_resize_rgba8888", "tall", kAsksForNothing, rgba(ovrin_resize_rgba8888, kTall)},
+         {"ovrin_resize_rgba8888", "wide", kAlwaysWhole, wide_rgba},
          {"ovrin_resize_rgba8888_sg", "", kAsksForNothing, rgba(ovrin_resize_rgba8888_sg, kTall)},
          {"ovrin_resize_rgba8888_tps", "", kAlwaysWhole, rgba(ovrin_resize_rgba8888_tps, kTall)},
          {"ovrin_resize_rgba8888_keep_ratio", "low", kAsksForNothing,
           rgba_on_canvas(ovrin_resize_rgba8888_keep_ratio, kLow)},
-         {"ovrin_resize_rgba8888_keep_ratio", "tall", kAlwaysWhole,
+         {"ovrin_resize_rgba8888_keep_ratio", "tall", kAsksForNothing,
           rgba_on_canvas(ovrin_resize_rgba8888_keep_ratio, kTall)},
          {"ovrin_resize_rgba_keep_ratio_sg", "", kAsksForNothing,
           rgba_on_canvas(ovrin_resize_rgba_keep_ratio_sg, kTall)},
@@ -581,9 +603,9 @@ void add_planar(std::vector<Way>& ways) {
           contiguous(ovrin_resize_yuv420, kLow, 8, 332)},
          {"ovrin_resize_yuv420", "low, off the grid", buffer,
           contiguous(ovrin_resize_yuv420, kLow, 6, 333)},
-         {"ovrin_resize_yuv420", "tall", kAlwaysWhole,
+         {"ovrin_resize_yuv420", "tall", kAsksForNothing,
           contiguous(ovrin_resize_yuv420, kTall, 8, 332)},
-         {"ovrin_resize_yuv420", "tall, off the grid", kWholeOrUntouched,
+         {"ovrin_resize_yuv420", "tall, off the grid", buffer,
           contiguous(ovrin_resize_yuv420, kTall, 6, 333)},
          {"ovrin_resize_yuv420_sg", "", kAsksForNothing,
           contiguous(ovrin_resize_yuv420_sg, kTall, 8, 332)},
@@ -594,12 +616,10 @@ void add_planar(std::vector<Way>& ways) {
          {"ovrin_resize_yuv420_tps", "off the grid", kWholeOrUntouched,
           contiguous(ovrin_resize_yuv420_tps, kTall, 6, 333)},
          {"ovrin_resize_y_u_v", "low", kAsksForNothing, planar(y_u_v, kLow, 8, 332)},
-         {"ovrin_resize_y_u_v", "tall", kAlwaysWhole, planar(y_u_v, kTall, 8, 332)},
-         {"ovrin_resize_y_u_v", "tall, off the grid", kWholeOrUntouched,
-          planar(y_u_v, kTall, 6, 333)},
+         {"ovrin_resize_y_u_v", "tall", kAsksForNothing, planar(y_u_v, kTall, 8, 332)},
+         {"ovrin_resize_y_u_v", "tall, off the grid", buffer, planar(y_u_v, kTall, 6, 333)},
          {"ovrin_resize_y_u_v_keep_ratio", "low", buffer, on_canvas(y_u_v_keep_ratio, kLow)},
-         {"ovrin_resize_y_u_v_keep_ratio", "tall", kWholeOrUntouched,
-          on_canvas(y_u_v_keep_ratio, kTall)},
+         {"ovrin_resize_y_u_v_keep_ratio", "tall", buffer, on_canvas(y_u_v_keep_ratio, kTall)},
          {"ovrin_resize_y_u_v_sg", "", kAsksForNothing,
           planar(ovrin_resize_y_u_v_sg, kTall, 8, 332)},
          {"ovrin_resize_y_u_v_sg", "off the grid", buffer,
@@ -628,9 +648,11 @@ void add_nv21(std::vector<Way>& ways) {
         {{"ovrin_resize_nv21", "low", kAsksForNothing, contiguous(ovrin_resize_nv21, kLow, 8, 332)},
          {"ovrin_resize_nv21", "low, off the grid", buffer,
           contiguous(ovrin_resize_nv21, kLow, 6, 333)},
-         {"ovrin_resize_nv21", "tall", kAlwaysWhole, contiguous(ovrin_resize_nv21, kTall, 8, 332)},
-         {"ovrin_resize_nv21", "tall, off the grid", kWholeOrUntouched,
+         {"ovrin_resize_nv21", "tall", kAsksForNothing,
+          contiguous(ovrin_resize_nv21, kTall, 8, 332)},
+         {"ovrin_resize_nv21", "tall, off the grid", buffer,
           contiguous(ovrin_resize_nv21, kTall, 6, 333)},
+         {"ovrin_resize_nv21", "wide", kAlwaysWhole, wide_nv21},
          {"ovrin_resize_nv21_sg", "", kAsksForNothing,
           contiguous(ovrin_resize_nv21_sg, kTall, 8, 332)},
          {"ovrin_resize_nv21_sg", "off the grid", buffer,
@@ -646,12 +668,10 @@ void add_nv21(std::vector<Way>& ways) {
               });
           }},
          {"ovrin_resize_y_nv21", "low", kAsksForNothing, semi_planar(y_nv, kLow, 8, 332)},
-         {"ovrin_resize_y_nv21", "tall", kAlwaysWhole, semi_planar(y_nv, kTall, 8, 332)},
-         {"ovrin_resize_y_nv21", "tall, off the grid", kWholeOrUntouched,
-          semi_planar(y_nv, kTall, 6, 333)},
+         {"ovrin_resize_y_nv21", "tall", kAsksForNothing, semi_planar(y_nv, kTall, 8, 332)},
+         {"ovrin_resize_y_nv21", "tall, off the grid", buffer, semi_planar(y_nv, kTall, 6, 333)},
          {"ovrin_resize_y_nv21_keep_ratio", "low", buffer, on_canvas(y_nv_keep_ratio, kLow)},
-         {"ovrin_resize_y_nv21_keep_ratio", "tall", kWholeOrUntouched,
-          on_canvas(y_nv_keep_ratio, kTall)},
+         {"ovrin_resize_y_nv21_keep_ratio", "tall", buffer, on_canvas(y_nv_keep_ratio, kTall)},
          {"ovrin_resize_y_nv_sg", "", kAsksForNothing,
           semi_planar(ovrin_resize_y_nv_sg, kTall, 8, 332)},
          {"ovrin_resize_y_nv_sg", "off the grid", buffer,
