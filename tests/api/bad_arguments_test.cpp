@@ -23,14 +23,12 @@
 using namespace ovrin_test;
 
 // Memory for the largest numbers is refused, as it is without a sanitizer, which would stop here.
-// NOLINTBEGIN(bugprone-reserved-identifier,cert-dcl37-c,cert-dcl51-cpp)
 extern "C" const char* __asan_default_options() {
     return "allocator_may_return_null=1";
 }
 extern "C" const char* __tsan_default_options() {
     return "allocator_may_return_null=1";
 }
-// NOLINTEND(bugprone-reserved-identifier,cert-dcl37-c,cert-dcl51-cpp)
 
 namespace {
 
