@@ -12,6 +12,10 @@
  *    Pointers are not checked for null unless the comment says that they are.
  *  - Every function may be called from any number of threads at once, on different buffers. The
  *    library has no global state; nothing that a call makes outlives the call.
+ *  - Sizes are not compared with anything: a picture must lie in its buffer whole, as its sizes and
+ *    its row length say. A size of 0 or less means that there is no picture and no buffer.
+ *  - A band record must hold what a walk from the first band or a driver would give it. Its source
+ *    height and its band_rows, each times the destination height, must fit 32 bits.
  *  - No byte outside the stated pictures is read or written. Buffers need no alignment beyond
  *    that of their type.
  */

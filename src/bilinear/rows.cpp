@@ -174,11 +174,13 @@ void blend_plane(const Plane& plane, const BilinearAxes& axes, const BilinearExt
 
 void blend_rows(const BilinearGeometry& geometry, const BilinearAxes& axes,
                 const BilinearExtent& extent) {
+    if (extent.columns < 1 || extent.rows < 1) return;
     for_each_plane(geometry, [&](const Plane& plane) { blend_plane(plane, axes, extent); });
 }
 
 void copy_rows(const BilinearGeometry& geometry, const BilinearAxes& axes, int32_t columns,
                int32_t first_row, int32_t end_row) {
+    if (columns < 1 || first_row >= end_row) return;
     for_each_plane(geometry, [&](const Plane& plane) {
         const BilinearCopy& copy = kernels().bilinear_copy[plane.sample_bytes >> 1];
         const auto strip = [&](BilinearColumns& s, int32_t first) {

@@ -63,7 +63,7 @@ enum class Outcome { kDone, kUseSingleThread };
 Outcome resize_on(ovrin_threadpool* pool, const BilinearCall& call,
                   const BilinearGeometry& geometry, int32_t count, int32_t height) {
     BilinearTables tables(call.dst_w, call.dst_h);
-    if (!is_supported(geometry) || !tables.ready()) {
+    if (!tables.ready()) {
         ovrin_threadpool_free(pool, 1);
         return Outcome::kDone;
     }
@@ -88,6 +88,7 @@ Outcome resize_in_bands(const BilinearCall& call) {
     const int32_t count = band_count(call.dst_h, height);
     if (count < 2 || call.dst_h < kThreadedRows) return Outcome::kUseSingleThread;
     const BilinearGeometry geometry = geometry_of(call);
+    if (!is_supported(geometry)) return Outcome::kDone;
     // A band record holds the source's row length in 32 bits.
     if (src_row_bytes(geometry) > INT32_MAX) return Outcome::kUseSingleThread;
     ovrin_threadpool* pool = ovrin_threadpool_init(kBandThreads);

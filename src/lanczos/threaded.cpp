@@ -82,6 +82,8 @@ using namespace ovrin;
 void _resize_lanczos_tp(void* band) {
     const auto& record = *static_cast<const ovrin_lanczos_band*>(band);
     if (record.dst == nullptr || record.src == nullptr || record.table == nullptr) return;
+    if (record.src_w < 1 || record.src_h < 1 || record.dst_w < 1 || record.dst_h < 1) return;
+    if (record.bytes_per_pixel < 1 || record.rows < 1) return;
     const ptrdiff_t pixel = record.bytes_per_pixel;
     const LanczosRows picture = {record.src,
                                  record.src_w,

@@ -51,6 +51,8 @@ void ov_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst, 
 void ov_lanczos_nv(const uint8_t* src, int32_t src_w, int32_t src_h, uint8_t* dst, int32_t dst_w,
                    int32_t dst_h) {
     if (src == nullptr || dst == nullptr) return;
+    // Otherwise the second planes would lie nowhere.
+    if (src_w < 1 || src_h < 1 || dst_w < 1 || dst_h < 1) return;
     ov_lanczos(src, src_w, src_h, dst, dst_w, dst_h, 1);
     ov_lanczos(src + int64_t{src_w} * src_h, src_w, src_h, dst + int64_t{dst_w} * dst_h, dst_w,
                dst_h, 2);

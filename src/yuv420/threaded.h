@@ -90,8 +90,8 @@ template <class Format>
 bool resize_yuv420_in_bands(const Yuv420Source& source, const BandDestination& to) {
     const BandSplit split = split_into_bands(source.height, to.height);
     if (split.count < 2) return false;
-    // Nothing is sampled from a source without columns.
-    if (source.width < 1 && to.target == nullptr) return false;
+    // There is nothing to sample, however many rows there are to walk.
+    if (to.target == nullptr && source.width < 1) return false;
     const Yuv420Layout picture = {source.chroma, to.width, to.height};
     if (picture.is_empty() && to.target != nullptr) {
         paint_canvas(source.chroma, *to.target);

@@ -1,0 +1,78 @@
+#!/usr/bin/env bash
+# SPDX-License-Identifier: Apache-2.0
+# run.sh BUILD (quick | SECONDS | xN | -runs=N) [FUZZER...]: runs the fuzzers of the preset BUILD one
+# after another and prints what they did.
+#
+#   quick      a fixed number of runs from the repository's corpus, with a fixed seed
+#   xN         N times as many, with any seed, from that corpus and what earlier runs have added to it
+#   SECONDS    so long for each fuzzer
+#   -runs=N    so many for each fuzzer
+#
+# What they find is kept: new corpus in build/fuzzing/corpus, crashes in build/fuzzing/crashes.
+set -euo pipefail
+cd "$(dirname "${BASH_SOURCE[0]}")/.."
+
+fuzzers=(packed canvas planar semi_planar nearest bilinear bilinear_bands lanczos lanczos_bands
+    walkers tasks drivers pool)
+# Runs of a quick check: about as long for each but those with threads, or a tenth of that under
+# sanitizers.
+declare -A quick=([packed]=100000 [canvas]=100000 [planar]=80000 [semi_planar]=100000
+    [nearest]=150000 [bilinear]=40000 [bilinear_bands]=50000 [lanczos]=1000 [lanczos_bands]=150000
+    [walkers]=40000 [tasks]=100000 [drivers]=500 [pool]=40000)
+
+work=build/fuzzing
+build=$1
+amount=$2
+shift 2
+(($# == 0)) || fuzzers=("$@")
+
+export ASAN_OPTIONS=halt_on_error=1:detect_leaks=1:detect_stack_use_after_return=1
+export UBSAN_OPTIONS=halt_on_error=1:print_stacktrace=1
+
+# What libFuzzer is told about how long to run.
+limits() {
+    local runs=${quick[$1]}
+    [[ $build != *asan ]] || runs=$((runs / 10))
+    case $amount in
+        quick) echo "-runs=$runs -seed=1" ;;
+        x*) echo "-runs=$((runs * ${amount#x}))" ;;
+        -runs=*) echo "$amount" ;;
+        *) echo "-max_total_time=$amount" ;;
+    esac
+}
+
+# The last number on the line of a statistic.
+statistic() {
+    sed -n "s/^stat::$1: *//p" "$2"
+}
+
+# A quick check starts from the repository's corpus alone, so that it repeats.
+corpus_of() {
+    local grown=$work/corpus/$1
+    if [[ $amount == quick ]]; then
+        grown=$work/quick/$1
+        rm -rf "$grown"
+    fi
+    mkdir -p "$grown"
+    echo "$grown fuzz/corpus/$1"
+}
+
+total=0
+mkdir -p "$work/crashes" "$work/logs"
+printf '%-16s %12s %10s %8s\n' "$build" executions per-second corpus
+for name in "${fuzzers[@]}"; do
+    log=$work/logs/$build-$name.log
+    corpora=$(corpus_of "$name")
+    # shellcheck disable=SC2046,SC2086 # lists
+    if ! "build/$build/fuzz/fuzz_$name" -max_len=96 -len_control=0 -timeout=60 -print_final_stats=1 -verbosity=1 \
+        -artifact_prefix="$work/crashes/$name-" $(limits "$name") $corpora >"$log" 2>&1; then
+        tail -n 40 "$log"
+        echo "$name failed; what it was given lies in $work/crashes, its log is $log"
+        exit 1
+    fi
+    runs=$(statistic number_of_executed_units "$log")
+    total=$((total + runs))
+    printf '%-16s %12d %10d %8d\n' "$name" "$runs" "$(statistic average_exec_per_sec "$log")" \
+        "$(find "${corpora%% *}" -type f | wc -l)"
+done
+printf '%-16s %12d\n' total "$total"

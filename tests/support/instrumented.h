@@ -1,0 +1,13 @@
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+namespace ovrin_test {
+
+// Compiled with a sanitizer, which takes memory and stack of its own.
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+constexpr bool kInstrumented = true;
+#else
+constexpr bool kInstrumented = false;
+#endif
+
+}  // namespace ovrin_test
