@@ -101,15 +101,15 @@ TEST(ExhaustivePositions, BilinearTablesEqualTheDefinition) {
 TEST(ExhaustivePositions, LanczosWeightsEqualTheDefinition) {
     const std::vector<float> table = reference::lanczos_table();
     every_pair([&](int32_t from, int32_t to) {
-        ovrin::LanczosWeights columns(to);
-        ovrin::LanczosWeights rows(to);
-        columns.fill_columns(table.data(), from, to);
-        rows.fill_rows(table.data(), from, to);
+        ovrin::LanczosPlan plan(to, to);
+        ASSERT_TRUE(plan.ready());
+        plan.fill(from, from);
         const size_t bytes = static_cast<size_t>(to) * sizeof(reference::LanczosTaps);
         const auto across = reference::lanczos_columns(table, from, to);
         const auto down = reference::lanczos_rows(table, from, to);
-        ASSERT_EQ(memcmp(columns.data(), across.taps.data(), bytes), 0) << from << " to " << to;
-        ASSERT_EQ(memcmp(rows.data(), down.taps.data(), bytes), 0) << from << " to " << to;
+        ASSERT_EQ(memcmp(plan.columns.data(), across.taps.data(), bytes), 0)
+            << from << " to " << to;
+        ASSERT_EQ(memcmp(plan.rows.data(), down.taps.data(), bytes), 0) << from << " to " << to;
     });
 }
 
