@@ -20,6 +20,13 @@ struct LanesEntry {
     int32_t low;  // first bytes of the lanes' windows within a row
     int32_t high;
     int32_t masks;  // where in the plan lie, for each window, the masks of the left and right taps
+
+    bool move(int64_t bytes, int32_t last_base) {
+        if (low + bytes > last_base || high + bytes > last_base) return false;
+        low += static_cast<int32_t>(bytes);
+        high += static_cast<int32_t>(bytes);
+        return true;
+    }
 };
 
 constexpr int32_t mask_bytes(int32_t windows) {
@@ -166,7 +173,7 @@ const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShap
     plan.vector_samples = 2 * lane.samples;
     plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
     plan_vectors<LanesEntry>(
-        plan, columns, samples, mask_bytes(lane.windows),
+        plan, shape, columns, samples, lane.windows * kLane, mask_bytes(lane.windows),
         [&](uint8_t* masks, LanesEntry& entry, const Tap* taps, int32_t count) {
             encode(masks, entry, taps, count, plan, lane.windows);
         });

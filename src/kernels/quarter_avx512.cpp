@@ -18,6 +18,12 @@ constexpr int32_t kMostWindows = 4;
 struct VectorEntry {
     int32_t base;   // first byte of the windows within a row
     int32_t masks;  // where its Offsets lie in the plan
+
+    bool move(int64_t bytes, int32_t last_base) {
+        if (base + bytes > last_base) return false;
+        base += static_cast<int32_t>(bytes);
+        return true;
+    }
 };
 
 // Offsets of the taps from the start of the windows. A permutation looks at seven bits of them; the
@@ -133,7 +139,8 @@ const QuarterKernels& plan_quarters_avx512(QuarterPlan& plan, const QuarterRowSh
     plan.vector_samples = vector.samples;
     plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
     plan_vectors<VectorEntry>(
-        plan, columns, samples, static_cast<int32_t>(sizeof(Offsets)),
+        plan, shape, columns, samples, vector.windows * kVector,
+        static_cast<int32_t>(sizeof(Offsets)),
         [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
             encode(masks, entry, taps, count, plan, vector.windows);
         });

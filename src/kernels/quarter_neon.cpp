@@ -19,6 +19,12 @@ constexpr int32_t kMostWindows = 8;
 struct VectorEntry {
     int32_t base;   // first byte of the windows within a row
     int32_t masks;  // where its Offsets lie in the plan
+
+    bool move(int64_t bytes, int32_t last_base) {
+        if (base + bytes > last_base) return false;
+        base += static_cast<int32_t>(bytes);
+        return true;
+    }
 };
 
 // Offsets of the taps from the start of the windows.
@@ -66,8 +72,8 @@ OVRIN_ALWAYS_INLINE uint8x16_t look_up(uint8x16_t taps, const QuarterRows& rows,
     }
 }
 
-// A cache line holds four windows, so only one fetch in four is needed for the next rows. Enlarging,
-// they are mostly those of now.
+// A cache line holds four windows, so only one fetch in four is needed for the next rows.
+// Enlarging, they are mostly those of now.
 template <int kWindows, bool kPair>
 OVRIN_ALWAYS_INLINE void fetch(const QuarterRows& rows, ptrdiff_t offset) {
     for (int32_t w = 0; w < kWindows; w += 4) {
@@ -160,7 +166,8 @@ const QuarterKernels& plan_quarters_neon(QuarterPlan& plan, const QuarterRowShap
     plan.vector_samples = vector.samples;
     plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
     plan_vectors<VectorEntry>(
-        plan, columns, samples, static_cast<int32_t>(sizeof(Offsets)),
+        plan, shape, columns, samples, vector.windows * kVector,
+        static_cast<int32_t>(sizeof(Offsets)),
         [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
             encode(masks, entry, taps, count, plan, vector.windows);
         });

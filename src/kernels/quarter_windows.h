@@ -38,9 +38,11 @@ int32_t windows_needed(const QuarterRowShape& shape, int32_t samples, int32_t wi
 }
 
 // As many samples in a vector as the windows allow: half and a quarter of a vector still beat
-// samples one by one.
+// samples one by one. Of many samples only a multiple of four: simple ratios then repeat from
+// vector to vector.
 WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes, int32_t most) {
     int32_t samples = vector_bytes / shape.sample_bytes;
+    if (samples > 16) samples -= samples % 4;
     for (int32_t halvings = 0; halvings < 4 && samples > 1; ++halvings, samples /= 2) {
         const int32_t windows = windows_needed(shape, samples, vector_bytes, most);
         if (windows > 0) return {samples, windows};
@@ -76,16 +78,26 @@ void locate_taps(WindowTaps& window, const Tap* taps, int32_t count, const Quart
     }
 }
 
+// Source cells from one vector's taps to the next one's, where all vectors have the same taps but
+// for that; 0 where they have not.
+int64_t repeating_cells(const QuarterRowShape& shape, int32_t samples) {
+    const int64_t points = int64_t{samples} * shape.source_extent;
+    return points % shape.target_extent == 0 ? points / shape.target_extent : 0;
+}
+
 // Plans vectors until the samples or the storage end. Entries, one for each vector, grow from the
 // front of the storage, blocks of `mask_bytes` from its back. Simple ratios repeat: as long as they
 // do, vectors share one block, which stays in the cache and leaves room for longer strips.
 //
 // encode(masks, entry, taps, count) writes the masks of the vector with these taps, and all of its
-// entry but where the masks are.
+// entry but where the masks are. An entry's move(bytes, last_base) moves its windows on; false, and
+// nothing is moved, when one would begin behind last_base.
 template <class Entry, class Encode>
-void plan_vectors(QuarterPlan& plan, QuarterColumns& columns, int32_t samples, int32_t mask_bytes,
-                  const Encode& encode) {
+void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumns& columns,
+                  int32_t samples, int32_t span, int32_t mask_bytes, const Encode& encode) {
     constexpr int32_t kEntryBytes = static_cast<int32_t>(sizeof(Entry));
+    const int64_t cells = repeating_cells(shape, plan.vector_samples);
+    const auto last_base = static_cast<int32_t>(plan.row_bytes - span);
     auto* entry = reinterpret_cast<Entry*>(plan.bytes);
     int32_t masks = kPlanBytes;
     int32_t room = kPlanBytes;
@@ -94,12 +106,20 @@ void plan_vectors(QuarterPlan& plan, QuarterColumns& columns, int32_t samples, i
         if (room < mask_bytes) return;
         const int32_t rest = samples - plan.samples;
         const int32_t count = rest < plan.vector_samples ? rest : plan.vector_samples;
+        if (cells > 0 && plan.samples > 0 && count == plan.vector_samples) {
+            *entry = entry[-1];
+            if (entry->move(cells * plan.sample_bytes, last_base)) {
+                columns.skip_cells(cells);
+                plan.samples += count;
+                continue;
+            }
+        }
         Tap taps[64];
         for (int32_t i = 0; i < count; ++i) taps[i] = columns.next();
         uint8_t* block = plan.bytes + masks - mask_bytes;
         encode(block, *entry, taps, count);
-        const bool repeats =
-            masks < kPlanBytes && memcmp(block, plan.bytes + masks, size_t(mask_bytes)) == 0;
+        const bool repeats = masks < kPlanBytes && memcmp(block, plan.bytes + masks,
+                                                          static_cast<size_t>(mask_bytes)) == 0;
         if (!repeats) {
             masks -= mask_bytes;
             room -= mask_bytes;

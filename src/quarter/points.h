@@ -36,6 +36,9 @@ public:
         rest_ = static_cast<int32_t>(carry ? rest - target_ : rest);
     }
 
+    // To a later target whose point lies a whole number of cells further on.
+    void skip_cells(int64_t cells) { cell_ += cells; }
+
 private:
     int64_t cell_ = INT64_MAX;
     int32_t rest_ = 0;
@@ -60,6 +63,11 @@ struct QuarterColumns {
         left.next();
         right.next();
         return tap;
+    }
+
+    void skip_cells(int64_t cells) {
+        left.skip_cells(cells);
+        right.skip_cells(cells);
     }
 };
 

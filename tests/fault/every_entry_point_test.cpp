@@ -303,7 +303,7 @@ Bytes lanczos_band_task() {
 // Large enough for the wrappers to use threads.
 const uint8_t* wide_source() {
     static const Bytes bytes = [] {
-        Bytes wide(bytes_of(int64_t{17000} * kTall * 3 / 2));
+        Bytes wide(bytes_of(int64_t{21600} * kTall * 3 / 2));
         for (size_t i = 0; i < wide.size(); ++i) wide[i] = static_cast<uint8_t>(i ^ (i >> 9));
         return wide;
     }();
@@ -312,13 +312,13 @@ const uint8_t* wide_source() {
 
 Bytes wide_rgba() {
     return drawn(7 * 333 * 4, [](uint8_t* dst) {
-        ovrin_resize_rgba8888(wide_source(), words(dst), 6350, kTall, 7, 333);
+        ovrin_resize_rgba8888(wide_source(), words(dst), 8000, kTall, 7, 333);
     });
 }
 
 Bytes wide_nv21() {
     return drawn(reference::nv21_size(8, 332),
-                 [](uint8_t* dst) { ovrin_resize_nv21(wide_source(), dst, 17000, kTall, 8, 332); });
+                 [](uint8_t* dst) { ovrin_resize_nv21(wide_source(), dst, 21600, kTall, 8, 332); });
 }
 
 // ---- Engines --------------------------------------------------------------------------------

@@ -191,7 +191,7 @@ TEST(QuarterFaults, DriversMakeThreadsForTwoBandsOrMore) {
 
 // Wide enough that sampling every row takes longer than starting threads, or far from it.
 TEST(QuarterFaults, WrappersMakeThreadsFrom1024RowsWhereThatPays) {
-    constexpr int32_t kWide = 11200, kNarrow = 9;
+    constexpr int32_t kWide = 14400, kNarrow = 9;
     const std::vector<uint8_t> source(static_cast<size_t>(kWide) * 1025 * 4);
     const uint8_t* src = source.data();
     std::vector<uint32_t> words(40 * 1030);
