@@ -121,6 +121,9 @@ uint8x16_t first_bytes(int32_t count) {
     return vcltq_u8(index, vdupq_n_u8(static_cast<uint8_t>(count)));
 }
 
+// Registers hold two vectors with the tables of this many windows.
+constexpr int32_t kMostWindowsOfTwo = 5;
+
 // Whole vectors are stored as long as they end inside the strip: what lies behind the samples of
 // one is stored by the next. Two at a time, before either is stored: in-order processors would
 // otherwise wait for the end of one before they begin the other.
@@ -135,12 +138,15 @@ void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& pla
         const uint8x16_t samples = gather<kWindows, kPair>(rows, plan, at);
         return kAdd ? vandq_u8(samples, kept) : samples;
     };
-    for (; rest >= step + kVector; rest -= 2 * step, dst += 2 * step, entry += 2) {
-        const uint8x16_t first = vector(entry[0]);
-        const uint8x16_t second = vector(entry[1]);
-        put<kAdd>(dst, first);
-        put<kAdd>(dst + step, second);
+    if constexpr (kWindows <= kMostWindowsOfTwo) {
+        for (; rest >= step + kVector; rest -= 2 * step, dst += 2 * step, entry += 2) {
+            const uint8x16_t first = vector(entry[0]);
+            const uint8x16_t second = vector(entry[1]);
+            put<kAdd>(dst, first);
+            put<kAdd>(dst + step, second);
+        }
     }
+    for (; rest >= kVector; rest -= step, dst += step, ++entry) put<kAdd>(dst, vector(*entry));
     for (; rest > 0; rest -= step, dst += step, ++entry) {
         put_part<kAdd>(dst, vector(*entry), rest < step ? rest : step);
     }
