@@ -5,6 +5,7 @@
 #include <ovrinresize.h>
 
 #include <algorithm>
+#include <memory>
 #include <vector>
 
 #include "kernels/kernels.h"
@@ -177,6 +178,31 @@ TEST_F(EngineKernels, BilinearCopiesInAnyOrder) {
                 band.dst = dst;
                 _ov_bilinear_tp(&band);
             });
+        }
+    }
+}
+
+// Windows of every width, and ratios beyond them; nothing behind the last sample is there to read.
+TEST_F(EngineKernels, BilinearCopiesOfEveryReduction) {
+    Random random(48);
+    auto columns = std::make_unique<BilinearColumns>();
+    for (const NamedKernels& set : vector_sets_) {
+        for (int32_t quarters = 1; quarters <= 48; ++quarters) {
+            for (const int32_t n : {1, 2, 4}) {
+                columns->count = random.between(60, kBilinearColumns);
+                for (int32_t i = 0; i < columns->count; ++i) columns->index[i] = i * quarters / 4;
+                const int32_t samples = columns->index[columns->count - 1] + 1;
+                const GuardedBuffer<uint8_t> row(random.bytes(static_cast<size_t>(samples * n)));
+                Bytes expected(static_cast<size_t>(columns->count * n));
+                GuardedBuffer<uint8_t> actual(expected.size(), Flush::kEnd, 0xEE);
+                scalar_kernels.bilinear_copy[n >> 1].copy(expected.data(), row.data(), *columns);
+                const BilinearCopy& copy = set.kernels->bilinear_copy[n >> 1];
+                copy.prepare(*columns);
+                copy.copy(actual.data(), row.data(), *columns);
+                ASSERT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()))
+                    << set.name << ", " << n << " bytes, ratio " << quarters << "/4";
+                ASSERT_TRUE(actual.intact());
+            }
         }
     }
 }
