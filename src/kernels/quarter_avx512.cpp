@@ -14,34 +14,6 @@ namespace {
 constexpr int32_t kVector = 64;
 constexpr int32_t kMostWindows = 4;
 
-// Storage of a plan, for every target vector.
-struct VectorEntry {
-    int32_t base;   // first byte of the windows within a row
-    int32_t masks;  // where its Offsets lie in the plan
-
-    bool move(int64_t bytes, int32_t last_base) {
-        if (base + bytes > last_base) return false;
-        base += static_cast<int32_t>(bytes);
-        return true;
-    }
-};
-
-// Offsets of the taps from the start of the windows. A permutation looks at seven bits of them; the
-// eighth says which of two pairs of windows it is meant for.
-struct Offsets {
-    alignas(kVector) uint8_t left[kVector];
-    uint8_t right[kVector];
-};
-
-void encode(uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count,
-            const QuarterPlan& plan, int32_t windows) {
-    WindowTaps window;
-    locate_taps(window, taps, count, plan, windows * kVector);
-    memcpy(masks, window.left, kVector);
-    memcpy(masks + kVector, window.right, kVector);
-    entry.base = window.base;
-}
-
 __m512i quarter(__m512i samples) {
     return _mm512_and_si512(_mm512_srli_epi16(samples, 2), _mm512_set1_epi8(0x3F));
 }
@@ -66,7 +38,7 @@ __m512i permute(__m512i offsets, __m512i window) {
 template <int kWindows, bool kPair>
 OVRIN_ALWAYS_INLINE __m512i gather(const QuarterRows& rows, const QuarterPlan& plan,
                                    VectorEntry entry) {
-    const auto& offsets = *reinterpret_cast<const Offsets*>(plan.bytes + entry.masks);
+    const auto& offsets = *reinterpret_cast<const Offsets<kVector>*>(plan.bytes + entry.masks);
     const __m512i left = _mm512_load_si512(offsets.left);
     const __m512i right = _mm512_load_si512(offsets.right);
     const auto window = [&](int32_t w) {
@@ -80,6 +52,8 @@ OVRIN_ALWAYS_INLINE __m512i gather(const QuarterRows& rows, const QuarterPlan& p
     __m512i left_taps = _mm512_permutex2var_epi8(first, left, second);
     __m512i right_taps = _mm512_permutex2var_epi8(first, right, second);
     if (kWindows > 2) {
+        // A permutation looks at seven bits of an offset; the eighth says that it is meant for the
+        // second pair of windows.
         const __m512i third = window(2);
         const __m512i fourth = kWindows > 3 ? window(3) : third;
         left_taps = _mm512_mask_mov_epi8(left_taps, _mm512_movepi8_mask(left),
@@ -135,15 +109,7 @@ const QuarterKernels& plan_quarters_avx512(QuarterPlan& plan, const QuarterRowSh
     const WindowShape vector = window_shape(shape, kVector, kMostWindows);
     // Rows too short for these windows may have room for shorter ones.
     if (vector.windows == 0) return plan_quarters_avx2(plan, shape, columns, samples);
-    plan.sample_bytes = shape.sample_bytes;
-    plan.vector_samples = vector.samples;
-    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
-    plan_vectors<VectorEntry>(
-        plan, shape, columns, samples, vector.windows * kVector,
-        static_cast<int32_t>(sizeof(Offsets)),
-        [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
-            encode(masks, entry, taps, count, plan, vector.windows);
-        });
+    plan_offsets<kVector>(plan, shape, vector, columns, samples);
     return kQuarterKernels[vector.windows - 1];
 }
 

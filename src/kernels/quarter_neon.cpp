@@ -15,33 +15,6 @@ constexpr int32_t kVector = 16;
 constexpr int32_t kTableWindows = 4;  // windows of one lookup
 constexpr int32_t kMostWindows = 8;
 
-// Storage of a plan, for every target vector.
-struct VectorEntry {
-    int32_t base;   // first byte of the windows within a row
-    int32_t masks;  // where its Offsets lie in the plan
-
-    bool move(int64_t bytes, int32_t last_base) {
-        if (base + bytes > last_base) return false;
-        base += static_cast<int32_t>(bytes);
-        return true;
-    }
-};
-
-// Offsets of the taps from the start of the windows.
-struct Offsets {
-    alignas(kVector) uint8_t left[kVector];
-    uint8_t right[kVector];
-};
-
-void encode(uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count,
-            const QuarterPlan& plan, int32_t windows) {
-    WindowTaps window;
-    locate_taps(window, taps, count, plan, windows * kVector);
-    memcpy(masks, window.left, kVector);
-    memcpy(masks + kVector, window.right, kVector);
-    entry.base = window.base;
-}
-
 // The rows' quarters of one window.
 template <bool kPair>
 OVRIN_ALWAYS_INLINE uint8x16_t load_window(const QuarterRows& rows, ptrdiff_t offset) {
@@ -86,7 +59,7 @@ template <int kWindows, bool kPair>
 OVRIN_ALWAYS_INLINE uint8x16_t gather(const QuarterRows& rows, const QuarterPlan& plan,
                                       VectorEntry entry) {
     constexpr int kFirst = kWindows < kTableWindows ? kWindows : kTableWindows;
-    const auto& offsets = *reinterpret_cast<const Offsets*>(plan.bytes + entry.masks);
+    const auto& offsets = *reinterpret_cast<const Offsets<kVector>*>(plan.bytes + entry.masks);
     const uint8x16_t left = vld1q_u8(offsets.left);
     const uint8x16_t right = vld1q_u8(offsets.right);
     if (kWindows > 1) fetch<kWindows, kPair>(rows, entry.base);
@@ -168,15 +141,7 @@ const QuarterKernels& plan_quarters_neon(QuarterPlan& plan, const QuarterRowShap
                                          QuarterColumns& columns, int32_t samples) {
     const WindowShape vector = window_shape(shape, kVector, kMostWindows);
     if (vector.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
-    plan.sample_bytes = shape.sample_bytes;
-    plan.vector_samples = vector.samples;
-    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
-    plan_vectors<VectorEntry>(
-        plan, shape, columns, samples, vector.windows * kVector,
-        static_cast<int32_t>(sizeof(Offsets)),
-        [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
-            encode(masks, entry, taps, count, plan, vector.windows);
-        });
+    plan_offsets<kVector>(plan, shape, vector, columns, samples);
     return kQuarterKernels[vector.windows - 1];
 }
 

@@ -129,6 +129,42 @@ void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumn
     }
 }
 
+// The plan of sets that shuffle whole vectors: of every target vector, the offsets of its taps from
+// the start of its windows.
+struct VectorEntry {
+    int32_t base;   // first byte of the windows within a row
+    int32_t masks;  // where its Offsets lie in the plan
+
+    bool move(int64_t bytes, int32_t last_base) {
+        if (base + bytes > last_base) return false;
+        base += static_cast<int32_t>(bytes);
+        return true;
+    }
+};
+
+template <int32_t kVector>
+struct Offsets {
+    alignas(kVector) uint8_t left[kVector];
+    uint8_t right[kVector];
+};
+
+template <int32_t kVector>
+void plan_offsets(QuarterPlan& plan, const QuarterRowShape& shape, const WindowShape& vector,
+                  QuarterColumns& columns, int32_t samples) {
+    const int32_t span = vector.windows * kVector;
+    plan.sample_bytes = shape.sample_bytes;
+    plan.vector_samples = vector.samples;
+    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
+    const auto encode = [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
+        WindowTaps window;
+        locate_taps(window, taps, count, plan, span);
+        memcpy(masks, window.left, kVector);
+        memcpy(masks + kVector, window.right, kVector);
+        entry.base = window.base;
+    };
+    plan_vectors<VectorEntry>(plan, shape, columns, samples, span, 2 * kVector, encode);
+}
+
 }  // namespace
 
 }  // namespace ovrin
