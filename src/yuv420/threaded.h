@@ -2,6 +2,8 @@
 // Resizing of 4:2:0 pictures in bands: one driver for every format and destination.
 #pragma once
 
+#include <string.h>
+
 #include "dispatch/banded_run.h"
 #include "yuv420/place.h"
 #include "yuv420/planes.h"
