@@ -53,9 +53,9 @@ WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes, int
 // The taps of a target vector, as bytes from the start of its windows, which span at most 256 bytes
 // together. Bytes behind the vector's last sample are any.
 struct WindowTaps {
-    int32_t base;  // first byte of the windows within the row
     alignas(64) uint8_t left[64 + sizeof(uint32_t)];
     alignas(64) uint8_t right[64 + sizeof(uint32_t)];
+    int32_t base;  // first byte of the windows within the row
 };
 
 // The bytes of a sample of up to four, from the first one on.

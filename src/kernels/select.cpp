@@ -15,10 +15,10 @@ namespace {
 
 #if defined(__x86_64__)
 constexpr Kernels kAvx2Kernels = {plan_quarters_avx2, bilinear_blend_avx2, bilinear_edges_scalar,
-                                  bilinear_copy_avx2, &lanczos_avx2,       copy_every_scalar};
+                                  bilinear_copy_avx2, &lanczos_avx2,       copy_every_avx2};
 constexpr Kernels kAvx512Kernels = {plan_quarters_avx512,  bilinear_blend_avx512,
                                     bilinear_edges_scalar, bilinear_copy_avx512,
-                                    &lanczos_avx512,       copy_every_avx512};
+                                    &lanczos_avx512,       copy_every_avx2};
 #elif defined(__aarch64__)
 constexpr Kernels kNeonKernels = {plan_quarters_neon, bilinear_blend_neon, bilinear_edges_scalar,
                                   bilinear_copy_neon, &lanczos_neon,       copy_every_neon};

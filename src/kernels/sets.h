@@ -27,7 +27,7 @@ extern const LanczosKernels lanczos_avx512;
 extern const LanczosKernels lanczos_neon;
 
 CopyEvery copy_every_scalar;
-CopyEvery copy_every_avx512;
+CopyEvery copy_every_avx2;
 CopyEvery copy_every_neon;
 
 }  // namespace ovrin

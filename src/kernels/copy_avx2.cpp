@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-// Every step-th word with AVX-512: of each source vector, its words go to their places in the
-// target vector.
+// Every step-th word with AVX2: of each source vector, its words go to their places in the target
+// vector. Longer vectors are no faster: the rows are waited for.
 #include <immintrin.h>
 
 #include "kernels/sets.h"
@@ -9,39 +9,40 @@ namespace ovrin {
 
 namespace {
 
-constexpr int32_t kWords = 16;
+constexpr int32_t kWords = 8;
 constexpr int32_t kMostVectors = 8;  // beyond this step, word by word is as fast
 
 // Which words of the target vector come from a source vector, and which words of it they are.
 struct Part {
-    __m512i index;
-    __mmask16 mask;
+    __m256i index;
+    __m256i mask;
 };
 
-void find_parts(Part parts[kMostVectors], int32_t step) {
-    for (int32_t v = 0; v < step; ++v) {
-        alignas(64) int32_t index[kWords];
-        uint32_t mask = 0;
-        for (int32_t i = 0; i < kWords; ++i) {
-            index[i] = i * step - v * kWords;
-            if (index[i] >= 0 && index[i] < kWords) mask |= 1U << i;
-        }
-        parts[v] = {_mm512_load_si512(index), static_cast<__mmask16>(mask)};
+Part part_of(int32_t step, int32_t vector) {
+    alignas(32) int32_t index[kWords];
+    alignas(32) int32_t mask[kWords];
+    for (int32_t i = 0; i < kWords; ++i) {
+        index[i] = i * step - vector * kWords;
+        mask[i] = index[i] >= 0 && index[i] < kWords ? -1 : 0;
     }
+    return {_mm256_load_si256(reinterpret_cast<const __m256i*>(index)),
+            _mm256_load_si256(reinterpret_cast<const __m256i*>(mask))};
 }
 
 template <int kStep>
 void copy_vectors(uint32_t* dst, const uint32_t* src, int32_t vectors, const uint32_t* next) {
-    Part parts[kMostVectors];
-    find_parts(parts, kStep);
+    Part parts[kStep];
+    for (int32_t v = 0; v < kStep; ++v) parts[v] = part_of(kStep, v);
     for (int32_t i = 0; i < vectors; ++i, dst += kWords) {
-        __m512i words = _mm512_setzero_si512();
+        __m256i words = _mm256_setzero_si256();
         for (int v = 0; v < kStep; ++v, src += kWords, next += kWords) {
-            _mm_prefetch(next, _MM_HINT_T0);
-            words = _mm512_mask_permutexvar_epi32(words, parts[v].mask, parts[v].index,
-                                                  _mm512_loadu_si512(src));
+            // A cache line holds two vectors.
+            if (v % 2 == 0) _mm_prefetch(next, _MM_HINT_T0);
+            const __m256i source = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(src));
+            const __m256i placed = _mm256_permutevar8x32_epi32(source, parts[v].index);
+            words = _mm256_blendv_epi8(words, placed, parts[v].mask);
         }
-        _mm512_storeu_si512(dst, words);
+        _mm256_storeu_si256(reinterpret_cast<__m256i*>(dst), words);
     }
 }
 
@@ -52,8 +53,8 @@ constexpr CopyVectors* kCopyVectors[kMostVectors + 1] = {
 
 }  // namespace
 
-void copy_every_avx512(uint32_t* dst, const uint32_t* src, int32_t step, int32_t count,
-                       const uint32_t* next) {
+void copy_every_avx2(uint32_t* dst, const uint32_t* src, int32_t step, int32_t count,
+                     const uint32_t* next) {
     if (step < 2 || step > kMostVectors) {
         copy_every_scalar(dst, src, step, count, next);
         return;
