@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
 # The library itself: the objects, which white-box tests link too, and the shared object.
-if(ANDROID)
-  set(OVRINRESIZE_THREADS "") # a part of Android's libc
+if(ANDROID OR CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
+  set(OVRINRESIZE_THREADS "") # a part of Android's libc; WebAssembly has none
 else()
   find_package(Threads REQUIRED)
   set(OVRINRESIZE_THREADS Threads::Threads)
@@ -28,7 +28,6 @@ add_library(ovrinresize_objects OBJECT
   src/lanczos/threaded.cpp
   src/lanczos/transform.cpp
   src/lanczos/weights.cpp
-  src/layout.cpp
   src/nv21/nv21.cpp
   src/nv21/nv21_bands.cpp
   src/pool/threadpool.cpp
@@ -45,6 +44,15 @@ add_library(ovrinresize_objects OBJECT
   src/yuv420/place.cpp
   src/yuv420/resize.cpp
   src/yuv420/work_buffer.cpp)
+if(CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
+  target_sources(ovrinresize_objects PRIVATE src/kernels/lanczos_wasm.cpp)
+  if(OVRINRESIZE_SIMD128)
+    target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
+      src/kernels/quarter_neon.cpp)
+  endif()
+else()
+  target_sources(ovrinresize_objects PRIVATE src/layout.cpp) # given for 64-bit platforms
+endif()
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
   target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
     src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp)
@@ -89,10 +97,15 @@ set(OVRINRESIZE_HEADER ${PROJECT_SOURCE_DIR}/include/ovrinresize.h)
 set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${OVRINRESIZE_HEADER})
 file(STRINGS ${OVRINRESIZE_HEADER} declarations REGEX "^OVRIN_API .*\\(")
 set(OVRINRESIZE_EXPORTS "")
+set(OVRINRESIZE_FUNCTIONS "")
 foreach(declaration IN LISTS declarations)
   string(REGEX MATCH "([A-Za-z_0-9]+)\\(" ignored "${declaration}")
   string(APPEND OVRINRESIZE_EXPORTS "        ${CMAKE_MATCH_1};\n")
+  list(APPEND OVRINRESIZE_FUNCTIONS ${CMAKE_MATCH_1})
 endforeach()
+if(CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
+  return() # cmake/Wasm.cmake makes a module of it instead
+endif()
 # Android's loader knows symbol versions only from API 23 on, and installs no file whose name does not
 # end in .so: there, neither the functions nor the file have a version.
 if(ANDROID)

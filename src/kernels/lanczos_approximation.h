@@ -105,6 +105,16 @@ void prepare(LanczosStrip& strip) {
     strip.has_small_weights = spans_hold_groups(strip);
 }
 
+// Rounded once or twice: a sum whose first product is rounded anyway goes through as many roundings
+// either way.
+float add_product(float sum, float weight, float tap) {
+#if defined(__wasm__)
+    return sum + weight * tap;
+#else
+    return fmaf(weight, tap, sum);
+#endif
+}
+
 // Sums of one source row of pixels with less than four components.
 template <int N>
 void sum_narrow_row(float* sums, const LanczosStrip& strip, const uint8_t* src) {
@@ -122,8 +132,8 @@ void sum_narrow_row(float* sums, const LanczosStrip& strip, const uint8_t* src) 
                 float even = weights[0] * taps[0];
                 float odd = weights[1] * taps[N];
                 for (int32_t i = 2; i < kTaps; i += 2) {
-                    even = fmaf(weights[i], taps[i * N], even);
-                    if (i + 1 < kTaps) odd = fmaf(weights[i + 1], taps[(i + 1) * N], odd);
+                    even = add_product(even, weights[i], taps[i * N]);
+                    if (i + 1 < kTaps) odd = add_product(odd, weights[i + 1], taps[(i + 1) * N]);
                 }
                 sums[x * N + c] = even + odd;
             }

@@ -25,6 +25,7 @@ extern const LanczosKernels lanczos_scalar;
 extern const LanczosKernels lanczos_avx2;
 extern const LanczosKernels lanczos_avx512;
 extern const LanczosKernels lanczos_neon;
+extern const LanczosKernels lanczos_wasm;
 
 CopyEvery copy_every_scalar;
 CopyEvery copy_every_avx2;

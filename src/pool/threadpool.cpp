@@ -179,7 +179,8 @@ ovrin_threadpool* ovrin_threadpool_init(int32_t n) {
         return nullptr;
     }
     if (!start_workers(pool, n)) {
-        ovrin_threadpool_free(pool, 0);
+        // Without workers there is nobody to wait for.
+        ovrin_threadpool_free(pool, pool->thread_count == 0 ? 1 : 0);
         return nullptr;
     }
     return pool;
