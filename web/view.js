@@ -3,6 +3,7 @@
 
 const LARGEST_ZOOM = 64;
 const KEY_STEP = 40; // canvas pixels
+const LARGE = 2e6; // picture pixels
 
 /** The part of the picture that panes show: `zoom` canvas pixels for each of its own. */
 export class View {
@@ -77,12 +78,12 @@ export class View {
 
     draw() {
         this.limitCentre();
+        this.changed();
         if (this.frame) return;
         this.frame = requestAnimationFrame(() => {
             this.frame = 0;
             for (const pane of this.panes) pane.draw();
         });
-        this.changed();
     }
 }
 
@@ -117,9 +118,10 @@ class Pane {
         const { context, canvas, bitmap, view } = this;
         context.clearRect(0, 0, canvas.width, canvas.height);
         if (!bitmap) return;
-        // Pixels stay sharp; where there are more than the pane has, it shows their average.
+        // Pixels stay sharp; where there are more than the pane has, it shows averages: cheap ones of
+        // large pictures, which would keep the page busy.
         context.imageSmoothingEnabled = view.zoom < 1;
-        context.imageSmoothingQuality = 'high';
+        context.imageSmoothingQuality = bitmap.width * bitmap.height > LARGE ? 'low' : 'high';
         const x = Math.round(canvas.width / 2 - view.centre.x * view.size.width * view.zoom);
         const y = Math.round(canvas.height / 2 - view.centre.y * view.size.height * view.zoom);
         const width = view.size.width * view.zoom;

@@ -30,6 +30,16 @@ async function decoded(blob) {
     }
 }
 
+function isOpaque(pixels) {
+    return new Uint32Array(pixels.buffer).every((pixel) => pixel >>> 24 === 255);
+}
+
+// Engines treat alpha as a colour, and the quarter engine makes 252 of 255. Of opaque pictures only
+// what an engine leaves empty is transparent.
+function makeOpaque(pixels) {
+    for (let i = 3; i < pixels.length; i += 4) pixels[i] = pixels[i] === 0 ? 0 : 255;
+}
+
 async function open({ id, blob }) {
     const bitmap = await decoded(blob);
     const { width, height } = bitmap;
@@ -38,7 +48,8 @@ async function open({ id, blob }) {
     const { context } = canvasOf(width, height);
     context.drawImage(bitmap, 0, 0);
     picture?.bitmap.close();
-    picture = { bitmap, width, height, pixels: context.getImageData(0, 0, width, height).data };
+    const pixels = context.getImageData(0, 0, width, height).data;
+    picture = { bitmap, width, height, pixels, isOpaque: isOpaque(pixels) };
     results = new Map();
     tell({ type: 'opened', id, width, height });
 }
@@ -107,6 +118,7 @@ async function run({ id, size }) {
         if (id !== latest) return;
         const { pixels, ms } = await timed(resize, size);
         if (id !== latest) return;
+        if (picture.isOpaque) makeOpaque(pixels);
         made.set(name, { pixels, width, height });
         const bitmap = await createImageBitmap(new ImageData(pixels, width, height));
         tell({ type: 'result', id, name, bitmap, ms }, [bitmap]);

@@ -10,7 +10,13 @@ import { chromium } from 'playwright-core';
 
 import { root } from './native.mjs';
 
-const TYPES = { '.html': 'text/html', '.js': 'text/javascript', '.mjs': 'text/javascript' };
+const TYPES = {
+    '': 'text/html',
+    '.html': 'text/html',
+    '.js': 'text/javascript',
+    '.mjs': 'text/javascript',
+    other: 'application/octet-stream',
+};
 const FLAGS = [
     '--disable-gpu', '--disable-quic', '--no-first-run', '--disable-background-networking',
     '--disable-component-update', '--disable-sync', '--use-fake-device-for-media-stream',
@@ -21,13 +27,13 @@ export function startBrowser() {
     return chromium.launch({ executablePath: '/usr/bin/chromium', chromiumSandbox: false, args: FLAGS });
 }
 
-/** Serves the folder of the project; gives { url, close }. */
+/** Serves the folder of the project, and an empty page at its root; gives { url, close }. */
 export async function serve() {
     const server = createServer(async (request, response) => {
         const path = normalize(new URL(request.url, 'http://host').pathname);
         try {
-            const body = await readFile(join(root, path));
-            response.setHeader('content-type', TYPES[extname(path)] ?? 'application/octet-stream');
+            const body = path === '/' ? '' : await readFile(join(root, path));
+            response.setHeader('content-type', TYPES[extname(path)] ?? TYPES.other);
             response.end(body);
         } catch {
             response.statusCode = 404;

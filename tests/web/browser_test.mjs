@@ -17,8 +17,7 @@ before(async () => {
     browser = await startBrowser();
     server = await serve();
     page = await browser.newPage();
-    // Any page of the server will do.
-    await page.goto(`${server.url}/LICENSE`);
+    await page.goto(server.url);
 });
 
 after(async () => {
