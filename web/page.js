@@ -254,7 +254,7 @@ const HEARD = {
     opened,
     result: showResult,
     done: () => {
-        showStatus('');
+        showStatus(`${source.width} × ${source.height} to ${wanted.width} × ${wanted.height}`);
         askForDifference();
     },
     difference: showDifference,

@@ -39,7 +39,7 @@ afterEach(async () => {
 async function finished(timeout = 60000) {
     await page.waitForFunction(
         () =>
-            document.getElementById('status').textContent === '' &&
+            document.getElementById('status').textContent.includes(' to ') &&
             document.querySelectorAll('#times tr').length === 6 &&
             document.getElementById('difference-figures').textContent.length > 5,
         null,
