@@ -47,5 +47,5 @@ if(OVRINRESIZE_BUILD_TESTS)
   target_compile_options(golden PRIVATE -fno-exceptions)
   target_link_libraries(golden PRIVATE ovrinresize_warnings)
   target_link_options(golden PRIVATE -mexec-model=reactor -Wl,--strip-all,--import-memory
-    -Wl,--allow-undefined,--global-base=33554432,-z,stack-size=1048576)
+    -Wl,--export=golden_lines,--allow-undefined,--global-base=33554432,-z,stack-size=1048576)
 endif()

@@ -1,9 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-// A fused multiply-add for processors without one, as WebAssembly's: in less than half the time that
-// the C library's takes, which knows nothing of the operands.
-//
-// For inclusion by kernel files only: everything has internal linkage, because each of them is
-// compiled for another instruction set.
+// A fused multiply-add for processors without one, as WebAssembly's: in less than half the time
+// that the C library's takes, which knows nothing of the operands.
 #pragma once
 
 #include <math.h>
@@ -12,15 +9,13 @@
 
 namespace ovrin {
 
-namespace {
-
-uint64_t bits_of(double value) {
+inline uint64_t bits_of(double value) {
     uint64_t bits;
     memcpy(&bits, &value, sizeof bits);
     return bits;
 }
 
-double double_of(uint64_t bits) {
+inline double double_of(uint64_t bits) {
     double value;
     memcpy(&value, &bits, sizeof value);
     return value;
@@ -28,7 +23,7 @@ double double_of(uint64_t bits) {
 
 // +0, or 2^-896 to 2^896 in absolute value: nothing that is computed below leaves the range of
 // normal numbers.
-bool is_ordinary(double value) {
+inline bool is_ordinary(double value) {
     constexpr uint64_t kBias = 1023;
     constexpr uint64_t kLimit = 896;
     return bits_of(value) == 0 || ((bits_of(value) >> 52) & 0x7FF) - (kBias - kLimit) < 2 * kLimit;
@@ -41,14 +36,14 @@ struct Sum {
 };
 
 // Knuth's algorithm.
-Sum exact_sum(double a, double b) {
+inline Sum exact_sum(double a, double b) {
     const double high = a + b;
     const double part = high - a;
     return {high, (a - (high - part)) + (b - part)};
 }
 
 // a + b, rounded to odd: when the sum is not a double, that neighbour of it whose last bit is set.
-double odd_sum(double a, double b) {
+inline double odd_sum(double a, double b) {
     const Sum sum = exact_sum(a, b);
     const uint64_t bits = bits_of(sum.high);
     if (sum.low == 0.0 || (bits & 1) != 0) return sum.high;
@@ -67,7 +62,7 @@ double odd_sum(double a, double b) {
 // algorithms using rounding to odd", IEEE Transactions on Computers 57 (4), 2008), who prove that
 // it rounds as a fused operation does unless a step leaves the range of normal numbers. Other
 // operands, which only a caller's own weights can bring, take the way of the C library.
-double exact_fma(double weight, uint8_t byte, double acc) {
+inline double exact_fma(double weight, uint8_t byte, double acc) {
     if (!is_ordinary(weight) || !is_ordinary(acc)) return fma(weight, byte, acc);
     const double factor = byte;
     const double head = double_of(bits_of(weight) & ~uint64_t{0xFF});
@@ -77,7 +72,5 @@ double exact_fma(double weight, uint8_t byte, double acc) {
     const Sum upper = exact_sum(product, lower.high);
     return upper.high + odd_sum(lower.low, upper.low);
 }
-
-}  // namespace
 
 }  // namespace ovrin

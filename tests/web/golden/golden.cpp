@@ -8,8 +8,10 @@
 
 extern "C" {
 
+char* golden_lines();
+
 // The lines of the golden file, as the module computes them, with a 0 at their end.
-__attribute__((export_name("golden_lines"))) char* golden_lines() {
+char* golden_lines() {
     const golden::Api linked = OVRIN_LINKED_API;
     std::string lines;
     for (const golden::Result& result : golden::run_cases(linked)) {
