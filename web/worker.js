@@ -43,8 +43,12 @@ function makeOpaque(pixels) {
 async function open({ id, blob }) {
     const bitmap = await decoded(blob);
     const { width, height } = bitmap;
-    if (width * height > MOST_PIXELS) throw new Error('too-large');
-    if (id !== latest) return;
+    const isTooLarge = width * height > MOST_PIXELS;
+    if (isTooLarge || id !== latest) {
+        bitmap.close();
+        if (isTooLarge) throw new Error('too-large');
+        return;
+    }
     const { context } = canvasOf(width, height);
     context.drawImage(bitmap, 0, 0);
     picture?.bitmap.close();

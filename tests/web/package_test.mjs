@@ -204,7 +204,7 @@ test('npm packs it, and what it packs works', async () => {
     assert.deepEqual(
         files.map((file) => file.path).sort(),
         ['LICENSE', 'README.md', 'index.d.ts', 'index.js', 'ovrinresize-scalar.wasm', 'ovrinresize.wasm',
-            'package.json', 'resizer.d.ts', 'resizer.js'],
+            'package.json', 'resizer.d.ts', 'resizer.js', 'third-party.txt'],
     );
     const modules = join(folder, 'app/node_modules/ovrinresize');
     mkdirSync(modules, { recursive: true });

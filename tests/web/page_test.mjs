@@ -4,6 +4,7 @@ import assert from 'node:assert/strict';
 import { readFileSync, writeFileSync } from 'node:fs';
 import { join } from 'node:path';
 import { after, afterEach, before, beforeEach, test } from 'node:test';
+import { deflateSync } from 'node:zlib';
 
 import { assertNoComplaints, pageFile, serve, startBrowser, watchedPage } from './browser.mjs';
 import { assertSame, folder, nativeFile, nativePixels, root } from './native.mjs';
@@ -286,6 +287,45 @@ test('what is no picture is refused in words, and what was there stays', async (
         assert.ok(!(await page.locator('#error').isVisible()));
         await assertNative(sample, 120, 90, ['bilinear']);
     }
+});
+
+// A PNG of one bit per pixel, all of them black.
+function blackPng(width, height) {
+    const chunk = (type, data) => {
+        const body = Buffer.concat([Buffer.from(type, 'latin1'), data]);
+        const [length, sum] = [Buffer.alloc(4), Buffer.alloc(4)];
+        length.writeUInt32BE(data.length);
+        sum.writeUInt32BE(checksum(body));
+        return Buffer.concat([length, body, sum]);
+    };
+    const header = Buffer.alloc(13);
+    header.writeUInt32BE(width);
+    header.writeUInt32BE(height, 4);
+    header[8] = 1;
+    const rows = deflateSync(Buffer.alloc((1 + Math.ceil(width / 8)) * height));
+    const signature = Buffer.from('\x89PNG\r\n\x1a\n', 'latin1');
+    const chunks = [chunk('IHDR', header), chunk('IDAT', rows), chunk('IEND', Buffer.alloc(0))];
+    return Buffer.concat([signature, ...chunks]);
+}
+
+// CRC-32, as PNG wants it.
+function checksum(bytes) {
+    let sum = ~0;
+    for (const byte of bytes) {
+        sum ^= byte;
+        for (let i = 0; i < 8; ++i) sum = (sum >>> 1) ^ (sum & 1 ? 0xedb88320 : 0);
+    }
+    return ~sum >>> 0;
+}
+
+test('a picture too large for a page is refused in words', async () => {
+    const path = join(folder, 'too-large.png');
+    writeFileSync(path, blackPng(14400, 14400));
+    await page.locator('#file').setInputFiles(path);
+    await page.getByText('That is too large for the memory that a page gets.').waitFor({ timeout: 60000 });
+    writeFileSync(path, blackPng(1440, 1440));
+    await reworked(() => page.locator('#file').setInputFiles(path));
+    assert.match(await about(), /^1440 × 1440,/);
 });
 
 test('50 megapixels do not keep the page busy', async () => {
