@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 // Blended bilinear rows with AVX-512: one window and one shuffle for four lanes.
-#include "kernels/bilinear_lanes.h"
+#include "kernels/bilinear_lanes_inl.h"
 #include "kernels/intrinsics_avx512.h"
 #include "kernels/sets.h"
 

@@ -3,7 +3,7 @@
 #include <arm_neon.h>
 #include <string.h>
 
-#include "kernels/bilinear_lanes.h"
+#include "kernels/bilinear_lanes_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
-// Lanczos rows with AVX2 and FMA; see lanczos_approximation.h for how the byte is decided.
+// Lanczos rows with AVX2 and FMA; see lanczos_approximation_inl.h for how the byte is decided.
 #include <immintrin.h>
 #include <string.h>
 
-#include "kernels/lanczos_approximation.h"
-#include "kernels/lanczos_chains_x86.h"
+#include "kernels/lanczos_approximation_inl.h"
+#include "kernels/lanczos_chains_x86_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {

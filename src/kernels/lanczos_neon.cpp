@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-// Lanczos rows with NEON; see lanczos_approximation.h for how the byte is decided.
+// Lanczos rows with NEON; see lanczos_approximation_inl.h for how the byte is decided.
 #include <arm_neon.h>
 #include <string.h>
 
-#include "kernels/lanczos_approximation.h"
+#include "kernels/lanczos_approximation_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kernels/lanczos_chain.h"
+#include "kernels/lanczos_chain_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {

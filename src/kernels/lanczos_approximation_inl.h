@@ -15,14 +15,11 @@
 // from the terms, and 7 u * 0.5 from the 0.5. Together 14 u * 255 V H + 3.5 u. Calling it 14.5 u *
 // (255 V H + 1) leaves 0.5 u * 255 V H for products of errors and for the rounding of the chain and
 // of this bound itself, which take less than a thousandth of that.
-//
-// For inclusion by kernel files only: everything has internal linkage, because each of them is
-// compiled for another instruction set.
 #pragma once
 
 #include <string.h>
 
-#include "kernels/lanczos_chain.h"
+#include "kernels/lanczos_chain_inl.h"
 
 namespace ovrin {
 

@@ -1,15 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 // The chains of whole Lanczos pixels with AVX2 and FMA: one component per lane, some pixels side by
 // side to hide the latency. AVX-512 uses them too.
-//
-// For inclusion by kernel files only: everything has internal linkage, because each of them is
-// compiled for another instruction set.
 #pragma once
 
 #include <immintrin.h>
 #include <string.h>
 
-#include "kernels/lanczos_approximation.h"
+#include "kernels/lanczos_approximation_inl.h"
 
 namespace ovrin {
 

@@ -3,14 +3,11 @@
 // bytes from one window of each row by a byte shuffle that also widens them: left and right sample
 // of each byte lie side by side as 16-bit numbers, ready to be multiplied by a pair of weights.
 // Sets with wide shuffles serve several lanes from one window.
-//
-// For inclusion by kernel files only: everything has internal linkage, because each of them is
-// compiled for another instruction set.
 #pragma once
 
 #include <string.h>
 
-#include "kernels/kernels.h"
+#include "kernels/bilinear.h"
 
 namespace ovrin {
 

@@ -1,14 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 // What a Lanczos row is: its definition, for the scalar kernel and for what vector kernels leave
 // over. Where the instruction set has a fused multiply-add, the compiler uses it.
-//
-// For inclusion by kernel files only: everything has internal linkage, because each of them is
-// compiled for another instruction set.
 #pragma once
 
 #include <math.h>
 
-#include "kernels/kernels.h"
+#include "kernels/lanczos.h"
 
 namespace ovrin {
 
