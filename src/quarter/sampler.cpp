@@ -81,10 +81,22 @@ QuarterRows rows_at(const QuarterPlane& plane, const QuarterPoints& top,
             row_after(plane, bottom, rows)};
 }
 
-void store_strip(const QuarterPlane& plane, const Strip& strip, uint8_t* dst) {
-    QuarterPoints top(quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows);
-    QuarterPoints bottom(three_quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows);
-    for (int32_t j = 0; j < plane.rows; ++j, dst += plane.dst_pitch) {
+// Target rows [first, end) of a plane.
+struct RowRange {
+    int32_t first;
+    int32_t end;
+};
+
+// The points of a plane's rows from `row` on; `point` is that of the first row.
+QuarterPoints points_from(const QuarterPlane& plane, int32_t point, int32_t row) {
+    return {point + int64_t{row} * plane.src_rows, plane.src_rows, plane.dst_rows};
+}
+
+void store_strip(const QuarterPlane& plane, const Strip& strip, uint8_t* dst, RowRange range) {
+    QuarterPoints top = points_from(plane, quarter_point(plane.src_rows), range.first);
+    QuarterPoints bottom = points_from(plane, three_quarter_point(plane.src_rows), range.first);
+    dst += range.first * plane.dst_pitch;
+    for (int32_t j = range.first; j < range.end; ++j, dst += plane.dst_pitch) {
         strip.kernels.store_pair(dst, rows_at(plane, top, bottom, plane.src_rows), strip.plan);
         top.next();
         bottom.next();
@@ -113,9 +125,7 @@ void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
 // A target row whose two source rows both lie in the scan is done in one go. Bands also hold halves
 // of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
 // behind.
-void run_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip, BandRows whole_rows) {
-    const auto pair =
-        whole_rows == BandRows::kStore ? strip.kernels.store_pair : strip.kernels.add_pair;
+void add_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     while (scan.has_top() || scan.has_bottom()) {
         const bool both = scan.has_pair();
         // On one source row the bottom half goes first: it closes the row that is open.
@@ -123,8 +133,8 @@ void run_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip, Band
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            pair(scan.top_target.left, rows_at(plane, scan.top, scan.bottom, scan.rows),
-                 strip.plan);
+            strip.kernels.add_pair(scan.top_target.left,
+                                   rows_at(plane, scan.top, scan.bottom, scan.rows), strip.plan);
         } else if (take_top) {
             add_row(strip, scan.top_target, row_at(plane, scan.top));
         } else {
@@ -141,28 +151,47 @@ void run_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip, Band
     }
 }
 
-void clear_plane(const QuarterPlane& plane) {
+void clear_rows(const QuarterPlane& plane, RowRange range) {
     const size_t row_bytes =
         static_cast<size_t>(plane.samples) * static_cast<size_t>(plane.sample_bytes);
-    uint8_t* row = plane.dst;
-    for (int32_t j = 0; j < plane.rows; ++j, row += plane.dst_pitch) memset(row, 0, row_bytes);
+    uint8_t* row = plane.dst + range.first * plane.dst_pitch;
+    for (int32_t j = range.first; j < range.end; ++j, row += plane.dst_pitch) {
+        memset(row, 0, row_bytes);
+    }
+}
+
+// Stores the rows that take(work) gives to work(range), once for every strip of the plane.
+template <class Take>
+void store_rows(const QuarterPlane& plane, const Take& take) {
+    if (plane.samples < 1 || plane.rows < 1) return;
+    if (plane.src_columns < 1 || plane.src_rows < 1) {
+        take([&](RowRange range) { clear_rows(plane, range); });
+        return;
+    }
+    for_each_strip(plane, [&](const Strip& strip, ptrdiff_t offset) {
+        take([&](RowRange range) { store_strip(plane, strip, plane.dst + offset, range); });
+    });
 }
 
 }  // namespace
 
 void sample_plane(const QuarterPlane& plane) {
-    if (plane.samples < 1 || plane.rows < 1) return;
-    if (plane.src_columns < 1 || plane.src_rows < 1) {
-        clear_plane(plane);
-        return;
-    }
-    for_each_strip(plane, [&](const Strip& strip, ptrdiff_t offset) {
-        store_strip(plane, strip, plane.dst + offset);
+    store_rows(plane, [&](const auto& store) { store(RowRange{0, plane.rows}); });
+}
+
+void sample_plane_in_turns(const QuarterPlane& plane, TurnTaker& turns) {
+    store_rows(plane, [&](const auto& store) {
+        turns.take_pass([&](Turn turn) {
+            const auto row = [&](int32_t band) {
+                return static_cast<int32_t>(int64_t{plane.rows} * band / turns.bands());
+            };
+            store(RowRange{row(turn.first), row(turn.end)});
+        });
     });
 }
 
-void run_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes,
-              BandRows whole_rows) {
+void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows,
+              int32_t index_bytes) {
     if (plane.src_columns < 1) return;
     const auto at = [&](int32_t index) { return plane.dst + ptrdiff_t{index} * index_bytes; };
     const ScanAxis axis = {plane.src_rows, plane.dst_rows, 0};
@@ -177,7 +206,7 @@ void run_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, i
         RowScan scan = whole;
         scan.top_target.move(offset);
         scan.bottom_target.move(offset);
-        run_strip(plane, scan, strip, whole_rows);
+        add_strip(plane, scan, strip);
     });
 }
 

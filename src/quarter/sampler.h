@@ -6,6 +6,7 @@
 
 #include <stddef.h>
 
+#include "bands/turns.h"
 #include "quarter/scan.h"
 
 namespace ovrin {
@@ -30,16 +31,12 @@ struct QuarterPlane {
 // Stores every target sample of the plane; zeros when the source is empty.
 void sample_plane(const QuarterPlane& plane);
 
-// How a band treats target rows of which it has all samples.
-enum class BandRows {
-    kAdd,    // adds them, like all others, to what is there
-    kStore,  // stores them: they need not be cleared
-};
+// As sample_plane, by several threads at once, each of which calls this with a way of its own
+// through the same turns: one pass, in which every band is a share of the target rows.
+void sample_plane_in_turns(const QuarterPlane& plane, TurnTaker& turns);
 
-// Takes the samples of `rows` source rows to the target, from a state between two rows. plane.src
-// is the first of these rows; the state's indices count `index_bytes` from plane.dst. Target rows
-// that need samples from outside the band are added to.
-void run_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes,
-              BandRows whole_rows);
+// Adds the samples of `rows` source rows to the target, from a state between two rows. plane.src is
+// the first of these rows; the state's indices count `index_bytes` from plane.dst.
+void add_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes);
 
 }  // namespace ovrin

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "rgba/rgba_band.h"
 
-#include <string.h>
-
 namespace ovrin {
 
 namespace {
@@ -25,7 +23,7 @@ void store_scan_state(ovrin_rgba_band& band, const ScanState& state) {
     band.di_33 = state.bottom_right;
 }
 
-void sample_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows, BandRows whole_rows) {
+void sample_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows) {
     const QuarterPlane plane = {
         band.src + band.src_offset,
         ptrdiff_t{rows.src_pixels} * kRgbaBytes,
@@ -40,7 +38,7 @@ void sample_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows, BandRow
         band.src_w,
         kRgbaBytes,
     };
-    run_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes, whole_rows);
+    add_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes);
 }
 
 }  // namespace
@@ -55,14 +53,9 @@ void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, cons
     band.rows_to_do = src_h >= band.start_row ? walked : 0;
 }
 
-void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows, BandRows whole_rows) {
-    if (band.rows_to_do > 0 && band.src_w > 0) sample_rgba_band(band, rows, whole_rows);
+void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
+    if (band.rows_to_do > 0 && band.src_w > 0) sample_rgba_band(band, rows);
     __atomic_store_n(&band.done, 1, __ATOMIC_RELEASE);
-}
-
-void clear_open_row(const ovrin_rgba_band& band, const RgbaRows& rows) {
-    if (band.dst_w < 1) return;
-    memset(band.dst + rows.dst_x + band.di_31, 0, static_cast<size_t>(band.dst_w) * kRgbaBytes);
 }
 
 }  // namespace ovrin

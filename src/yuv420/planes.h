@@ -50,4 +50,19 @@ inline QuarterPlane chroma_plane(const Yuv420Source& source, const Yuv420Layout&
             source.chroma.sample_bytes};
 }
 
+struct PicturePlanes {
+    QuarterPlane planes[3];
+    int32_t count;
+};
+
+inline PicturePlanes picture_planes(const Yuv420Source& source, const Yuv420Layout& picture,
+                                    const Yuv420Destination& to) {
+    PicturePlanes all = {};
+    all.planes[all.count++] = luma_plane(source, picture, to);
+    for (int32_t plane = 0; plane < source.chroma.planes; ++plane) {
+        all.planes[all.count++] = chroma_plane(source, picture, to, plane);
+    }
+    return all;
+}
+
 }  // namespace ovrin
