@@ -6,58 +6,70 @@
 
 namespace ovrin {
 
+// Fixed point: weights have 12 fractional bits, and what is blended in both directions has 24.
+constexpr int32_t kBilinearWeightBits = 12;
+constexpr int32_t kBilinearOne = 1 << kBilinearWeightBits;
+constexpr int32_t kBilinearResultBits = 2 * kBilinearWeightBits;
+
 // Columns of a bilinear row, or of a strip of it: for every destination sample the source sample to
-// its left and the weight of the one to its right, with 12 fractional bits, 1024 to 5119.
+// its left, and the weight of the one to its right, 1024 to 5119.
 constexpr int32_t kBilinearColumns = 512;
-constexpr int32_t kBilinearLanes = kBilinearColumns;
 struct BilinearColumns {
+    int32_t sample_bytes;  // 1, 2 or 4
     int32_t count;
+    int32_t to_right;  // from the left samples to the right ones: 1, or 0 where they are the same
     int32_t index[kBilinearColumns];
     int32_t weight[kBilinearColumns];
-    // How vector kernels gather four bytes, a lane, at a time, or groups of bytes to be copied; set
-    // by prepare.
-    int32_t window_bytes;  // from which some lanes or a group take theirs; 0: no plan
-    int32_t group_bytes;
-    int32_t lane_base[kBilinearLanes];
-    alignas(64) uint8_t lane_shuffle[kBilinearLanes][16];
-    alignas(64) int32_t lane_weights[kBilinearLanes][4];
+};
+
+// How kernels find the samples of a strip: made once, used for every row of it. The columns that it
+// was made for must stay as they are. Vector kernels gather four bytes, a quad, at a time, or
+// groups of bytes to be copied.
+constexpr int32_t kBilinearQuads = kBilinearColumns;
+struct BilinearPlan {
+    const BilinearColumns* columns;
+    int32_t windows[kBilinearQuads];  // where in a row the bytes of a quad or a group lie
+    alignas(64) uint8_t shuffles[kBilinearQuads][16];
+    alignas(64) int32_t weights[kBilinearQuads][4];
+
+    int32_t bytes() const { return columns->count * columns->sample_bytes; }
 };
 
 // A source row, blended horizontally for the columns of a strip: for every destination byte a sum
-// with 12 fractional bits. What lies behind the last one up to a vector may be overwritten.
+// with 12 fractional bits. What lies past the last one up to a vector may be overwritten.
 struct BilinearSums {
     alignas(64) uint32_t values[kBilinearColumns * 4];
 };
 
-// Bilinear rows of samples of N bytes. prepare is called once for columns whose index and weight
-// are set; then, with wx and index those of column i, wy the weight of the lower row, and P(row, k)
-// = row[N*(index + k) + c], for i in [0, count) and c in [0, N), all modulo 2^32:
+// Row kernels for a plan. For every column i, with the weight wx, and every byte c of a sample of N
+// bytes, modulo 2^32:
 //
-//   across      sums = P(row, 0) * (4096 - wx) + P(row, 1) * wx
-//   vertical    dst = (P(top, 0) * (4096 - wy) + P(bottom, 0) * wy) << 12 >> 24
-//   copy        dst = P(row, 0)
+//   across  sums[N*i + c] = left * (4096 - wx) + right * wx
+//   copy    dst[N*i + c] = left
 //
-// at sums or dst[N*i + c], and for i in [0, bytes):
+//   left = row[N*index + c], right = row[N*(index + to_right) + c], index being column i's
 //
-//   down        dst[i] = (upper[i] * (4096 - wy) + lower[i] * wy) >> 24
+// and for every byte i of the strip, with wy the weight of the lower row:
 //
-// Of the rows only bytes from the first to the last of those named are read; of dst only the bytes
+//   down    dst[i] = (upper[i] * (4096 - wy) + lower[i] * wy) >> 24
+//
+// Of a row only bytes from the first to the last of those named are read; of dst only the bytes
 // named are written. No alignment is needed.
-struct BilinearBlend {
-    void (*prepare)(BilinearColumns& columns);
-    void (*across)(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns);
-    void (*down)(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
-                 int32_t bytes);
-};
-struct BilinearEdges {
-    void (*vertical)(uint8_t* dst, const uint8_t* top, const uint8_t* bottom, int32_t wy,
-                     const BilinearColumns& columns);
+using BilinearAcross = void(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan);
+using BilinearDown = void(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower,
+                          int32_t wy, const BilinearPlan& plan);
+using BilinearCopy = void(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan);
+
+struct BilinearKernels {
+    BilinearAcross* across;
+    BilinearDown* down;
 };
 
-// Here prepare plans columns whose index is set, which may come from a caller, in any order.
-struct BilinearCopy {
-    void (*prepare)(BilinearColumns& columns);
-    void (*copy)(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns);
-};
+// Plans columns that are to be blended, whose indices never decrease, and returns the kernels to
+// use with the plan: what is fastest depends on the ratio.
+using PlanBilinear = BilinearKernels(BilinearPlan& plan, const BilinearColumns& columns);
+
+// The same for columns that are to be copied, in whatever order; they need no weights.
+using PlanBilinearCopy = BilinearCopy*(BilinearPlan& plan, const BilinearColumns& columns);
 
 }  // namespace ovrin

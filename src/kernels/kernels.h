@@ -12,17 +12,17 @@ namespace ovrin {
 
 struct Kernels {
     PlanQuarters* plan_quarters;
-    const BilinearBlend* bilinear_blend;  // these three for samples of 1, 2 and 4 bytes
-    const BilinearEdges* bilinear_edges;
-    const BilinearCopy* bilinear_copy;
-    const LanczosKernels* lanczos;
+    PlanBilinear* plan_bilinear;
+    PlanBilinearCopy* plan_bilinear_copy;
+    PlanLanczos* plan_lanczos;
     CopyEvery* copy_every;
 };
 
 // The plain C++ kernels, which define what every other set must compute.
 extern const Kernels scalar_kernels;
 
-// The set in use: the best that this processor has.
+// The set in use: the best that this processor has. Every call of the library asks once and passes
+// it down.
 const Kernels& kernels();
 
 // For tests and benchmarks of the library's objects: all sets that this processor can run, the
@@ -31,8 +31,8 @@ struct NamedKernels {
     const char* name;
     const Kernels* kernels;
 };
-constexpr int32_t kMostSets = 4;
-int32_t available_kernels(NamedKernels sets[kMostSets]);
+constexpr int32_t kMaxSets = 4;
+int32_t available_kernels(NamedKernels sets[kMaxSets]);
 void force_kernels(const Kernels& set);
 
 }  // namespace ovrin
