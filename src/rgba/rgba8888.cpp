@@ -61,20 +61,17 @@ using namespace ovrin;
 
 void ovrin_resize_rgba8888_sg(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
                               int32_t dst_w, int32_t dst_h) {
-    sample_plane({
-        src,
-        ptrdiff_t{src_w} * kRgbaBytes,
-        src_w,
-        src_h,
-        reinterpret_cast<uint8_t*>(dst),
-        ptrdiff_t{dst_w} * kRgbaBytes,
-        dst_w,
-        dst_h,
-        dst_h,
-        dst_w,
-        src_w,
-        kRgbaBytes,
-    });
+    QuarterPlane plane = {};
+    plane.src = src;
+    plane.src_pitch = ptrdiff_t{src_w} * kRgbaBytes;
+    plane.src_columns = src_w;
+    plane.src_rows = src_h;
+    plane.dst = reinterpret_cast<uint8_t*>(dst);
+    plane.dst_pitch = ptrdiff_t{dst_w} * kRgbaBytes;
+    plane.dst_columns = plane.columns = dst_w;
+    plane.dst_rows = plane.rows = dst_h;
+    plane.sample_bytes = kRgbaBytes;
+    sample_plane(plane);
 }
 
 void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,

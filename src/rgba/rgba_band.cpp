@@ -26,20 +26,16 @@ void store_scan_state(ovrin_rgba_band& band, const ScanState& state) {
 }
 
 void sample_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows, BandRows whole_rows) {
-    const QuarterPlane plane = {
-        band.src + band.src_offset,
-        ptrdiff_t{rows.src_pixels} * kRgbaBytes,
-        band.src_w,
-        band.src_h,
-        reinterpret_cast<uint8_t*>(band.dst + rows.dst_x),
-        ptrdiff_t{rows.dst_pixels} * kRgbaBytes,
-        band.dst_w,
-        band.dst_h,
-        band.dst_h,
-        band.dst_w,
-        band.src_w,
-        kRgbaBytes,
-    };
+    QuarterPlane plane = {};
+    plane.src = band.src + band.src_offset;
+    plane.src_pitch = ptrdiff_t{rows.src_pixels} * kRgbaBytes;
+    plane.src_columns = band.src_w;
+    plane.src_rows = band.src_h;
+    plane.dst = reinterpret_cast<uint8_t*>(band.dst + rows.dst_x);
+    plane.dst_pitch = ptrdiff_t{rows.dst_pixels} * kRgbaBytes;
+    plane.dst_columns = plane.columns = band.dst_w;
+    plane.dst_rows = plane.rows = band.dst_h;
+    plane.sample_bytes = kRgbaBytes;
     run_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes, whole_rows);
 }
 

@@ -165,20 +165,17 @@ void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t 
         return;
     }
     clear_around_picture(*target);
-    sample_plane({
-        src,
-        ptrdiff_t{target->src_stride} * kRgbaBytes,
-        size.width,
-        size.height,
-        reinterpret_cast<uint8_t*>(first_picture_row(*target) + target->dst_x),
-        ptrdiff_t{target->canvas_width} * kRgbaBytes,
-        target->dst_width,
-        target->dst_height,
-        target->dst_height,
-        target->dst_width,
-        size.width,
-        kRgbaBytes,
-    });
+    QuarterPlane plane = {};
+    plane.src = src;
+    plane.src_pitch = ptrdiff_t{target->src_stride} * kRgbaBytes;
+    plane.src_columns = size.width;
+    plane.src_rows = size.height;
+    plane.dst = reinterpret_cast<uint8_t*>(first_picture_row(*target) + target->dst_x);
+    plane.dst_pitch = ptrdiff_t{target->canvas_width} * kRgbaBytes;
+    plane.dst_columns = plane.columns = target->dst_width;
+    plane.dst_rows = plane.rows = target->dst_height;
+    plane.sample_bytes = kRgbaBytes;
+    sample_plane(plane);
 }
 
 void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t /*src_w*/, int32_t src_h, int32_t /*dst_w*/,
