@@ -11,24 +11,6 @@ RgbaRows packed_rows(const ovrin_rgba_band& band) {
     return {band.src_w, band.dst_w, 0};
 }
 
-QuarterPlane packed_plane(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
-                          int32_t dst_w, int32_t dst_h) {
-    return {
-        src,
-        ptrdiff_t{src_w} * kRgbaBytes,
-        src_w,
-        src_h,
-        reinterpret_cast<uint8_t*>(dst),
-        ptrdiff_t{dst_w} * kRgbaBytes,
-        dst_w,
-        dst_h,
-        dst_h,
-        dst_w,
-        src_w,
-        kRgbaBytes,
-    };
-}
-
 }  // namespace
 
 }  // namespace ovrin
@@ -37,7 +19,7 @@ using namespace ovrin;
 
 void ovrin_resize_rgba8888_sg(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
                               int32_t dst_w, int32_t dst_h) {
-    sample_plane(packed_plane(src, dst, src_w, src_h, dst_w, dst_h));
+    sample_plane(rgba_plane({src, src_w, src_w, src_h}, {dst, dst_w, dst_w, dst_h}));
 }
 
 void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
@@ -52,7 +34,7 @@ void _resize_rgba8888_tp(void* band) {
 
 void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int32_t src_w, int32_t src_h,
                                int32_t dst_w, int32_t dst_h) {
-    const QuarterPlane plane = packed_plane(src, dst, src_w, src_h, dst_w, dst_h);
+    const QuarterPlane plane = rgba_plane({src, src_w, src_w, src_h}, {dst, dst_w, dst_w, dst_h});
     const int32_t bands = picture_bands(src_h, dst_h);
     if (bands < 2 || !sample_in_bands({&plane, 1, bands})) sample_plane(plane);
 }

@@ -10,6 +10,22 @@ namespace ovrin {
 
 constexpr int32_t kRgbaBytes = 4;
 
+// RGBA8888 pixels; the stride counts pixels too.
+struct RgbaSource {
+    const uint8_t* pixels;
+    int32_t stride;
+    int32_t width;
+    int32_t height;
+};
+struct RgbaDestination {
+    uint32_t* pixels;
+    int32_t stride;
+    int32_t width;
+    int32_t height;
+};
+
+QuarterPlane rgba_plane(const RgbaSource& src, const RgbaDestination& dst);
+
 // The lengths in which the two paths differ, in pixels.
 struct RgbaRows {
     int32_t src_pixels;  // from one source row to the next

@@ -97,20 +97,9 @@ RgbaRows canvas_rows(const ovrin_rgba_band& band) {
 
 QuarterPlane picture_plane(const uint8_t* src, int32_t src_stride, const SourceSize& size,
                            const ovrin_resize_target& target) {
-    return {
-        src,
-        ptrdiff_t{src_stride} * kRgbaBytes,
-        size.width,
-        size.height,
-        reinterpret_cast<uint8_t*>(first_picture_row(target) + target.dst_x),
-        ptrdiff_t{target.canvas_width} * kRgbaBytes,
-        target.dst_width,
-        target.dst_height,
-        target.dst_height,
-        target.dst_width,
-        size.width,
-        kRgbaBytes,
-    };
+    return rgba_plane({src, src_stride, size.width, size.height},
+                      {first_picture_row(target) + target.dst_x, target.canvas_width,
+                       target.dst_width, target.dst_height});
 }
 
 // False when nothing has been written.

@@ -7,7 +7,7 @@ namespace ovrin {
 
 PlaneWalk::PlaneWalk(PlaneState& plane, const ScanAxis& axis)
     : plane_(plane), axis_(axis), start_row_(plane.start_row) {
-    if (plane.start_row == 0) start_points(plane.scan, axis.source_rows);
+    if (plane.start_row == 0) start_points(plane.scan, axis.src_rows);
 }
 
 void PlaneWalk::walk(int32_t rows) {

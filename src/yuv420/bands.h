@@ -44,7 +44,7 @@ public:
     bool ends_in_open_row() const { return row_is_open(plane_.scan); }
     int32_t rows() const { return walked_; }
     // Rows of the source plane behind the walk; negative once it has passed the end.
-    int64_t rows_left() const { return int64_t{axis_.source_rows} - start_row_ - walked_; }
+    int64_t rows_left() const { return int64_t{axis_.src_rows} - start_row_ - walked_; }
 
     // Rows of the walk that a band processes: none of a luma band that runs past the plane, those
     // inside the plane of a chroma band.
