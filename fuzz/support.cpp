@@ -135,22 +135,6 @@ void Buffer::fill(uint8_t byte) {
     if (size_ > 0) memset(data_, byte, size_);
 }
 
-namespace {
-
-size_t plane_bytes(int64_t row_bytes, int64_t rows, int64_t stride) {
-    if (row_bytes < 1 || rows < 1) return 0;
-    return static_cast<size_t>((rows - 1) * (stride < 0 ? -stride : stride) + row_bytes);
-}
-
-}  // namespace
-
-Plane::Plane(Pixels& pixels, int64_t row_bytes, int64_t rows, int64_t stride, Flush flush)
-    : buffer_(plane_bytes(row_bytes, rows, stride), flush) {
-    if (stride < 0 && rows > 0) first_ = static_cast<size_t>((rows - 1) * -stride);
-    pixels.fill(buffer_.data(), buffer_.size());
-    buffer_.keep();
-}
-
 Buffer source(Pixels& pixels, int64_t bytes, Flush flush) {
     Buffer buffer(static_cast<size_t>(bytes), flush);
     pixels.fill(buffer.data(), buffer.size());

@@ -189,11 +189,11 @@ void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t ind
     };
     {
         SCOPED_TRACE("three planes");
-        const PlanarPicture src(random, s.src_w, s.src_h, stride, flush);
+        const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, stride, flush);
         auto band = walk_to<ovrin_yuv_band>(s, band_rows, stride, index);
         band.src = src.view.y;
-        band.src_u = src.view.u;
-        band.src_v = src.view.v;
+        band.src_u = src.view.chroma[0];
+        band.src_v = src.view.chroma[1];
         aim(band);
         std::vector<uint8_t> expected = before;
         reference::resize_y_u_v_tp(band, expected.data());
@@ -219,12 +219,12 @@ void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t ind
     }
     {
         SCOPED_TRACE("Y and VU");
-        const SemiPlanarPicture src(random, s.src_w, s.src_h, stride, flush);
+        const Yuv420Picture src(reference::kNv21, random, s.src_w, s.src_h, stride, flush);
         // The stretch to the end of the plane is walked in packed rows, so that a band after it
         // starts beyond the plane and reads no chroma.
         auto band = walk_to<ovrin_nv21_band>(s, band_rows, stride, index);
         band.src = src.view.y;
-        band.src_vu = src.view.vu;
+        band.src_vu = src.view.chroma[0];
         aim(band);
         std::vector<uint8_t> expected = before;
         reference::resize_y_nv21_tp(band, expected.data());
@@ -341,11 +341,13 @@ TEST(BandTasks, AllBandsTogetherGiveTheWholePicture) {
             _resize_rgba8888_tp(&made.band);
         }
         ASSERT_EQ(i420_out,
-                  reference::resize_yuv(reference::i420_source(i420.data(), s.src_w, s.src_h),
-                                        s.dst_w, s.dst_h));
+                  reference::resize_yuv420(
+                      reference::contiguous(reference::kI420, i420.data(), s.src_w, s.src_h),
+                      s.dst_w, s.dst_h));
         ASSERT_EQ(nv21_out,
-                  reference::resize_nv21(reference::nv21_source(nv21.data(), s.src_w, s.src_h),
-                                         s.dst_w, s.dst_h));
+                  reference::resize_yuv420(
+                      reference::contiguous(reference::kNv21, nv21.data(), s.src_w, s.src_h),
+                      s.dst_w, s.dst_h));
         const auto packed =
             reference::quarter_packed(rgba.data(), s.src_w, s.src_h, s.dst_w, s.dst_h, 4);
         ASSERT_TRUE(same_bytes(reinterpret_cast<const uint8_t*>(rgba_out.data()), packed.data(),
@@ -358,12 +360,12 @@ TEST(BandTasks, SamplesGoWhereTheIndicesSay) {
     Random random(114);
     SCOPED_TRACE(random.trace());
     const Sizes s = {30, 20, 16, 12};
-    const PlanarPicture src(random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, s.src_w);
     for (const int32_t index : {0, 1}) {
         auto band = walk_to<ovrin_yuv_band>(s, 10, s.src_w, index);
         band.src = src.view.y;
-        band.src_u = src.view.u;
-        band.src_v = src.view.v;
+        band.src_u = src.view.chroma[0];
+        band.src_v = src.view.chroma[1];
         band.uv_rows = 0;
         for (int32_t ovrin_yuv_band::*to :
              {&ovrin_yuv_band::y_top_left, &ovrin_yuv_band::y_top_right,
@@ -447,11 +449,11 @@ TEST(BandTasks, WithoutTheWorkBufferTheyNeedOnlyDoneIsSet) {
         GuardedBuffer<uint8_t> dst(small_bytes(random, 96));
         const std::vector<uint8_t> before = dst.copy();
         const auto i420 = random.bytes(bytes_of_i420(9, 21));
-        const auto planes = reference::i420_source(i420.data(), 9, 21);
+        const auto planes = reference::contiguous(reference::kI420, i420.data(), 9, 21);
         auto yuv = whole_picture<ovrin_yuv_band>(s);
         yuv.src = i420.data();
-        yuv.src_u = planes.u;
-        yuv.src_v = planes.v;
+        yuv.src_u = planes.chroma[0];
+        yuv.src_v = planes.chroma[1];
         yuv.dst = dst.data();
         run_task(_resize_y_u_v_tp, yuv, dst, before);
         run_task(_resize_yuv420_tp, yuv, dst, before);
@@ -470,14 +472,14 @@ TEST(BandTasks, LumaAndChromaRowsAreIndependent) {
     Random random(117);
     SCOPED_TRACE(random.trace());
     const Sizes s = {21, 40, 12, 16};
-    const PlanarPicture src(random, s.src_w, s.src_h, s.src_w);
-    const SemiPlanarPicture pairs(random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture pairs(reference::kNv21, random, s.src_w, s.src_h, s.src_w);
     for (const auto& [y_rows, chroma] : {std::pair{0, 20}, {40, 0}, {13, 20}, {40, 7}}) {
         GuardedBuffer<uint8_t> target(small_bytes(random, grid_bytes(s)));
         auto yuv = whole_picture<ovrin_yuv_band>(s);
         yuv.src = src.view.y;
-        yuv.src_u = src.view.u;
-        yuv.src_v = src.view.v;
+        yuv.src_u = src.view.chroma[0];
+        yuv.src_v = src.view.chroma[1];
         yuv.dst = target.data();
         yuv.y_rows = y_rows;
         yuv.uv_rows = chroma;
@@ -486,7 +488,7 @@ TEST(BandTasks, LumaAndChromaRowsAreIndependent) {
         run_task(_resize_y_u_v_tp, yuv, target, expected);
         auto nv21 = whole_picture<ovrin_nv21_band>(s);
         nv21.src = pairs.view.y;
-        nv21.src_vu = pairs.view.vu;
+        nv21.src_vu = pairs.view.chroma[0];
         nv21.dst = target.data();
         nv21.y_rows = y_rows;
         nv21.vu_rows = chroma;
