@@ -12,7 +12,7 @@
 
 #include "kernels/kernels.h"
 #include "reference/yuv420.h"
-#include "support/plane_extent.h"
+#include "support/extents.h"
 
 namespace fuzz {
 

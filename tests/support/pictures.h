@@ -8,8 +8,8 @@
 #include <vector>
 
 #include "reference/yuv420.h"
+#include "support/extents.h"
 #include "support/guarded_buffer.h"
-#include "support/plane_extent.h"
 #include "support/random.h"
 
 namespace ovrin_test {
