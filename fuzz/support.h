@@ -196,7 +196,7 @@ void require(bool holds, const char* what, const char* set);
 // call(name) under every instruction set that this processor has.
 struct Sets {
     Sets() { count = ovrin::available_kernels(sets); }
-    ovrin::NamedKernels sets[ovrin::kMostSets];
+    ovrin::NamedKernels sets[ovrin::kMaxSets];
     int32_t count;
 };
 const Sets& all_sets();

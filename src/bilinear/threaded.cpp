@@ -106,7 +106,8 @@ void _ov_bilinear_tp(void* band) {
     const auto& record = *static_cast<const ovrin_bilinear_band*>(band);
     const BilinearGeometry geometry = geometry_of_band(record);
     if (geometry.layout == BilinearLayout::kUnknown) return;
-    copy_rows(geometry, {record.col_index, record.col_weight, record.row_index, record.row_weight},
+    copy_rows(kernels(), geometry,
+              {record.col_index, record.col_weight, record.row_index, record.row_weight},
               record.dst_w, record.first_row, record.end_row);
 }
 

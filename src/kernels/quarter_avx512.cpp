@@ -4,7 +4,7 @@
 #include <immintrin.h>
 
 #include "kernels/inline.h"
-#include "kernels/quarter_windows.h"
+#include "kernels/quarter_windows_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {

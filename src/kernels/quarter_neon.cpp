@@ -2,9 +2,10 @@
 // Quarter-point rows with NEON. A table lookup takes up to four windows at once and gives 0 for
 // offsets outside them, or leaves the byte as it is.
 #include <arm_neon.h>
+#include <stddef.h>
 
 #include "kernels/inline.h"
-#include "kernels/quarter_windows.h"
+#include "kernels/quarter_windows_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {

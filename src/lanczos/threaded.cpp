@@ -5,6 +5,7 @@
 
 #include "dispatch/band_size.h"
 #include "dispatch/helping_run.h"
+#include "kernels/kernels.h"
 #include "lanczos/rows.h"
 
 namespace ovrin {
@@ -85,21 +86,22 @@ void _resize_lanczos_tp(void* band) {
     if (record.src_w < 1 || record.src_h < 1 || record.dst_w < 1 || record.dst_h < 1) return;
     if (record.bytes_per_pixel < 1 || record.rows < 1) return;
     const ptrdiff_t pixel = record.bytes_per_pixel;
-    const LanczosRows picture = {record.src,
-                                 record.src_w,
-                                 record.src_h,
-                                 record.src_w * pixel,
-                                 record.bytes_per_pixel,
-                                 record.dst,
-                                 record.dst_w,
-                                 record.dst_h,
-                                 record.dst_w * pixel,
-                                 record.bytes_per_pixel,
-                                 record.column_weights,
-                                 record.row_weights};
+    const LanczosPicture picture = {record.src,
+                                    record.src_w,
+                                    record.src_h,
+                                    record.src_w * pixel,
+                                    record.bytes_per_pixel,
+                                    record.dst,
+                                    record.dst_w,
+                                    record.dst_h,
+                                    record.dst_w * pixel,
+                                    record.bytes_per_pixel,
+                                    record.column_weights,
+                                    record.row_weights};
     LanczosCache cache(picture);
     if (!cache.ready()) return;
-    filter_rows(picture, cache, record.first_row, record.first_row + record.rows);
+    filter_rows(kernels().plan_lanczos, picture, cache, record.first_row,
+                record.first_row + record.rows);
 }
 
 void ovrin_resize_lanczos(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "quarter/points.h"
+#include "kernels/quarter_points.h"
 
 namespace ovrin {
 

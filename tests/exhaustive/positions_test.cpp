@@ -10,8 +10,8 @@
 
 #include "bilinear/plan.h"
 #include "exhaustive/every.h"
+#include "kernels/quarter_points.h"
 #include "lanczos/weights.h"
-#include "quarter/points.h"
 #include "reference/bilinear.h"
 #include "reference/lanczos.h"
 #include "reference/quarter.h"

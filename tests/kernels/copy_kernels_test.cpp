@@ -34,7 +34,7 @@ void check(const NamedKernels& set, int32_t step, int32_t count, Random& random)
 }  // namespace
 
 TEST(CopyKernels, TakeEveryStepthWordAndReadNoFurther) {
-    NamedKernels sets[kMostSets];
+    NamedKernels sets[kMaxSets];
     const int32_t count = available_kernels(sets);
     Random random(41);
     SCOPED_TRACE(random.trace());

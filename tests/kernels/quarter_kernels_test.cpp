@@ -100,7 +100,7 @@ bool check_row(const NamedKernels& set, const Row& row, Random& random) {
 class VectorQuarterKernels : public ::testing::Test {
 protected:
     void SetUp() override {
-        NamedKernels sets[kMostSets];
+        NamedKernels sets[kMaxSets];
         const int32_t count = available_kernels(sets);
         vector_sets_.assign(sets + 1, sets + count);
         if (vector_sets_.empty()) GTEST_SKIP() << "this processor has no vector set";

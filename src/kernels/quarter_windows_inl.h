@@ -3,14 +3,11 @@
 // gathered from a few whole source vectors, the windows, by byte shuffles. A window starts where
 // the target vector's first tap lies, or earlier at the end of a row: no window reaches past the
 // row, so kernels load whole vectors and have no border case.
-//
-// For inclusion by kernel files only: everything has internal linkage, because each of them is
-// compiled for another instruction set.
 #pragma once
 
 #include <string.h>
 
-#include "kernels/kernels.h"
+#include "kernels/quarter.h"
 
 namespace ovrin {
 
