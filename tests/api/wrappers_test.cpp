@@ -8,8 +8,7 @@
 #include <vector>
 
 #include "reference/keep_ratio_rgba.h"
-#include "reference/nv21.h"
-#include "reference/yuv.h"
+#include "reference/yuv420.h"
 #include "support/compare.h"
 #include "support/letterbox.h"
 #include "support/random.h"
@@ -58,47 +57,40 @@ void check_rgba(const ovrin_resize_target& given, int32_t src_h) {
 }
 
 // The canvas's planes lie at the start of a buffer that has room for more.
-template <class Reference>
-void check_planes(const ovrin_resize_target& given, int64_t canvas_bytes,
-                  void (*resize)(int32_t, const ovrin_resize_target*), const Reference& reference,
-                  int32_t src_h) {
+void check_planes(const reference::ChromaLayout& layout,
+                  void (*resize)(int32_t, const ovrin_resize_target*),
+                  const ovrin_resize_target& given, int32_t src_h) {
     Canvas actual(given), expected(given);
     ovrin_resize_target target = given;
     target.dst = actual.words.data();
     resize(src_h, &target);
+    const int64_t canvas_bytes =
+        reference::yuv420_size(layout, given.canvas_width, given.canvas_height);
     std::vector<uint8_t> planes(expected.bytes(), expected.bytes() + canvas_bytes);
-    reference(goes_in_bands(src_h), given, planes);
+    const reference::Yuv420Source src = {layout, source(), {source() + 1, source() + 2},
+                                         kWidth, src_h,    kWidth};
+    (goes_in_bands(src_h) ? reference::keep_ratio_yuv420_tps : reference::keep_ratio_yuv420_sg)(
+        src, given, planes);
     memcpy(expected.bytes(), planes.data(), planes.size());
     EXPECT_TRUE(same_bytes(actual.bytes(), expected.bytes(), expected.size()));
 }
 
 void check_yuv(const ovrin_resize_target& given, int32_t src_h) {
     check_planes(
-        given, reference::i420_size(given.canvas_width, given.canvas_height),
+        reference::kI420,
         [](int32_t h, const ovrin_resize_target* target) {
             ovrin_resize_y_u_v_keep_ratio(source(), source() + 1, source() + 2, kWidth, h, target);
         },
-        [&](bool threaded, const ovrin_resize_target& target, std::vector<uint8_t>& planes) {
-            const reference::YuvSource src = {source(), source() + 1, source() + 2,
-                                              kWidth,   src_h,        kWidth};
-            (threaded ? reference::keep_ratio_yuv_tps : reference::keep_ratio_yuv_sg)(src, target,
-                                                                                      planes);
-        },
-        src_h);
+        given, src_h);
 }
 
 void check_nv21(const ovrin_resize_target& given, int32_t src_h) {
     check_planes(
-        given, reference::nv21_size(given.canvas_width, given.canvas_height),
+        reference::kNv21,
         [](int32_t h, const ovrin_resize_target* target) {
             ovrin_resize_y_nv21_keep_ratio(source(), source() + 1, kWidth, h, target);
         },
-        [&](bool threaded, const ovrin_resize_target& target, std::vector<uint8_t>& planes) {
-            const reference::Nv21Source src = {source(), source() + 1, kWidth, src_h, kWidth};
-            (threaded ? reference::keep_ratio_nv21_tps : reference::keep_ratio_nv21_sg)(src, target,
-                                                                                        planes);
-        },
-        src_h);
+        given, src_h);
 }
 
 // Every combination of what makes one way or the other return early, cut the picture away, or take

@@ -14,7 +14,6 @@
 #include "lanczos/weights.h"
 #include "reference/bilinear.h"
 #include "reference/lanczos.h"
-#include "reference/nv21.h"
 #include "reference/quarter.h"
 
 using namespace ovrin_test;

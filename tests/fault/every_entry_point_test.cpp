@@ -17,8 +17,7 @@
 #include <vector>
 
 #include "declared_functions.h"
-#include "reference/nv21.h"
-#include "reference/yuv.h"
+#include "reference/yuv420.h"
 #include "support/faults.h"
 #include "support/letterbox.h"
 #include "support/random.h"

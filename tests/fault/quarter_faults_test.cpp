@@ -6,8 +6,7 @@
 
 #include <functional>
 
-#include "reference/nv21.h"
-#include "reference/yuv.h"
+#include "reference/yuv420.h"
 #include "support/faults.h"
 #include "support/letterbox.h"
 #include "support/random.h"
@@ -32,8 +31,12 @@ struct Source {
         Random random(130);
         bytes = random.bytes(static_cast<size_t>(width + 1) * static_cast<size_t>(height + 1) * 4);
     }
-    reference::YuvSource planes() const { return reference::i420_source(bytes.data(), w, h); }
-    reference::Nv21Source pairs() const { return reference::nv21_source(bytes.data(), w, h); }
+    reference::Yuv420Source planes() const {
+        return reference::contiguous(reference::kI420, bytes.data(), w, h);
+    }
+    reference::Yuv420Source pairs() const {
+        return reference::contiguous(reference::kNv21, bytes.data(), w, h);
+    }
 };
 
 using Bytes = std::vector<uint8_t>;
@@ -63,8 +66,8 @@ Bytes run_yuv420(const Source& s, int32_t w, int32_t h, bool threaded) {
 Bytes run_y_u_v(const Source& s, int32_t w, int32_t h, bool threaded) {
     Bytes dst(static_cast<size_t>(reference::i420_size(w, h)), kOld);
     const auto src = s.planes();
-    (threaded ? ovrin_resize_y_u_v_tps : ovrin_resize_y_u_v_sg)(src.y, src.u, src.v, dst.data(),
-                                                                s.w, s.h, w, h, nullptr);
+    (threaded ? ovrin_resize_y_u_v_tps : ovrin_resize_y_u_v_sg)(
+        src.y, src.chroma[0], src.chroma[1], dst.data(), s.w, s.h, w, h, nullptr);
     return dst;
 }
 
@@ -74,8 +77,8 @@ Bytes run_y_u_v_on(const Source& s, ovrin_resize_target target, bool threaded) {
     target.dst = canvas.data();
     const auto src = s.planes();
     const ovrin_resize_target before = target;
-    (threaded ? ovrin_resize_y_u_v_tps : ovrin_resize_y_u_v_sg)(src.y, src.u, src.v, nullptr, s.w,
-                                                                s.h, 0, 0, &target);
+    (threaded ? ovrin_resize_y_u_v_tps : ovrin_resize_y_u_v_sg)(src.y, src.chroma[0], src.chroma[1],
+                                                                nullptr, s.w, s.h, 0, 0, &target);
     EXPECT_TRUE(same_target(target, before));
     return canvas;
 }
@@ -90,8 +93,8 @@ Bytes run_nv21(const Source& s, int32_t w, int32_t h, bool threaded) {
 Bytes run_y_nv(const Source& s, int32_t w, int32_t h, bool threaded) {
     Bytes dst(static_cast<size_t>(reference::nv21_size(w, h)), kOld);
     const auto src = s.pairs();
-    (threaded ? ovrin_resize_y_nv_tps : ovrin_resize_y_nv_sg)(src.y, src.vu, dst.data(), s.w, s.h,
-                                                              w, h, nullptr);
+    (threaded ? ovrin_resize_y_nv_tps : ovrin_resize_y_nv_sg)(src.y, src.chroma[0], dst.data(), s.w,
+                                                              s.h, w, h, nullptr);
     return dst;
 }
 
@@ -101,8 +104,8 @@ Bytes run_y_nv_on(const Source& s, ovrin_resize_target target, bool threaded) {
     target.dst = canvas.data();
     const auto src = s.pairs();
     const ovrin_resize_target before = target;
-    (threaded ? ovrin_resize_y_nv_tps : ovrin_resize_y_nv_sg)(src.y, src.vu, nullptr, s.w, s.h, 0,
-                                                              0, &target);
+    (threaded ? ovrin_resize_y_nv_tps : ovrin_resize_y_nv_sg)(src.y, src.chroma[0], nullptr, s.w,
+                                                              s.h, 0, 0, &target);
     EXPECT_TRUE(same_target(target, before));
     return canvas;
 }

@@ -4,14 +4,11 @@
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
 
-#include <algorithm>
-#include <memory>
 #include <vector>
 
-#include "kernels/kernels.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
-#include "support/random.h"
+#include "support/vector_sets.h"
 
 using namespace ovrin;
 using namespace ovrin_test;
@@ -20,14 +17,8 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-class EngineKernels : public ::testing::Test {
+class EngineKernels : public VectorSets {
 protected:
-    void SetUp() override {
-        NamedKernels sets[kMaxSets];
-        const int32_t count = available_kernels(sets);
-        vector_sets_.assign(sets + 1, sets + count);
-        if (vector_sets_.empty()) GTEST_SKIP() << "this processor has no vector set";
-    }
     void TearDown() override { force_kernels(*best_); }
 
     // Calls resize(dst) with scalar kernels and with each other set.
@@ -56,22 +47,10 @@ protected:
     }
 
     const Kernels* best_ = &kernels();
-    std::vector<NamedKernels> vector_sets_;
 };
 
 Bytes constant(size_t count, int value) {
     return Bytes(count, static_cast<uint8_t>(value));
-}
-
-// Samples `quarters` / 4 apart.
-void fill_columns(BilinearColumns& columns, int32_t sample_bytes, int32_t count, int32_t quarters) {
-    columns.sample_bytes = sample_bytes;
-    columns.count = count;
-    columns.to_right = 1;
-    for (int32_t i = 0; i < count; ++i) {
-        columns.index[i] = i * quarters / 4;
-        columns.weight[i] = 1024 + i * 37 % 4096;
-    }
 }
 
 // Squares of black and white: every output lies beside a hard edge, many half way between bytes.
@@ -85,34 +64,6 @@ Bytes checkerboard(int32_t w, int32_t h) {
 }
 
 }  // namespace
-
-// Columns that every set has kernels for.
-TEST_F(EngineKernels, TheSetsHaveKernelsOfTheirOwn) {
-    auto columns = std::make_unique<BilinearColumns>();
-    auto plan = std::make_unique<BilinearPlan>();
-    for (const int32_t n : {1, 2, 4}) {
-        fill_columns(*columns, n, 300, 5);
-        const BilinearKernels scalar = scalar_kernels.plan_bilinear(*plan, *columns);
-        BilinearCopy* scalar_copy = scalar_kernels.plan_bilinear_copy(*plan, *columns);
-        for (const NamedKernels& set : vector_sets_) {
-            const BilinearKernels own = set.kernels->plan_bilinear(*plan, *columns);
-            EXPECT_NE(own.across, scalar.across) << set.name;
-            EXPECT_NE(own.down, scalar.down) << set.name;
-            EXPECT_NE(set.kernels->plan_bilinear_copy(*plan, *columns), scalar_copy) << set.name;
-        }
-    }
-    const std::vector<double> weights(7, 1.0 / 7);
-    auto strip = std::make_unique<LanczosColumns>();
-    auto strip_plan = std::make_unique<LanczosStripPlan>();
-    strip->weights = weights.data();
-    strip->src_components = strip->dst_components = 4;
-    strip->count = 1;
-    strip->index[0] = 0;
-    FilterLanczos* scalar = scalar_kernels.plan_lanczos(*strip_plan, *strip);
-    for (const NamedKernels& set : vector_sets_) {
-        EXPECT_NE(set.kernels->plan_lanczos(*strip_plan, *strip), scalar) << set.name;
-    }
-}
 
 TEST_F(EngineKernels, BilinearOfRandomSizes) {
     Random random(41);
@@ -208,72 +159,6 @@ TEST_F(EngineKernels, BilinearCopiesInAnyOrder) {
     }
 }
 
-// Kernel by kernel: windows of every width, and ratios beyond them; columns with a right neighbour
-// and without; nothing is there to read but what the columns name.
-TEST_F(EngineKernels, BilinearRowsOfEveryReduction) {
-    Random random(50);
-    SCOPED_TRACE(random.trace());
-    auto columns = std::make_unique<BilinearColumns>();
-    auto plan = std::make_unique<BilinearPlan>();
-    auto expected_plan = std::make_unique<BilinearPlan>();
-    auto sums = std::make_unique<BilinearSums[]>(2);
-    auto expected_sums = std::make_unique<BilinearSums[]>(2);
-    for (const NamedKernels& set : vector_sets_) {
-        for (int32_t quarters = 1; quarters <= 48; ++quarters) {
-            for (const int32_t n : {1, 2, 4}) {
-                const int32_t count = random.pick({random.between(1, 70), kBilinearColumns});
-                fill_columns(*columns, n, count, quarters);
-                columns->to_right = random.between(0, 1);
-                const int32_t samples = columns->index[count - 1] + columns->to_right + 1;
-                SCOPED_TRACE(::testing::Message() << set.name << ", " << count << " columns of "
-                                                  << n << " bytes, ratio " << quarters << "/4");
-                const auto bytes = static_cast<size_t>(count * n);
-                const auto flush = random.pick({Flush::kEnd, Flush::kStart});
-                Bytes expected(bytes);
-                GuardedBuffer<uint8_t> actual(bytes, flush, 0xEE);
-                const BilinearKernels scalar =
-                    scalar_kernels.plan_bilinear(*expected_plan, *columns);
-                const BilinearKernels own = set.kernels->plan_bilinear(*plan, *columns);
-                for (size_t i = 0; i < 2; ++i) {
-                    const GuardedBuffer<uint8_t> row(random.bytes(static_cast<size_t>(samples * n)),
-                                                     flush);
-                    scalar.across(expected_sums[i], row.data(), *expected_plan);
-                    own.across(sums[i], row.data(), *plan);
-                }
-                const int32_t wy = random.between(1024, 5119);
-                scalar.down(expected.data(), expected_sums[0], expected_sums[1], wy,
-                            *expected_plan);
-                own.down(actual.data(), sums[0], sums[1], wy, *plan);
-                ASSERT_TRUE(same_bytes(actual.data(), expected.data(), bytes));
-                ASSERT_TRUE(actual.intact());
-            }
-        }
-    }
-}
-
-TEST_F(EngineKernels, BilinearCopiesOfEveryReduction) {
-    Random random(48);
-    auto columns = std::make_unique<BilinearColumns>();
-    auto plan = std::make_unique<BilinearPlan>();
-    for (const NamedKernels& set : vector_sets_) {
-        for (int32_t quarters = 1; quarters <= 48; ++quarters) {
-            for (const int32_t n : {1, 2, 4}) {
-                fill_columns(*columns, n, random.between(60, kBilinearColumns), quarters);
-                const int32_t samples = columns->index[columns->count - 1] + 1;
-                const GuardedBuffer<uint8_t> row(random.bytes(static_cast<size_t>(samples * n)));
-                Bytes expected(static_cast<size_t>(columns->count * n));
-                GuardedBuffer<uint8_t> actual(expected.size(), Flush::kEnd, 0xEE);
-                scalar_kernels.plan_bilinear_copy(*plan, *columns)(expected.data(), row.data(),
-                                                                   *plan);
-                set.kernels->plan_bilinear_copy(*plan, *columns)(actual.data(), row.data(), *plan);
-                ASSERT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()))
-                    << set.name << ", " << n << " bytes, ratio " << quarters << "/4";
-                ASSERT_TRUE(actual.intact());
-            }
-        }
-    }
-}
-
 TEST_F(EngineKernels, LanczosOfRandomSizes) {
     Random random(43);
     SCOPED_TRACE(random.trace());
@@ -316,42 +201,6 @@ TEST_F(EngineKernels, LanczosAroundStripBorders) {
             lanczos_alike(src, src_w, src_h, dst_w, random.pick({5, 9, 30}), n);
         }
     }
-}
-
-// Sums of source rows that are still held must not be taken for those of others.
-TEST_F(EngineKernels, LanczosRowsInAnyOrder) {
-    Random random(49);
-    constexpr int32_t kColumns = 37, kPixels = 90, kRows = 25, kResults = 60;
-    const Bytes src = random.bytes(kPixels * kRows * 4);
-    std::vector<double> columns;
-    for (int32_t i = 0; i < kColumns * 7; ++i) columns.push_back(random.between(-30, 60) / 250.0);
-    std::vector<std::vector<double>> weights(kResults, std::vector<double>(7));
-    std::vector<int32_t> middles;
-    for (std::vector<double>& row : weights) {
-        for (double& weight : row) weight = random.between(-30, 60) / 250.0;
-        middles.push_back(random.between(0, kRows - 1));
-    }
-    LanczosColumns strip;
-    LanczosStripPlan plan;
-    LanczosSums sums;
-    strip.src_components = strip.dst_components = 4;
-    strip.count = kColumns;
-    strip.weights = columns.data();
-    for (int32_t x = 0; x < kColumns; ++x) strip.index[x] = x * (kPixels - 7) / (kColumns - 1);
-    expect_alike(kResults * kColumns * 4, [&](uint8_t* dst) {
-        FilterLanczos* filter = kernels().plan_lanczos(plan, strip);
-        sums.clear();
-        for (size_t i = 0; i < kResults; ++i) {
-            LanczosRow row;
-            row.dst = dst + i * kColumns * 4;
-            row.weights = weights[i].data();
-            for (int32_t k = 0; k < 7; ++k) {
-                row.source_rows[k] = std::min(std::max(middles[i] - 3 + k, 0), kRows - 1);
-                row.taps[k] = src.data() + row.source_rows[k] * kPixels * 4;
-            }
-            filter(row, plan, sums);
-        }
-    });
 }
 
 TEST_F(EngineKernels, LanczosRowsWiderThanASpan) {

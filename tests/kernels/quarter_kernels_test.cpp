@@ -6,10 +6,9 @@
 #include <algorithm>
 #include <memory>
 
-#include "kernels/kernels.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
-#include "support/random.h"
+#include "support/vector_sets.h"
 
 using namespace ovrin;
 using namespace ovrin_test;
@@ -48,6 +47,11 @@ std::unique_ptr<Planned> plan_with(const Kernels& set, const Row& row, int32_t f
 
 enum class Kernel { kStorePair, kAddPair, kAddRow };
 
+const char* name_of(Kernel kernel) {
+    constexpr const char* kNames[] = {"store_pair", "add_pair", "add_row"};
+    return kNames[static_cast<int>(kernel)];
+}
+
 void run(const Planned& planned, Kernel kernel, uint8_t* dst, const uint8_t* top,
          const uint8_t* bottom) {
     switch (kernel) {
@@ -84,9 +88,9 @@ bool check_row(const NamedKernels& set, const Row& row, Random& random) {
                 differs |= scalar->kernels != tested->kernels;
             }
             EXPECT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()))
-                << set.name << " kernel " << static_cast<int>(kernel) << ": " << row.src_columns
-                << " to " << row.dst_columns << " samples of " << row.sample_bytes
-                << " bytes, strip at " << done;
+                << set.name << ", " << name_of(kernel) << ": " << row.src_columns << " to "
+                << row.dst_columns << " samples of " << row.sample_bytes << " bytes, strip at "
+                << done;
             EXPECT_TRUE(actual.intact());
         }
         done += strip;
@@ -94,17 +98,7 @@ bool check_row(const NamedKernels& set, const Row& row, Random& random) {
     return differs;
 }
 
-class VectorQuarterKernels : public ::testing::Test {
-protected:
-    void SetUp() override {
-        NamedKernels sets[kMaxSets];
-        const int32_t count = available_kernels(sets);
-        vector_sets_.assign(sets + 1, sets + count);
-        if (vector_sets_.empty()) GTEST_SKIP() << "this processor has no vector set";
-    }
-
-    std::vector<NamedKernels> vector_sets_;
-};
+using VectorQuarterKernels = VectorSets;
 
 }  // namespace
 
