@@ -50,14 +50,14 @@ Plane first_plane(const BilinearGeometry& g) {
 Plane chroma_plane(const BilinearGeometry& g, int32_t number) {
     const Yuv420Layout canvas = g.canvas_planes();
     const bool planar = g.layout == BilinearLayout::kPlanar;
-    const int32_t bytes = canvas.chroma.sample_bytes;
+    const int32_t bytes = canvas.format.chroma_bytes();
     Plane plane = {};
     plane.src = g.src_chroma[number];
     plane.src_pitch = ptrdiff_t{half_rounded_up(g.src_stride)} * bytes;
     // Planar edge columns take their lower sample a luma row further on, about two chroma rows
     // down.
     plane.edge_pitch = planar ? ptrdiff_t{g.src_stride} : plane.src_pitch;
-    plane.dst_pitch = canvas.chroma_row();
+    plane.dst_pitch = canvas.chroma_pitch();
     plane.dst = g.canvas + canvas.chroma_offset(number) + (g.dst_y >> 1) * plane.dst_pitch +
                 ptrdiff_t{g.dst_x >> 1} * bytes;
     plane.sample_bytes = bytes;
@@ -70,7 +70,7 @@ template <class Function>
 void for_each_plane(const BilinearGeometry& g, const Function& function) {
     function(first_plane(g));
     if (g.layout == BilinearLayout::kPixels) return;
-    const int32_t planes = g.canvas_planes().chroma.planes;
+    const int32_t planes = g.canvas_planes().format.chroma_planes;
     for (int32_t i = 0; i < planes; ++i) function(chroma_plane(g, i));
 }
 

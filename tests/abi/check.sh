@@ -50,7 +50,7 @@ make_twin() {
     change src/dispatch/sleep.cpp 's/ov_sleep(uint32_t/ov_sleep(uint64_t/'
     change src/dispatch/sleep.cpp 's/usleep(useconds)/usleep(static_cast<uint32_t>(useconds))/'
     # Its assertions would refuse the record before anything is compared.
-    change src/layout.cpp "/^static_assert/,\$d"
+    change src/dispatch/records.cpp "/^static_assert/,\$d"
     cd - >/dev/null
 }
 
