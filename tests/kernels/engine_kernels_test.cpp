@@ -241,9 +241,10 @@ TEST_F(EngineKernels, BilinearRowsOfEveryReduction) {
                     own.across(sums[i], row.data(), *plan);
                 }
                 const int32_t wy = random.between(1024, 5119);
-                scalar.down(expected.data(), expected_sums[0], expected_sums[1], wy,
-                            *expected_plan);
-                own.down(actual.data(), sums[0], sums[1], wy, *plan);
+                const BilinearNext next = {{actual.data(), actual.data()}, random.between(0, 5000)};
+                scalar.down(expected.data(), expected_sums[0], expected_sums[1], wy, *expected_plan,
+                            next);
+                own.down(actual.data(), sums[0], sums[1], wy, *plan, next);
                 ASSERT_TRUE(same_bytes(actual.data(), expected.data(), bytes));
                 ASSERT_TRUE(actual.intact());
             }
