@@ -98,10 +98,16 @@ void for_each_strip(const Plane& plane, const BilinearAxes& axes, Range samples,
     }
 }
 
-void prefetch_columns(const BilinearColumns& columns, const uint8_t* row) {
+// The part of a source row that the columns name.
+struct Span {
+    int64_t first;
+    int64_t bytes;
+};
+
+Span span_of(const BilinearColumns& columns) {
     const int64_t bytes = columns.sample_bytes;
     const int64_t first = bytes * columns.index[0];
-    prefetch(row + first, bytes * (columns.index[columns.count - 1] + int64_t{2}) - first);
+    return {first, bytes * (columns.index[columns.count - 1] + int64_t{2}) - first};
 }
 
 // A strip of a plane, and two of its source rows, blended horizontally. A destination row takes two
@@ -122,16 +128,23 @@ public:
             const uint8_t* bottom = top + below;
             const BilinearSums& upper = sums(top, bottom);
             const BilinearSums& lower = sums(bottom, top);
-            if (r + step < rows.end) {
-                const uint8_t* next = plane.src_row(axes.row_index[r + step]);
-                if (next > bottom) prefetch_columns(columns_, next);
-                if (next > top) prefetch_columns(columns_, next + below);
-            }
-            kernels_.down(plane.dst_row(r) + offset, upper, lower, axes.row_weight[r], plan_);
+            const uint8_t* next =
+                r + step < rows.end ? plane.src_row(axes.row_index[r + step]) : top;
+            kernels_.down(plane.dst_row(r) + offset, upper, lower, axes.row_weight[r], plan_,
+                          rows_to_fetch(top, bottom, next, below));
         }
     }
 
 private:
+    // What `next` and the row below it take that `top` and `bottom` do not.
+    BilinearNext rows_to_fetch(const uint8_t* top, const uint8_t* bottom, const uint8_t* next,
+                               ptrdiff_t below) const {
+        if (next <= top) return {};
+        const Span span = span_of(columns_);
+        const uint8_t* second = next + below + span.first;
+        return {{next > bottom ? next + span.first : second, second}, span.bytes};
+    }
+
     // The sums of `row`; those of `kept` stay as well if they are there.
     const BilinearSums& sums(const uint8_t* row, const uint8_t* kept) {
         const int held = row == rows_[0] ? 0 : 1;
@@ -178,9 +191,12 @@ void copy_plane(const Kernels& set, const Plane& plane, const BilinearAxes& axes
     const auto copy_strip = [&](const BilinearColumns& strip, int32_t first) {
         BilinearPlan plan;
         BilinearCopy* copy = set.plan_bilinear_copy(plan, strip);
+        const Span span = span_of(strip);
         for (int32_t r = plane.first_row(rows.first); r < rows.end; r += plane.subsampling) {
             const int32_t next = r + plane.subsampling;
-            if (next < rows.end) prefetch_columns(strip, plane.src_row(axes.row_index[next]));
+            if (next < rows.end) {
+                prefetch(plane.src_row(axes.row_index[next]) + span.first, span.bytes);
+            }
             copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
                  plane.src_row(axes.row_index[r]), plan);
         }
