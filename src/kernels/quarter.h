@@ -67,4 +67,9 @@ struct QuarterKernels {
 using PlanQuarters = const QuarterKernels&(QuarterPlan& plan, const QuarterRowShape& shape,
                                            QuarterColumns& columns, int32_t samples);
 
+// The same for rows with one of the ratios that a set has kernels for; null, and nothing is
+// changed, for all others.
+using PlanSimpleQuarters = const QuarterKernels*(QuarterPlan& plan, const QuarterRowShape& shape,
+                                                 QuarterColumns& columns, int32_t samples);
+
 }  // namespace ovrin

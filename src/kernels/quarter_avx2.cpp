@@ -4,7 +4,6 @@
 #include <immintrin.h>
 
 #include "kernels/inline.h"
-#include "kernels/quarter_ratios_avx2_inl.h"
 #include "kernels/quarter_windows_inl.h"
 #include "kernels/sets.h"
 
@@ -164,10 +163,7 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
 
 const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
-    const QuarterKernels* simple =
-        plan_patterns<TwoToOne<1>, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
-                      ThreeToTwo<4>, FourToOne<1>, FourToOne<2>, FourToOne<4>, ThreeToOne<1>,
-                      ThreeToOne<2>, ThreeToOne<4>>(plan, shape, columns, samples);
+    const QuarterKernels* simple = plan_simple_quarters_avx2(plan, shape, columns, samples);
     if (simple != nullptr) return *simple;
     const WindowShape lane = window_shape(shape, kLane, kMaxWindows);
     if (lane.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);

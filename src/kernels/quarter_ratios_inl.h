@@ -11,6 +11,7 @@
 #pragma once
 
 #include <stddef.h>
+#include <string.h>
 
 #include "kernels/inline.h"
 #include "kernels/quarter.h"
@@ -23,13 +24,14 @@ namespace {
 struct SimpleRatio {
     int32_t src;
     int32_t dst;
-    Tap taps[2];
+    Tap taps[3];
 };
 
 constexpr SimpleRatio kTwoToOne = {2, 1, {{0, 1}}};
 constexpr SimpleRatio kThreeToOne = {3, 1, {{0, 2}}};
 constexpr SimpleRatio kFourToOne = {4, 1, {{1, 3}}};
 constexpr SimpleRatio kThreeToTwo = {3, 2, {{0, 1}, {1, 2}}};
+constexpr SimpleRatio kTwoToThree = {2, 3, {{0, 0}, {0, 1}, {1, 1}}};
 
 // Whether the columns that come next have these taps: from one group to the next the points move by
 // a whole number of source columns, so that the taps of one group tell those of all others. Only
@@ -72,13 +74,13 @@ template <class Pattern, bool kPair, bool kAdd>
 OVRIN_ALWAYS_INLINE void make_vectors(uint8_t* dst, const QuarterRows& rows, ptrdiff_t offset,
                                       ptrdiff_t done) {
     const uint8_t* top = rows.top + offset;
-    const uint8_t* bottom = kPair ? rows.bottom + offset : nullptr;
+    const uint8_t* bottom = kPair ? rows.bottom + offset : top;
     if (!kAdd) return Pattern::template store<kPair>(dst, top, bottom);
     alignas(64) uint8_t sums[Pattern::kDstBytes];
     Pattern::template store<kPair>(sums, top, bottom);
-    for (ptrdiff_t i = done; i < Pattern::kDstBytes; ++i) {
+    memset(sums, 0, static_cast<size_t>(done));
+    for (int32_t i = 0; i < Pattern::kDstBytes; ++i)
         dst[i] = static_cast<uint8_t>(dst[i] + sums[i]);
-    }
 }
 
 // The last vectors end where the strip ends, and share some bytes with those before them.

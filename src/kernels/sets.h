@@ -10,6 +10,8 @@ PlanQuarters plan_quarters_scalar;
 PlanQuarters plan_quarters_avx2;
 PlanQuarters plan_quarters_avx512;
 PlanQuarters plan_quarters_neon;
+PlanSimpleQuarters plan_simple_quarters_avx2;
+PlanSimpleQuarters plan_simple_quarters_neon;
 
 extern const BilinearBlend bilinear_blend_scalar[3];
 extern const BilinearBlend bilinear_blend_avx2[3];

@@ -121,7 +121,9 @@ std::vector<SimpleRatio> simple_ratios(const NamedKernels& set) {
     for (const int32_t n : {1, 2, 4}) {
         for (const Ratio ratio : {Ratio{2, 1}, Ratio{3, 1}, Ratio{4, 1}, Ratio{3, 2}}) {
             all.push_back({"avx2", n, ratio});
+            all.push_back({"neon", n, ratio});
         }
+        all.push_back({"neon", n, {2, 3}});
     }
     std::vector<SimpleRatio> of_set;
     std::copy_if(all.begin(), all.end(), std::back_inserter(of_set),

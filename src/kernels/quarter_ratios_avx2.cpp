@@ -4,11 +4,10 @@
 // Averages are exact here: where the two low bits of a and b are zero, avg_epu8(a, b) is twice the
 // sum of their quarters. It is even and at most 252, so that the average of two such sums is the
 // sum of all four quarters.
-#pragma once
-
 #include <immintrin.h>
 
 #include "kernels/quarter_ratios_inl.h"
+#include "kernels/sets.h"
 
 namespace ovrin {
 
@@ -222,5 +221,12 @@ struct ThreeToTwo {
 };
 
 }  // namespace
+
+const QuarterKernels* plan_simple_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
+                                                QuarterColumns& columns, int32_t samples) {
+    return plan_patterns<TwoToOne<1>, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
+                         ThreeToTwo<4>, FourToOne<1>, FourToOne<2>, FourToOne<4>, ThreeToOne<1>,
+                         ThreeToOne<2>, ThreeToOne<4>>(plan, shape, columns, samples);
+}
 
 }  // namespace ovrin
