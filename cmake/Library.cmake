@@ -48,12 +48,14 @@ add_library(ovrinresize_objects OBJECT
   src/yuv420/work_buffer.cpp)
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
   target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
-    src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp)
+    src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp
+    src/kernels/quarter_ratios_neon.cpp)
   # Otherwise atomics may call helpers of the compiler's run-time library.
   target_compile_options(ovrinresize_objects PRIVATE -mno-outline-atomics)
 elseif(CMAKE_SYSTEM_PROCESSOR MATCHES "x86_64|AMD64")
   set(avx2_sources src/kernels/bilinear_avx2.cpp src/kernels/copy_avx2.cpp
-    src/kernels/lanczos_avx2.cpp src/kernels/quarter_avx2.cpp)
+    src/kernels/lanczos_avx2.cpp src/kernels/quarter_avx2.cpp
+    src/kernels/quarter_ratios_avx2.cpp)
   set(avx512_sources src/kernels/bilinear_avx512.cpp
     src/kernels/lanczos_avx512.cpp src/kernels/quarter_avx512.cpp)
   target_sources(ovrinresize_objects PRIVATE ${avx2_sources} ${avx512_sources})
