@@ -7,6 +7,7 @@
 #include <iostream>
 
 #include "chart.h"
+#include "kernel_bench.h"
 #include "machine.h"
 #include "report.h"
 #include "stack.h"
@@ -25,7 +26,8 @@ constexpr char kUsage[] =
     "  --quick         few and short samples: a first impression\n"
     "  --json FILE     write all numbers\n"
     "  --chart FILE    write what bench/chart.gp draws\n"
-    "  --stack         measure instead how much stack our calls take\n";
+    "  --stack         measure instead how much stack our calls take\n"
+    "  --kernels       measure instead each kernel of each set alone\n";
 
 struct Options {
     std::string filter;
@@ -34,6 +36,7 @@ struct Options {
     std::string chart;
     Effort effort = {Caches::kWarm, 31, 5e-4, 8};
     bool stack = false;
+    bool kernels = false;
 };
 
 [[noreturn]] void give_up(const std::string& why) {
@@ -51,12 +54,17 @@ int positive_number(const char* text) {
 }
 
 Options parse(int argc, char** argv) {
-    static const option kOptions[] = {
-        {"filter", required_argument, nullptr, 'f'}, {"isa", required_argument, nullptr, 'i'},
-        {"rounds", required_argument, nullptr, 'r'}, {"cold", no_argument, nullptr, 'C'},
-        {"quick", no_argument, nullptr, 'q'},        {"json", required_argument, nullptr, 'j'},
-        {"chart", required_argument, nullptr, 'c'},  {"stack", no_argument, nullptr, 's'},
-        {"help", no_argument, nullptr, 'h'},         {nullptr, 0, nullptr, 0}};
+    static const option kOptions[] = {{"filter", required_argument, nullptr, 'f'},
+                                      {"isa", required_argument, nullptr, 'i'},
+                                      {"rounds", required_argument, nullptr, 'r'},
+                                      {"cold", no_argument, nullptr, 'C'},
+                                      {"quick", no_argument, nullptr, 'q'},
+                                      {"json", required_argument, nullptr, 'j'},
+                                      {"chart", required_argument, nullptr, 'c'},
+                                      {"stack", no_argument, nullptr, 's'},
+                                      {"kernels", no_argument, nullptr, 'k'},
+                                      {"help", no_argument, nullptr, 'h'},
+                                      {nullptr, 0, nullptr, 0}};
     Options options;
     for (int c; (c = getopt_long(argc, argv, "", kOptions, nullptr)) != -1;) {
         switch (c) {
@@ -85,6 +93,9 @@ Options parse(int argc, char** argv) {
                 break;
             case 's':
                 options.stack = true;
+                break;
+            case 'k':
+                options.kernels = true;
                 break;
             case 'h':
                 std::cout << kUsage;
@@ -128,16 +139,27 @@ std::ofstream create(const std::string& path) {
     return file;
 }
 
+void print_lines(const std::vector<std::string>& lines) {
+    for (const std::string& line : lines) std::cout << line << '\n';
+    std::cout << '\n';
+}
+
 void run_bench(const Options& options) {
     if (!choose_kernels(options.isa)) {
         give_up("this processor has no kernels '" + options.isa + "'");
+    }
+    if (options.kernels) {
+        print_lines(describe_machine());
+        if (!print_kernels(std::cout, options.filter, options.effort)) {
+            give_up("no kernel holds '" + options.filter + "'");
+        }
+        return;
     }
     const std::vector<Case> cases = wanted_cases(options.filter);
     std::vector<std::string> machine = describe_machine();
     const bool cold = options.effort.caches == Caches::kCold;
     machine.push_back(cold ? "caches: cold" : "caches: warm");
-    for (const std::string& line : machine) std::cout << line << '\n';
-    std::cout << '\n';
+    print_lines(machine);
     if (options.stack) {
         print_stack_use(std::cout, cases);
         return;
