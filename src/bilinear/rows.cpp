@@ -142,8 +142,6 @@ private:
         return sums_[free];
     }
 
-    // The sums come first: modulo 4096 bytes they must not lie shortly after the plan's vectors.
-    // Processors would take what is loaded for what has just been stored, and be a fifth slower.
     BilinearSums sums_[2];
     BilinearPlan plan_;
     const BilinearColumns& columns_;

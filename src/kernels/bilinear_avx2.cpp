@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
-// Blended bilinear rows with AVX2: two quads at a time.
+// Blended bilinear rows with AVX2: two quads in a vector.
 #include <immintrin.h>
+#include <stddef.h>
 #include <string.h>
 
 #include "kernels/bilinear_quads_inl.h"
@@ -10,31 +11,40 @@ namespace ovrin {
 
 namespace {
 
-constexpr int32_t kStepQuads = 2;
-constexpr int32_t kStepSums = kStepQuads * kQuadBytes;
+constexpr int32_t kStepQuads = 4;
 constexpr int32_t kStepBytes = 32;  // of a finished row
 
 __m256i load_sums(const uint32_t* sums) {
     return _mm256_load_si256(reinterpret_cast<const __m256i*>(sums));
 }
 
-// Left and right samples of two quads, blended.
-__m256i blend_quads(const uint8_t* row, const BilinearPlan& plan, int32_t quad) {
+// The windows of two quads, which may be one.
+template <int kWindowQuads>
+__m256i load_windows(const uint8_t* row, const BilinearPlan& plan, ptrdiff_t quad) {
     const auto* low = reinterpret_cast<const __m128i*>(row + plan.windows[quad]);
+    if (kWindowQuads == 2) return _mm256_broadcastsi128_si256(_mm_loadu_si128(low));
     const auto* high = reinterpret_cast<const __m128i*>(row + plan.windows[quad + 1]);
-    const __m256i windows = _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
-                                                    _mm_loadu_si128(high), 1);
-    const auto* shuffle = reinterpret_cast<const __m256i*>(plan.shuffles[quad]);
-    const auto* weights = reinterpret_cast<const __m256i*>(plan.weights[quad]);
-    return _mm256_madd_epi16(_mm256_shuffle_epi8(windows, _mm256_load_si256(shuffle)),
-                             _mm256_load_si256(weights));
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
+                                   _mm_loadu_si128(high), 1);
 }
 
+// Left and right samples of two quads, blended.
+template <int kWindowQuads>
+void blend_quads(uint32_t* sums, const uint8_t* row, const BilinearPlan& plan, ptrdiff_t quad) {
+    const auto* shuffle = reinterpret_cast<const __m256i*>(plan.shuffles[quad]);
+    const auto* weights = reinterpret_cast<const __m256i*>(plan.weights[quad]);
+    const __m256i samples = _mm256_shuffle_epi8(load_windows<kWindowQuads>(row, plan, quad),
+                                                _mm256_load_si256(shuffle));
+    _mm256_store_si256(reinterpret_cast<__m256i*>(sums + quad * kQuadBytes),
+                       _mm256_madd_epi16(samples, _mm256_load_si256(weights)));
+}
+
+template <int kWindowQuads>
 void across(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
-    const int32_t count = plan.bytes();
-    for (int32_t i = 0; i < count; i += kStepSums) {
-        _mm256_store_si256(reinterpret_cast<__m256i*>(sums.values + i),
-                           blend_quads(row, plan, i / kQuadBytes));
+    const ptrdiff_t quads = (plan.bytes() + kQuadBytes - 1) / kQuadBytes;
+    for (ptrdiff_t quad = 0; quad < quads; quad += kStepQuads) {
+        blend_quads<kWindowQuads>(sums.values, row, plan, quad);
+        blend_quads<kWindowQuads>(sums.values, row, plan, quad + 2);
     }
 }
 
@@ -101,7 +111,8 @@ void copy_groups_of_8(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan
 }  // namespace
 
 BilinearKernels plan_bilinear_avx2(BilinearPlan& plan, const BilinearColumns& columns) {
-    if (plan_quads(plan, columns, {16, 1, kStepQuads})) return {across, down};
+    if (plan_quads(plan, columns, {16, 2, kStepQuads})) return {across<2>, down};
+    if (plan_quads(plan, columns, {16, 1, kStepQuads})) return {across<1>, down};
     return {plan_bilinear_scalar(plan, columns).across, down};
 }
 
