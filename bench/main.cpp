@@ -7,6 +7,7 @@
 #include <iostream>
 
 #include "chart.h"
+#include "kernel_bench.h"
 #include "machine.h"
 #include "report.h"
 #include "stack.h"
@@ -29,7 +30,8 @@ constexpr char kUsage[] =
     "  --json FILE     write all numbers\n"
     "  --chart FILE    write what bench/chart.gp draws\n"
     "  --stack         measure instead how much stack our calls take\n"
-    "  --threads       measure only what threads cost\n";
+    "  --threads       measure instead what threads cost\n"
+    "  --kernels       measure instead each kernel of each set alone\n";
 
 struct Options {
     std::string filter;
@@ -39,6 +41,7 @@ struct Options {
     Effort effort = {Caches::kWarm, 31, 5e-4, 8};
     bool stack = false;
     bool threads = false;
+    bool kernels = false;
 };
 
 [[noreturn]] void give_up(const std::string& why) {
@@ -56,17 +59,13 @@ int positive_number(const char* text) {
 }
 
 Options parse(int argc, char** argv) {
-    static const option kOptions[] = {{"filter", required_argument, nullptr, 'f'},
-                                      {"isa", required_argument, nullptr, 'i'},
-                                      {"rounds", required_argument, nullptr, 'r'},
-                                      {"cold", no_argument, nullptr, 'C'},
-                                      {"quick", no_argument, nullptr, 'q'},
-                                      {"json", required_argument, nullptr, 'j'},
-                                      {"chart", required_argument, nullptr, 'c'},
-                                      {"stack", no_argument, nullptr, 's'},
-                                      {"threads", no_argument, nullptr, 't'},
-                                      {"help", no_argument, nullptr, 'h'},
-                                      {nullptr, 0, nullptr, 0}};
+    static const option kOptions[] = {
+        {"filter", required_argument, nullptr, 'f'}, {"isa", required_argument, nullptr, 'i'},
+        {"rounds", required_argument, nullptr, 'r'}, {"cold", no_argument, nullptr, 'C'},
+        {"quick", no_argument, nullptr, 'q'},        {"json", required_argument, nullptr, 'j'},
+        {"chart", required_argument, nullptr, 'c'},  {"stack", no_argument, nullptr, 's'},
+        {"threads", no_argument, nullptr, 't'},      {"kernels", no_argument, nullptr, 'k'},
+        {"help", no_argument, nullptr, 'h'},         {nullptr, 0, nullptr, 0}};
     Options options;
     for (int c; (c = getopt_long(argc, argv, "", kOptions, nullptr)) != -1;) {
         switch (c) {
@@ -98,6 +97,9 @@ Options parse(int argc, char** argv) {
                 break;
             case 't':
                 options.threads = true;
+                break;
+            case 'k':
+                options.kernels = true;
                 break;
             case 'h':
                 std::cout << kUsage;
@@ -141,16 +143,27 @@ std::ofstream create(const std::string& path) {
     return file;
 }
 
+void print_lines(const std::vector<std::string>& lines) {
+    for (const std::string& line : lines) std::cout << line << '\n';
+    std::cout << '\n';
+}
+
 void run_bench(const Options& options) {
     if (!choose_kernels(options.isa)) {
         give_up("this processor has no kernels '" + options.isa + "'");
+    }
+    if (options.kernels) {
+        print_lines(describe_machine());
+        if (!print_kernels(std::cout, options.filter, options.effort)) {
+            give_up("no kernel holds '" + options.filter + "'");
+        }
+        return;
     }
     const std::vector<Case> cases = wanted_cases(options.filter);
     std::vector<std::string> machine = describe_machine();
     const bool cold = options.effort.caches == Caches::kCold;
     machine.push_back(cold ? "caches: cold" : "caches: warm");
-    for (const std::string& line : machine) std::cout << line << '\n';
-    std::cout << '\n';
+    print_lines(machine);
     if (options.stack) {
         print_stack_use(std::cout, cases);
         return;

@@ -5,6 +5,7 @@
 #include <ovrinresize.h>
 
 #include <cstdint>
+#include <initializer_list>
 
 namespace reference {
 
