@@ -24,7 +24,7 @@ std::string processor() {
 }
 
 std::string kernels_in_use() {
-    ovrin::NamedKernels sets[ovrin::kMostSets];
+    ovrin::NamedKernels sets[ovrin::kMaxSets];
     const int32_t count = ovrin::available_kernels(sets);
     for (int32_t i = 0; i < count; ++i) {
         if (sets[i].kernels == &ovrin::kernels()) return sets[i].name;
@@ -44,7 +44,7 @@ std::string compiler() {
 
 bool choose_kernels(const std::string& name) {
     if (name.empty()) return true;
-    ovrin::NamedKernels sets[ovrin::kMostSets];
+    ovrin::NamedKernels sets[ovrin::kMaxSets];
     const int32_t count = ovrin::available_kernels(sets);
     for (int32_t i = 0; i < count; ++i) {
         if (name != sets[i].name) continue;

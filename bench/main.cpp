@@ -7,16 +7,20 @@
 #include <iostream>
 
 #include "chart.h"
+#include "kernel_bench.h"
 #include "machine.h"
 #include "report.h"
 #include "stack.h"
+#include "threads.h"
 
 using namespace bench;
 
 namespace {
 
 constexpr char kUsage[] =
-    "Measures the library beside its peers and prints one table.\n"
+    "Measures the library beside its peers and prints one table; without a filter, another of "
+    "what\n"
+    "threads cost.\n"
     "\n"
     "  --filter TEXT   only cases whose family or name holds TEXT\n"
     "  --isa SET       our kernels: scalar, avx2 or avx512 (default: the library's choice)\n"
@@ -25,7 +29,9 @@ constexpr char kUsage[] =
     "  --quick         few and short samples: a first impression\n"
     "  --json FILE     write all numbers\n"
     "  --chart FILE    write what bench/chart.gp draws\n"
-    "  --stack         measure instead how much stack our calls take\n";
+    "  --stack         measure instead how much stack our calls take\n"
+    "  --threads       measure instead what threads cost\n"
+    "  --kernels       measure instead each kernel of each set alone\n";
 
 struct Options {
     std::string filter;
@@ -34,6 +40,8 @@ struct Options {
     std::string chart;
     Effort effort = {Caches::kWarm, 31, 5e-4, 8};
     bool stack = false;
+    bool threads = false;
+    bool kernels = false;
 };
 
 [[noreturn]] void give_up(const std::string& why) {
@@ -56,6 +64,7 @@ Options parse(int argc, char** argv) {
         {"rounds", required_argument, nullptr, 'r'}, {"cold", no_argument, nullptr, 'C'},
         {"quick", no_argument, nullptr, 'q'},        {"json", required_argument, nullptr, 'j'},
         {"chart", required_argument, nullptr, 'c'},  {"stack", no_argument, nullptr, 's'},
+        {"threads", no_argument, nullptr, 't'},      {"kernels", no_argument, nullptr, 'k'},
         {"help", no_argument, nullptr, 'h'},         {nullptr, 0, nullptr, 0}};
     Options options;
     for (int c; (c = getopt_long(argc, argv, "", kOptions, nullptr)) != -1;) {
@@ -85,6 +94,12 @@ Options parse(int argc, char** argv) {
                 break;
             case 's':
                 options.stack = true;
+                break;
+            case 't':
+                options.threads = true;
+                break;
+            case 'k':
+                options.kernels = true;
                 break;
             case 'h':
                 std::cout << kUsage;
@@ -128,21 +143,40 @@ std::ofstream create(const std::string& path) {
     return file;
 }
 
+void print_lines(const std::vector<std::string>& lines) {
+    for (const std::string& line : lines) std::cout << line << '\n';
+    std::cout << '\n';
+}
+
 void run_bench(const Options& options) {
     if (!choose_kernels(options.isa)) {
         give_up("this processor has no kernels '" + options.isa + "'");
+    }
+    if (options.kernels) {
+        print_lines(describe_machine());
+        if (!print_kernels(std::cout, options.filter, options.effort)) {
+            give_up("no kernel holds '" + options.filter + "'");
+        }
+        return;
     }
     const std::vector<Case> cases = wanted_cases(options.filter);
     std::vector<std::string> machine = describe_machine();
     const bool cold = options.effort.caches == Caches::kCold;
     machine.push_back(cold ? "caches: cold" : "caches: warm");
-    for (const std::string& line : machine) std::cout << line << '\n';
-    std::cout << '\n';
+    print_lines(machine);
     if (options.stack) {
         print_stack_use(std::cout, cases);
         return;
     }
+    if (options.threads) {
+        print_thread_costs(std::cout, options.effort);
+        return;
+    }
     const std::vector<Result> results = run(cases, options.effort);
+    if (options.filter.empty()) {
+        std::cout << '\n';
+        print_thread_costs(std::cout, options.effort);
+    }
     if (!options.json.empty()) {
         std::ofstream file = create(options.json);
         write_json(file, machine, results);

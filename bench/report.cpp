@@ -3,19 +3,11 @@
 
 #include <algorithm>
 #include <cmath>
-#include <iomanip>
 #include <ostream>
-#include <sstream>
 
 namespace bench {
 
 namespace {
-
-std::string fixed(double value, int digits) {
-    std::ostringstream text;
-    text << std::fixed << std::setprecision(digits) << value;
-    return text.str();
-}
 
 std::string microseconds(double seconds) {
     return fixed(seconds * 1e6, seconds < 1e-4 ? 1 : 0);

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "table.h"
 
+#include <iomanip>
 #include <ostream>
+#include <sstream>
 
 namespace bench {
 
@@ -18,6 +20,12 @@ std::string rule_under(const Column& column) {
 }
 
 }  // namespace
+
+std::string fixed(double value, int digits) {
+    std::ostringstream text;
+    text << std::fixed << std::setprecision(digits) << value;
+    return text.str();
+}
 
 Table::Table(std::ostream& out, std::vector<Column> columns)
     : out_(out), columns_(std::move(columns)) {

@@ -13,6 +13,9 @@ struct Column {
     bool is_text;  // to the left; numbers stand to the right
 };
 
+// A number with so many digits after the point.
+std::string fixed(double value, int digits);
+
 // A Markdown table that also reads well on a terminal.
 class Table {
 public:

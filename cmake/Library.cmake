@@ -8,15 +8,15 @@ else()
 endif()
 
 add_library(ovrinresize_objects OBJECT
+  src/bands/pool.cpp
+  src/bands/sleep.cpp
   src/bilinear/plan.cpp
   src/bilinear/progressive.cpp
   src/bilinear/rows.cpp
   src/bilinear/single.cpp
   src/bilinear/threaded.cpp
-  src/canvas/margin.cpp
-  src/dispatch/band_schedule.cpp
-  src/dispatch/helping_run.cpp
-  src/dispatch/sleep.cpp
+  src/canvas/paint.cpp
+  src/canvas/placement.cpp
   src/dispatch/wrappers.cpp
   src/kernels/bilinear_scalar.cpp
   src/kernels/cpu.cpp
@@ -33,6 +33,7 @@ add_library(ovrinresize_objects OBJECT
   src/pool/threadpool.cpp
   src/quarter/sampler.cpp
   src/quarter/scan.cpp
+  src/quarter/threaded.cpp
   src/rgba/nearest.cpp
   src/rgba/rgb888.cpp
   src/rgba/rgba8888.cpp
@@ -48,19 +49,21 @@ if(CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
   target_sources(ovrinresize_objects PRIVATE src/kernels/lanczos_wasm.cpp)
   if(OVRINRESIZE_SIMD128)
     target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
-      src/kernels/quarter_neon.cpp)
+      src/kernels/quarter_neon.cpp src/kernels/quarter_ratios_wasm.cpp)
   endif()
 else()
-  target_sources(ovrinresize_objects PRIVATE src/layout.cpp) # given for 64-bit platforms
+  target_sources(ovrinresize_objects PRIVATE src/dispatch/records.cpp) # for 64-bit platforms
 endif()
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
   target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
-    src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp)
+    src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp
+    src/kernels/quarter_ratios_neon.cpp)
   # Otherwise atomics may call helpers of the compiler's run-time library.
   target_compile_options(ovrinresize_objects PRIVATE -mno-outline-atomics)
 elseif(CMAKE_SYSTEM_PROCESSOR MATCHES "x86_64|AMD64")
   set(avx2_sources src/kernels/bilinear_avx2.cpp src/kernels/copy_avx2.cpp
-    src/kernels/lanczos_avx2.cpp src/kernels/quarter_avx2.cpp)
+    src/kernels/lanczos_avx2.cpp src/kernels/quarter_avx2.cpp
+    src/kernels/quarter_ratios_avx2.cpp)
   set(avx512_sources src/kernels/bilinear_avx512.cpp
     src/kernels/lanczos_avx512.cpp src/kernels/quarter_avx512.cpp)
   target_sources(ovrinresize_objects PRIVATE ${avx2_sources} ${avx512_sources})

@@ -64,8 +64,8 @@ void one_band(Input& in, const BilinearCall& call) {
     definition(read, expected);
     Pixels pixels(in);
     const Flush where = flush(in);
-    const BilinearSourceBuffers buffers(call, read, pixels, where);
-    reference::BilinearSource view = buffers.view();
+    const BilinearBuffers buffers = bilinear_buffers(call, read, pixels, where);
+    reference::BilinearSource view = buffers.source();
     definition(view, expected);
 
     Band band(call, plan, first, end);
@@ -76,7 +76,7 @@ void one_band(Input& in, const BilinearCall& call) {
         ovrin_bilinear_band passed = band.record;
         passed.dst = dst.data();
         _ov_bilinear_tp(&passed);
-        buffers.check_unchanged(set);
+        check_unchanged(buffers, set);
     });
 }
 
@@ -88,9 +88,7 @@ void reduction(Input& in) {
     const Sizes s = {dst_w * ratio_w + in.between(0, 5), dst_h * ratio_h + in.between(0, 5), dst_w,
                      dst_h};
     const int32_t format = in.pick({2, 7, 8, 18, 19});
-    const BilinearCall call = {
-        s.src_w, s.src_h, s.dst_w,
-        s.dst_h, false,   reference::packed_geometry(s.src_w, s.src_h, s.dst_w, s.dst_h, format)};
+    const BilinearCall call = call_without_target(format, s.src_w, s.src_h, s.dst_w, s.dst_h);
     check_bilinear(call, ov_bilinear_ex, in,
                    [&](reference::BilinearSource& src, std::vector<uint8_t>& canvas) {
                        reference::bilinear_ex(s.src_w, s.src_h, s.dst_w, s.dst_h, format, src,

@@ -12,7 +12,7 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     Input in(data, size);
     const uint8_t entry = in.byte() % 3;
     Sizes s = sizes(in);
-    if (s.src_h > 47) s.src_h = 47;  // more would start threads
+    if (s.src_h > kMostRowsWithoutThreads) s.src_h = kMostRowsWithoutThreads;
     ovrin_resize_target target = letterbox(in, s.dst_w, s.dst_h);
     target.src_width = s.src_w;
     target.src_height = s.src_h;

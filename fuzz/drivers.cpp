@@ -5,9 +5,8 @@
 #include "bilinear_support.h"
 #include "reference/keep_ratio_rgba.h"
 #include "reference/lanczos.h"
-#include "reference/nv21.h"
-#include "reference/yuv.h"
 #include "support.h"
+#include "support/yuv420_format.h"
 
 using namespace fuzz;
 
@@ -71,7 +70,7 @@ void canvas(Input& in) {
                   });
 }
 
-void planar(Input& in) {
+void yuv420(Input& in, const ovrin_test::Yuv420Format& format) {
     const Sizes s = tall(in);
     const uint8_t form = in.byte() % 3;
     ovrin_resize_target target = around(in, s, 0);
@@ -79,68 +78,29 @@ void planar(Input& in) {
     Pixels pixels(in);
     const Flush where = flush(in);
     if (form == 0) {
-        const Buffer src = source(pixels, reference::i420_size(s.src_w, s.src_h), where);
-        const auto view = reference::i420_source(src.data(), s.src_w, s.src_h);
-        check_drawing(reference::resize_yuv(view, s.dst_w, s.dst_h), where, in.byte(),
+        const Buffer src =
+            source(pixels, reference::yuv420_size(format.layout, s.src_w, s.src_h), where);
+        const auto view = reference::contiguous(format.layout, src.data(), s.src_w, s.src_h);
+        check_drawing(reference::resize_yuv420(view, s.dst_w, s.dst_h), where, in.byte(),
                       [&](const Buffer& dst, const char*) {
-                          ovrin_resize_yuv420_tps(src.data(), dst.data(), s.src_w, s.src_h, s.dst_w,
-                                                  s.dst_h);
-                      });
-        return;
-    }
-    const int32_t chroma_w = (s.src_w + 1) >> 1;
-    const int32_t chroma_h = (s.src_h + 1) >> 1;
-    const Plane y(pixels, s.src_w, s.src_h, stride, where);
-    const Plane u(pixels, chroma_w, chroma_h, (stride + 1) >> 1, where);
-    const Plane v(pixels, chroma_w, chroma_h, (stride + 1) >> 1, where);
-    const reference::YuvSource view = {y.first(), u.first(), v.first(), s.src_w, s.src_h, stride};
-    std::vector<uint8_t> expected;
-    if (form == 1) {
-        expected = reference::resize_yuv(view, s.dst_w, s.dst_h);
-    } else {
-        expected.resize(
-            static_cast<size_t>(reference::i420_size(target.canvas_width, target.canvas_height)));
-        reference::keep_ratio_yuv_tps(view, target, expected);
-    }
-    check_drawing(expected, where, in.byte(), [&](const Buffer& dst, const char*) {
-        target.dst = dst.data();
-        ovrin_resize_y_u_v_tps(y.first(), u.first(), v.first(), dst.data(), s.src_w, s.src_h,
-                               s.dst_w, s.dst_h, form == 2 ? &target : nullptr);
-    });
-}
-
-void semi_planar(Input& in) {
-    const Sizes s = tall(in);
-    const uint8_t form = in.byte() % 3;
-    ovrin_resize_target target = around(in, s, 0);
-    const int32_t stride = form == 2 ? target.src_stride : s.src_w;
-    Pixels pixels(in);
-    const Flush where = flush(in);
-    if (form == 0) {
-        const Buffer src = source(pixels, reference::nv21_size(s.src_w, s.src_h), where);
-        const auto view = reference::nv21_source(src.data(), s.src_w, s.src_h);
-        check_drawing(reference::resize_nv21(view, s.dst_w, s.dst_h), where, in.byte(),
-                      [&](const Buffer& dst, const char*) {
-                          ovrin_resize_nv21_tps(src.data(), dst.data(), s.src_w, s.src_h, s.dst_w,
+                          format.contiguous_tps(src.data(), dst.data(), s.src_w, s.src_h, s.dst_w,
                                                 s.dst_h);
                       });
         return;
     }
-    const Plane y(pixels, s.src_w, s.src_h, stride, where);
-    const Plane vu(pixels, (s.src_w + 1) & ~1, (s.src_h + 1) >> 1, (stride + 1) & ~1, where);
-    const reference::Nv21Source view = {y.first(), vu.first(), s.src_w, s.src_h, stride};
+    const Yuv420Planes src(format.layout, pixels, s.src_w, s.src_h, stride, where);
     std::vector<uint8_t> expected;
     if (form == 1) {
-        expected = reference::resize_nv21(view, s.dst_w, s.dst_h);
+        expected = reference::resize_yuv420(src.view, s.dst_w, s.dst_h);
     } else {
-        expected.resize(
-            static_cast<size_t>(reference::nv21_size(target.canvas_width, target.canvas_height)));
-        reference::keep_ratio_nv21_tps(view, target, expected);
+        expected.resize(static_cast<size_t>(
+            reference::yuv420_size(format.layout, target.canvas_width, target.canvas_height)));
+        reference::keep_ratio_yuv420_tps(src.view, target, expected);
     }
     check_drawing(expected, where, in.byte(), [&](const Buffer& dst, const char*) {
         target.dst = dst.data();
-        ovrin_resize_y_nv_tps(y.first(), vu.first(), dst.data(), s.src_w, s.src_h, s.dst_w, s.dst_h,
-                              form == 2 ? &target : nullptr);
+        format.planes_tps(src.view, dst.data(), s.src_w, s.src_h, s.dst_w, s.dst_h,
+                          form == 2 ? &target : nullptr);
     });
 }
 
@@ -181,10 +141,10 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
             canvas(in);
             break;
         case 2:
-            planar(in);
+            yuv420(in, ovrin_test::kI420Format);
             break;
         case 3:
-            semi_planar(in);
+            yuv420(in, ovrin_test::kNv21Format);
             break;
         case 4:
             bilinear(in);

@@ -36,13 +36,8 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     const int32_t bytes = in.flag() ? 4 : 3;
     const uint8_t entry = in.byte() % 3;
     Sizes s = sizes(in);
-    const uint8_t empty = in.byte() % 64;
-    if (empty & 1 && empty > 47) s.src_w = in.nothing();
-    if (empty & 2 && empty > 47) s.src_h = in.nothing();
-    if (empty & 4 && empty > 47) s.dst_w = in.nothing();
-    if (empty & 8 && empty > 47) s.dst_h = in.nothing();
-    // From 48 rows on the driver starts threads, which drivers.cpp looks after.
-    if (s.src_h > 47) s.src_h = 47;
+    empty_some(in, s);
+    if (s.src_h > kMostRowsWithoutThreads) s.src_h = kMostRowsWithoutThreads;
 
     Pixels pixels(in);
     const Flush where = flush(in);

@@ -4,9 +4,12 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+
+#include "support/target_record.h"
 
 #if defined(__SANITIZE_ADDRESS__)
 #define FUZZ_ASAN
@@ -135,22 +138,6 @@ void Buffer::fill(uint8_t byte) {
     if (size_ > 0) memset(data_, byte, size_);
 }
 
-namespace {
-
-size_t plane_bytes(int64_t row_bytes, int64_t rows, int64_t stride) {
-    if (row_bytes < 1 || rows < 1) return 0;
-    return static_cast<size_t>((rows - 1) * (stride < 0 ? -stride : stride) + row_bytes);
-}
-
-}  // namespace
-
-Plane::Plane(Pixels& pixels, int64_t row_bytes, int64_t rows, int64_t stride, Flush flush)
-    : buffer_(plane_bytes(row_bytes, rows, stride), flush) {
-    if (stride < 0 && rows > 0) first_ = static_cast<size_t>((rows - 1) * -stride);
-    pixels.fill(buffer_.data(), buffer_.size());
-    buffer_.keep();
-}
-
 Buffer source(Pixels& pixels, int64_t bytes, Flush flush) {
     Buffer buffer(static_cast<size_t>(bytes), flush);
     pixels.fill(buffer.data(), buffer.size());
@@ -159,19 +146,11 @@ Buffer source(Pixels& pixels, int64_t bytes, Flush flush) {
 }
 
 ovrin_resize_target letterbox(Input& in, int32_t dst_w, int32_t dst_h) {
-    ovrin_resize_target target;
-    memset(static_cast<void*>(&target), 0x5A, sizeof target);
-    target.dst_width = dst_w;
-    target.dst_height = dst_h;
-    target.dst_x = in.between(0, 9);
-    target.dst_y = in.between(0, 9);
-    const int32_t wanted_w = dst_w + target.dst_x;
-    const int32_t wanted_h = dst_h + target.dst_y;
-    target.canvas_width = wanted_w + in.between(-12, 12);
-    target.canvas_height = wanted_h + in.between(-12, 12);
-    if (target.canvas_width < 0) target.canvas_width = 0;
-    if (target.canvas_height < 0) target.canvas_height = 0;
-    return target;
+    const int32_t x = in.between(0, 9);
+    const int32_t y = in.between(0, 9);
+    const int32_t canvas_w = dst_w + x + in.between(-12, 12);
+    const int32_t canvas_h = dst_h + y + in.between(-12, 12);
+    return ovrin_test::letterbox(std::max(canvas_w, 0), std::max(canvas_h, 0), dst_w, dst_h, x, y);
 }
 
 }  // namespace fuzz

@@ -11,8 +11,12 @@
 #include <vector>
 
 #include "kernels/kernels.h"
+#include "reference/yuv420.h"
+#include "support/extents.h"
 
 namespace fuzz {
+
+using ovrin_test::Sizes;
 
 // Numbers from the fuzzer's bytes, in order; zeros once they are used up.
 class Input {
@@ -62,9 +66,8 @@ private:
     size_t at_ = 0;
 };
 
-struct Sizes {
-    int32_t src_w, src_h, dst_w, dst_h;
-};
+// From 48 rows on a picture may be cut into bands, for which drivers start threads.
+constexpr int32_t kMostRowsWithoutThreads = 47;
 
 inline Sizes sizes(Input& in) {
     Sizes s;
@@ -82,6 +85,16 @@ inline Sizes short_sizes(Input& in) {
     s.dst_w = in.short_width();
     s.dst_h = in.between(1, 6);
     return s;
+}
+
+// Now and then some sizes become what no picture has.
+inline void empty_some(Input& in, Sizes& s) {
+    const uint8_t which = in.byte() % 64;
+    if (which < 48) return;
+    if (which & 1) s.src_w = in.nothing();
+    if (which & 2) s.src_h = in.nothing();
+    if (which & 4) s.dst_w = in.nothing();
+    if (which & 8) s.dst_h = in.nothing();
 }
 
 // Bytes for pictures, cheaply: the fuzzer chooses a seed and a kind.
@@ -139,22 +152,43 @@ private:
 // All buffers are given up: to be called first in every run.
 void begin_run();
 
-// A source plane: rows of `row_bytes` bytes, `stride` bytes apart (backwards if negative), in a
-// buffer that ends with the last row's own bytes. Empty when a size is below 1.
+// A packed source.
+Buffer source(Pixels& pixels, int64_t bytes, Flush flush);
+
+// A source plane: rows of `row_bytes` bytes, `stride` bytes apart.
 class Plane {
 public:
-    Plane(Pixels& pixels, int64_t row_bytes, int64_t rows, int64_t stride, Flush flush);
+    Plane(Pixels& pixels, int64_t row_bytes, int64_t rows, int64_t stride, Flush flush)
+        : extent_(row_bytes, rows, stride),
+          buffer_(source(pixels, static_cast<int64_t>(extent_.bytes), flush)) {}
 
-    const uint8_t* first() const { return buffer_.data() + first_; }
+    const uint8_t* first() const { return buffer_.data() + extent_.first; }
     void check_unchanged(const char* set) const { buffer_.check_unchanged(set); }
 
 private:
+    ovrin_test::PlaneExtent extent_;
     Buffer buffer_;
-    size_t first_ = 0;
 };
 
-// A packed source.
-Buffer source(Pixels& pixels, int64_t bytes, Flush flush);
+// Luma and chroma planes, each in a buffer of its own. `stride` is the luma row length.
+struct Yuv420Planes {
+    Plane y, chroma[2];
+    reference::Yuv420Source view;
+
+    Yuv420Planes(const reference::ChromaLayout& layout, Pixels& pixels, int32_t w, int32_t h,
+                 int32_t stride, Flush flush)
+        : y(pixels, w, h, stride, flush),
+          chroma{
+              {pixels, reference::chroma_row(layout, w), reference::half(h),
+               reference::chroma_row(layout, stride), flush},
+              {pixels, reference::chroma_row(layout, w), layout.planes > 1 ? reference::half(h) : 0,
+               reference::chroma_row(layout, stride), flush}},
+          view{layout, y.first(), {chroma[0].first(), chroma[1].first()}, w, h, stride} {}
+
+    void check_unchanged(const char* set) const {
+        for (const Plane* plane : {&y, &chroma[0], &chroma[1]}) plane->check_unchanged(set);
+    }
+};
 
 // Stops the run unless `holds`.
 void require(bool holds, const char* what, const char* set);
@@ -162,7 +196,7 @@ void require(bool holds, const char* what, const char* set);
 // call(name) under every instruction set that this processor has.
 struct Sets {
     Sets() { count = ovrin::available_kernels(sets); }
-    ovrin::NamedKernels sets[ovrin::kMostSets];
+    ovrin::NamedKernels sets[ovrin::kMaxSets];
     int32_t count;
 };
 const Sets& all_sets();

@@ -2,9 +2,8 @@
 // The six band tasks of the quarter-point formats, on bands that the replayed walkers lead to.
 #include "reference/band_tasks.h"
 
-#include <algorithm>
-
 #include "bands_support.h"
+#include "support/band_walk.h"
 
 using namespace fuzz;
 
@@ -39,28 +38,20 @@ void check_task(Task* task, const Band& band, const std::vector<uint8_t>& conten
 void rgba(Input& in, const Sizes& s) {
     const bool in_canvas = in.flag();
     const int32_t stride = s.src_w + (in_canvas ? in.between(0, 5) : 0);
-    auto band = garbage<ovrin_rgba_band>();
-    start(band);
-    band.src_w = s.src_w;
-    band.src_h = s.src_h;
-    band.src_stride = stride;
-    band.dst_w = s.dst_w;
-    band.dst_h = s.dst_h;
-    band.dst_x = in_canvas ? in.between(0, 6) : 0;
-    band.dst_skip = in_canvas ? in.between(0, 6) : 0;
-    band.band_rows = in.between(1, s.src_h);
-    const int32_t row = band.dst_x + s.dst_w + band.dst_skip;
-    const int32_t steps = in.between(0, (s.src_h - 1) / band.band_rows);
-    for (int32_t i = 0; i < steps; ++i) {
-        reference::rgba8888_get_pos_keep_ratio(s.src_h, s.dst_h, row, band);
-    }
-    band.rows_to_do = in.between(0, std::min(band.band_rows, s.src_h - band.start_row));
+    const int32_t x = in_canvas ? in.between(0, 6) : 0;
+    const int32_t skip = in_canvas ? in.between(0, 6) : 0;
+    const int32_t band_rows = in.between(1, s.src_h);
+    const int32_t index = in.between(0, (s.src_h - 1) / band_rows);
+    auto band =
+        ovrin_test::walk_to(garbage<ovrin_rgba_band>(), s, band_rows, stride, x, skip, index);
+    band.rows_to_do = in.between(0, band.rows_to_do);
 
     Pixels pixels(in);
     const Flush where = flush(in);
     const Plane src(pixels, int64_t{s.src_w} * 4, s.src_h, int64_t{stride} * 4, where);
     band.src = src.first();
-    std::vector<uint32_t> words(static_cast<size_t>((s.dst_h - 1) * row + band.dst_x + s.dst_w));
+    std::vector<uint32_t> words(
+        static_cast<size_t>((s.dst_h - 1) * (x + s.dst_w + skip) + x + s.dst_w));
     const auto content = before(pixels, bytes_of(words));
     memcpy(words.data(), content.data(), content.size());
     (in_canvas ? reference::resize_rgba8888_keep_ratio_tp : reference::resize_rgba8888_tp)(
@@ -74,48 +65,12 @@ void rgba(Input& in, const Sizes& s) {
     src.check_unchanged("some");
 }
 
-void replay(const Sizes& s, ovrin_yuv_band& band) {
-    reference::yuv420_get_pos(s.src_h, s.dst_w, s.dst_h, band);
-}
-void replay(const Sizes& s, ovrin_nv21_band& band) {
-    reference::nv21_get_pos(s.src_w, s.src_h, s.dst_w, s.dst_h, band);
-}
-int32_t& chroma_rows(ovrin_yuv_band& band) {
-    return band.uv_rows;
-}
-int32_t& chroma_rows(ovrin_nv21_band& band) {
-    return band.vu_rows;
-}
-int32_t& chroma_start(ovrin_yuv_band& band) {
-    return band.uv_start_row;
-}
-int32_t& chroma_start(ovrin_nv21_band& band) {
-    return band.vu_start_row;
-}
-
-// The record of a band that a driver would make: the last one takes what is left.
+// A band of a picture in planes.
 template <class Band>
-Band walk(Input& in, const Sizes& s, int32_t stride) {
-    auto band = garbage<Band>();
-    start(band);
-    band.src_width = s.src_w;
-    band.src_height = s.src_h;
-    band.src_row_bytes = stride;
-    band.dst_width = s.dst_w;
-    band.dst_height = s.dst_h;
-    band.band_rows = in.between(1, s.src_h);
-    const int32_t steps = in.between(0, (s.src_h - 1) / band.band_rows);
-    for (int32_t i = 0; i < steps; ++i) replay(s, band);
-    Band next = band;
-    replay(s, next);
-    band.y_rows = next.y_rows;
-    chroma_rows(band) = chroma_rows(next);
-    if (band.y_start_row + band.band_rows >= s.src_h) {
-        band.y_rows = s.src_h - band.y_start_row;
-        const int32_t rows = (s.src_h + 1) >> 1;
-        if (rows > chroma_start(band)) chroma_rows(band) = rows - chroma_start(band);
-    }
-    return band;
+Band any_band(Input& in, const Sizes& s, int32_t stride) {
+    const int32_t band_rows = in.between(1, s.src_h);
+    const int32_t index = in.between(0, (s.src_h - 1) / band_rows);
+    return ovrin_test::walk_to(garbage<Band>(), s, band_rows, stride, index);
 }
 
 // Runs the task into the destination or the work buffer, whichever is due, with the other one set
@@ -137,55 +92,53 @@ void check_planes(Input& in, const Sizes& s, Pixels& pixels, Task* task, const B
     });
 }
 
-void planar(Input& in, const Sizes& s) {
+void set_chroma(ovrin_yuv_band& band, const Yuv420Planes& src) {
+    band.src_u = src.chroma[0].first();
+    band.src_v = src.chroma[1].first();
+}
+void set_chroma(ovrin_nv21_band& band, const Yuv420Planes& src) {
+    band.src_vu = src.chroma[0].first();
+}
+
+// The two tasks of a format of planes.
+template <class Band>
+struct Tasks {
+    using Definition = void(const Band& band, uint8_t* target);
+    reference::ChromaLayout layout;
+    Task* contiguous;
+    Definition* contiguous_definition;
+    Task* planes;
+    Definition* planes_definition;
+};
+
+template <class Band>
+void yuv420(Input& in, const Sizes& s, const Tasks<Band>& tasks) {
     const bool in_planes = in.flag();
     const int32_t stride = s.src_w + (in_planes ? in.between(0, 5) : 0);
-    auto band = walk<ovrin_yuv_band>(in, s, stride);
+    auto band = any_band<Band>(in, s, stride);
     Pixels pixels(in);
     const Flush where = flush(in);
     if (in_planes) {
-        const int64_t chroma_w = (s.src_w + 1) >> 1;
-        const int64_t chroma_h = (s.src_h + 1) >> 1;
-        const Plane y(pixels, s.src_w, s.src_h, stride, where);
-        const Plane u(pixels, chroma_w, chroma_h, (stride + 1) >> 1, where);
-        const Plane v(pixels, chroma_w, chroma_h, (stride + 1) >> 1, where);
-        band.src = y.first();
-        band.src_u = u.first();
-        band.src_v = v.first();
-        check_planes(in, s, pixels, _resize_y_u_v_tp, band, true, where,
-                     reference::resize_y_u_v_tp);
+        const Yuv420Planes src(tasks.layout, pixels, s.src_w, s.src_h, stride, where);
+        band.src = src.y.first();
+        set_chroma(band, src);
+        check_planes(in, s, pixels, tasks.planes, band, true, where, tasks.planes_definition);
     } else {
-        const Buffer src = source(
-            pixels, s.src_w * s.src_h + 2 * ((s.src_w + 1) >> 1) * ((s.src_h + 1) >> 1), where);
+        const Buffer src =
+            source(pixels, reference::yuv420_size(tasks.layout, s.src_w, s.src_h), where);
         band.src = src.data();
         band.src_row_bytes = -5;  // the picture is packed
-        check_planes(in, s, pixels, _resize_yuv420_tp, band, false, where,
-                     reference::resize_yuv420_tp);
+        check_planes(in, s, pixels, tasks.contiguous, band, false, where,
+                     tasks.contiguous_definition);
     }
 }
 
-void semi_planar(Input& in, const Sizes& s) {
-    const bool in_planes = in.flag();
-    const int32_t stride = s.src_w + (in_planes ? in.between(0, 5) : 0);
-    auto band = walk<ovrin_nv21_band>(in, s, stride);
-    Pixels pixels(in);
-    const Flush where = flush(in);
-    const int64_t chroma_row = (s.src_w + 1) & ~1;
-    const int64_t chroma_h = (s.src_h + 1) >> 1;
-    if (in_planes) {
-        const Plane y(pixels, s.src_w, s.src_h, stride, where);
-        const Plane vu(pixels, chroma_row, chroma_h, (stride + 1) & ~1, where);
-        band.src = y.first();
-        band.src_vu = vu.first();
-        check_planes(in, s, pixels, _resize_y_nv21_tp, band, true, where,
-                     reference::resize_y_nv21_tp);
-    } else {
-        const Buffer src = source(pixels, s.src_w * s.src_h + chroma_row * chroma_h, where);
-        band.src = src.data();
-        band.src_row_bytes = -5;
-        check_planes(in, s, pixels, _resize_nv21_tp, band, false, where, reference::resize_nv21_tp);
-    }
-}
+constexpr Tasks<ovrin_yuv_band> kI420Tasks = {reference::kI420, _resize_yuv420_tp,
+                                              reference::resize_yuv420_tp, _resize_y_u_v_tp,
+                                              reference::resize_y_u_v_tp};
+constexpr Tasks<ovrin_nv21_band> kNv21Tasks = {reference::kNv21, _resize_nv21_tp,
+                                               reference::resize_nv21_tp, _resize_y_nv21_tp,
+                                               reference::resize_y_nv21_tp};
 
 }  // namespace
 
@@ -196,6 +149,12 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     Sizes s = sizes(in);
     s.src_h += in.between(0, 40);
     s.dst_h += in.between(0, 20);
-    (format == 0 ? rgba : format == 1 ? planar : semi_planar)(in, s);
+    if (format == 0) {
+        rgba(in, s);
+    } else if (format == 1) {
+        yuv420(in, s, kI420Tasks);
+    } else {
+        yuv420(in, s, kNv21Tasks);
+    }
     return 0;
 }

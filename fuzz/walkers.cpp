@@ -17,39 +17,33 @@ int32_t somewhere(Input& in) {
     return in.flag() ? in.byte() : in.word() - 32768;
 }
 
+template <class Band>
+void scramble(Input& in, Band& band, const reference::PlaneFields<Band>& plane) {
+    for (const auto field :
+         {plane.start_row, plane.top_point, plane.bottom_point, plane.row_base, plane.top_left,
+          plane.top_right, plane.bottom_left, plane.bottom_right}) {
+        band.*field = somewhere(in);
+    }
+}
+
 void scramble(Input& in, ovrin_rgba_band& band) {
-    for (int32_t* field : {&band.start_row, &band.row_q1, &band.row_q3, &band.row_acc, &band.di_11,
-                           &band.di_13, &band.di_31, &band.di_33, &band.src_offset}) {
-        *field = somewhere(in);
-    }
+    scramble(in, band, reference::kRgbaFields);
+    band.src_offset = somewhere(in);
 }
 
-void scramble(Input& in, ovrin_yuv_band& band) {
-    for (int32_t* field :
-         {&band.y_start_row, &band.y_top_point, &band.y_bottom_point, &band.y_row_base,
-          &band.y_top_left, &band.y_top_right, &band.y_bottom_left, &band.y_bottom_right,
-          &band.uv_start_row, &band.uv_top_point, &band.uv_bottom_point, &band.uv_row_base,
-          &band.uv_top_left, &band.uv_top_right, &band.uv_bottom_left, &band.uv_bottom_right,
-          &band.src_y_offset, &band.src_uv_offset}) {
-        *field = somewhere(in);
-    }
-}
-
-void scramble(Input& in, ovrin_nv21_band& band) {
-    for (int32_t* field :
-         {&band.y_start_row, &band.y_top_point, &band.y_bottom_point, &band.y_row_base,
-          &band.y_top_left, &band.y_top_right, &band.y_bottom_left, &band.y_bottom_right,
-          &band.vu_start_row, &band.vu_top_point, &band.vu_bottom_point, &band.vu_row_base,
-          &band.vu_top_left, &band.vu_top_right, &band.vu_bottom_left, &band.vu_bottom_right,
-          &band.src_y_offset, &band.src_vu_offset}) {
-        *field = somewhere(in);
-    }
+template <class Band>
+void scramble(Input& in, Band& band) {
+    constexpr auto chroma = reference::kChromaFields<Band>;
+    scramble(in, band, reference::kLumaFields<Band>);
+    scramble(in, band, chroma);
+    band.src_y_offset = somewhere(in);
+    band.*chroma.src_offset = somewhere(in);
 }
 
 // Walks the library's record and the replayed one side by side, past the end of the picture.
 template <class Band, class Walk, class Replay>
 void chain(Input& in, Band band, const Picture& p, Walk walk, Replay replay) {
-    start(band);
+    reference::start_at_the_top(band);
     if (in.byte() % 4 == 0) scramble(in, band);
     Band expected = band;
     int32_t steps = p.band_rows > 0 ? p.sizes.src_h / p.band_rows + 2 : 2;

@@ -1,21 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "bilinear/plan.h"
 
-#include <stdlib.h>
-#include <string.h>
-
-#include "yuv420/place.h"
+#include "canvas/paint.h"
+#include "canvas/placement.h"
+#include "kernels/bilinear.h"
 
 namespace ovrin {
 
 namespace {
 
-ChromaLayout chroma_of(BilinearLayout layout) {
-    return layout == BilinearLayout::kPlanar ? kPlanarChroma : kInterleavedChroma;
-}
-
-int32_t* new_table(int32_t entries) {
-    return static_cast<int32_t*>(malloc(static_cast<size_t>(entries) * sizeof(int32_t)));
+Yuv420Format format_of(BilinearLayout layout) {
+    return layout == BilinearLayout::kPlanar ? kI420 : kNv21;
 }
 
 // Single precision can round the last positions of a very long axis up to 2^31.
@@ -31,7 +26,7 @@ void fill_axis(int32_t* index, int32_t* weight, int32_t src_size, int32_t dst_si
         const float position = static_cast<float>(i) * scale;
         index[i] = truncated(position);
         const float fraction = position - static_cast<float>(index[i]);
-        weight[i] = static_cast<int32_t>((static_cast<double>(fraction) + 0.25) * 4096.0);
+        weight[i] = static_cast<int32_t>((static_cast<double>(fraction) + 0.25) * kBilinearOne);
     }
 }
 
@@ -47,36 +42,41 @@ int32_t edge_count(const int32_t* index, int32_t dst_size, int32_t src_size) {
 BilinearGeometry geometry_of_target(const BilinearCall& call, const ovrin_resize_target& target) {
     const BilinearLayout layout = bilinear_layout(target.format);
     const bool planar = layout == BilinearLayout::kPlanar;
-    return {layout,
-            target.format,
-            target.src_width,
-            target.src_height,
-            target.src_stride,
-            call.src,
-            {planar ? target.src_u_plane : target.src_vu_plane, target.src_v_plane},
-            call.dst,
-            target.canvas_width,
-            target.canvas_height,
-            target.dst_x,
-            target.dst_y};
+    BilinearGeometry g = {};
+    g.layout = layout;
+    g.format = target.format;
+    g.src_width = target.src_width;
+    g.src_height = target.src_height;
+    g.src_stride = target.src_stride;
+    g.src = call.src;
+    g.src_chroma[0] = planar ? target.src_u_plane : target.src_vu_plane;
+    g.src_chroma[1] = target.src_v_plane;
+    g.canvas = call.dst;
+    g.canvas_width = target.canvas_width;
+    g.canvas_height = target.canvas_height;
+    g.dst_x = target.dst_x;
+    g.dst_y = target.dst_y;
+    return g;
 }
 
 BilinearGeometry geometry_of_arguments(const BilinearCall& call) {
     const BilinearLayout layout = bilinear_layout(call.format);
-    const Yuv420Source source =
-        contiguous_source(chroma_of(layout), call.src, call.src_w, call.src_h);
-    return {layout,
-            call.format,
-            call.src_w,
-            call.src_h,
-            call.src_w,
-            call.src,
-            {source.chroma_planes[0], source.chroma_planes[1]},
-            call.dst,
-            call.dst_w,
-            call.dst_h,
-            0,
-            0};
+    const Yuv420Layout src = {format_of(layout), call.src_w, call.src_h};
+    BilinearGeometry g = {};
+    g.layout = layout;
+    g.format = call.format;
+    g.src_width = call.src_w;
+    g.src_height = call.src_h;
+    g.src_stride = call.src_w;
+    g.src = call.src;
+    if (layout != BilinearLayout::kPixels && !src.is_empty()) {
+        g.src_chroma[0] = call.src + src.chroma_offset(0);
+        g.src_chroma[1] = call.src + src.chroma_offset(1);
+    }
+    g.canvas = call.dst;
+    g.canvas_width = call.dst_w;
+    g.canvas_height = call.dst_h;
+    return g;
 }
 
 }  // namespace
@@ -97,7 +97,7 @@ BilinearLayout bilinear_layout(int32_t format) {
 }
 
 Yuv420Layout BilinearGeometry::canvas_planes() const {
-    return {chroma_of(layout), canvas_width, canvas_height};
+    return {format_of(layout), canvas_width, canvas_height};
 }
 
 BilinearGeometry geometry_of(const BilinearCall& call) {
@@ -106,28 +106,21 @@ BilinearGeometry geometry_of(const BilinearCall& call) {
 }
 
 BilinearTables::BilinearTables(int32_t w, int32_t h)
-    : dst_w(w),
+    : BilinearAxes{},
+      dst_w(w),
       dst_h(h),
-      col_weight(new_table(w)),
-      row_weight(new_table(h)),
-      col_index(new_table(w)),
-      row_index(new_table(h)) {}
-
-BilinearTables::~BilinearTables() {
-    free(col_weight);
-    free(row_weight);
-    free(col_index);
-    free(row_index);
-}
-
-bool BilinearTables::ready() const {
-    return col_weight != nullptr && row_weight != nullptr && col_index != nullptr &&
-           row_index != nullptr;
-}
+      memory_(static_cast<int32_t*>(
+          malloc((static_cast<size_t>(w) + static_cast<size_t>(h)) * 2 * sizeof(int32_t)))) {}
 
 void BilinearTables::fill(const BilinearGeometry& geometry) {
-    fill_axis(col_index, col_weight, geometry.src_width, dst_w);
-    fill_axis(row_index, row_weight, geometry.src_height, dst_h);
+    int32_t* columns = memory_;
+    int32_t* rows = columns + ptrdiff_t{2} * dst_w;
+    fill_axis(columns, columns + dst_w, geometry.src_width, dst_w);
+    fill_axis(rows, rows + dst_h, geometry.src_height, dst_h);
+    col_index = columns;
+    col_weight = columns + dst_w;
+    row_index = rows;
+    row_weight = rows + dst_h;
 }
 
 // Either clip takes the edge columns away; the edge rows stay.
@@ -135,16 +128,11 @@ BilinearExtent extent_of(const BilinearGeometry& geometry, const BilinearTables&
     BilinearExtent extent = {tables.dst_w, tables.dst_h,
                              edge_count(tables.col_index, tables.dst_w, geometry.src_width),
                              edge_count(tables.row_index, tables.dst_h, geometry.src_height)};
-    const int64_t room_right = int64_t{geometry.canvas_width} - geometry.dst_x;
-    const int64_t room_below = int64_t{geometry.canvas_height} - geometry.dst_y;
-    if (room_right < extent.columns) {
-        extent.columns = room_right < 0 ? 0 : static_cast<int32_t>(room_right);
-        extent.edge_cols = 0;
-    }
-    if (room_below < extent.rows) {
-        extent.rows = room_below < 0 ? 0 : static_cast<int32_t>(room_below);
-        extent.edge_cols = 0;
-    }
+    const int64_t columns = visible(tables.dst_w, geometry.dst_x, geometry.canvas_width);
+    const int64_t rows = visible(tables.dst_h, geometry.dst_y, geometry.canvas_height);
+    if (columns < extent.columns || rows < extent.rows) extent.edge_cols = 0;
+    extent.columns = columns < 0 ? 0 : static_cast<int32_t>(columns);
+    extent.rows = rows < 0 ? 0 : static_cast<int32_t>(rows);
     return extent;
 }
 
@@ -154,11 +142,9 @@ void clear_canvas(const BilinearGeometry& geometry, const BilinearExtent& extent
                             extent.rows == geometry.canvas_height;
     if (is_covered) return;
     if (geometry.layout != BilinearLayout::kPixels) {
-        paint_black(geometry.canvas, geometry.canvas_planes());
-    } else if (geometry.canvas_width > 0 && geometry.canvas_height > 0) {
-        memset(geometry.canvas, 0,
-               static_cast<size_t>(geometry.canvas_width) *
-                   static_cast<size_t>(geometry.canvas_height) * 4);
+        paint_planes_black(geometry.canvas, geometry.canvas_planes());
+    } else {
+        paint_rgba_black(geometry.canvas, geometry.canvas_width, geometry.canvas_height);
     }
 }
 

@@ -4,8 +4,9 @@
 
 #include <ovrinresize.h>
 #include <stddef.h>
+#include <stdlib.h>
 
-#include "yuv420/layout.h"
+#include "canvas/yuv420_layout.h"
 
 namespace ovrin {
 
@@ -56,23 +57,30 @@ inline bool is_supported(const BilinearGeometry& geometry) {
 }
 
 // Per destination column and row: the sample to its left or above, and the weight of the next one
-// with 12 fractional bits.
-class BilinearTables {
+// with 12 fractional bits. They may belong to a caller's band record.
+struct BilinearAxes {
+    const int32_t* col_index;
+    const int32_t* col_weight;
+    const int32_t* row_index;
+    const int32_t* row_weight;
+};
+
+// Axes of a picture with memory of their own.
+class BilinearTables : public BilinearAxes {
 public:
-    BilinearTables(int32_t dst_w, int32_t dst_h);
-    ~BilinearTables();
+    BilinearTables(int32_t w, int32_t h);
+    ~BilinearTables() { free(memory_); }
     BilinearTables(const BilinearTables&) = delete;
     BilinearTables& operator=(const BilinearTables&) = delete;
 
-    bool ready() const;
+    bool ready() const { return memory_ != nullptr; }
     void fill(const BilinearGeometry& geometry);
 
     int32_t dst_w;
     int32_t dst_h;
-    int32_t* col_weight;
-    int32_t* row_weight;
-    int32_t* col_index;
-    int32_t* row_index;
+
+private:
+    int32_t* memory_;
 };
 
 // The part of the scaled picture that lies inside the canvas, and how many of its last columns and

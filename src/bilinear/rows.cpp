@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "bilinear/rows.h"
 
-#include "kernels/kernels.h"
+#include "kernels/prefetch.h"
 
 namespace ovrin {
 
@@ -12,9 +12,8 @@ namespace {
 struct Plane {
     const uint8_t* src;
     ptrdiff_t src_pitch;
-    ptrdiff_t
-        edge_pitch;  // from the upper to the lower tap of the columns without horizontal blend
-    uint8_t* dst;    // canvas position of the picture
+    ptrdiff_t edge_pitch;  // from upper to lower sample where columns are not blended
+    uint8_t* dst;          // where the picture begins in the canvas
     ptrdiff_t dst_pitch;
     int32_t sample_bytes;
     int32_t subsampling;     // 1 for luma and pixels, 2 for chroma
@@ -37,50 +36,59 @@ struct Plane {
 
 Plane first_plane(const BilinearGeometry& g) {
     const int32_t bpp = bytes_per_pixel(g.layout);
-    const ptrdiff_t src_pitch = ptrdiff_t{g.src_stride} * bpp;
-    const ptrdiff_t dst_pitch = ptrdiff_t{g.canvas_width} * bpp;
-    return {
-        g.src,     src_pitch, src_pitch, g.canvas + g.dst_y * dst_pitch + ptrdiff_t{g.dst_x} * bpp,
-        dst_pitch, bpp,       1,         false};
+    Plane plane = {};
+    plane.src = g.src;
+    plane.src_pitch = ptrdiff_t{g.src_stride} * bpp;
+    plane.edge_pitch = plane.src_pitch;
+    plane.dst_pitch = ptrdiff_t{g.canvas_width} * bpp;
+    plane.dst = g.canvas + g.dst_y * plane.dst_pitch + ptrdiff_t{g.dst_x} * bpp;
+    plane.sample_bytes = bpp;
+    plane.subsampling = 1;
+    return plane;
 }
 
-Plane chroma_plane(const BilinearGeometry& g, int32_t plane) {
+Plane chroma_plane(const BilinearGeometry& g, int32_t number) {
     const Yuv420Layout canvas = g.canvas_planes();
     const bool planar = g.layout == BilinearLayout::kPlanar;
-    const int32_t bytes = canvas.chroma.sample_bytes;
-    const ptrdiff_t src_pitch = ptrdiff_t{half_rounded_up(g.src_stride)} * bytes;
-    uint8_t* dst = g.canvas + canvas.chroma_offset(plane) + (g.dst_y >> 1) * canvas.chroma_row() +
-                   ptrdiff_t{g.dst_x >> 1} * bytes;
-    // The lower tap of planar edge columns lies a luma row further on, about two chroma rows down.
-    return {g.src_chroma[plane],
-            src_pitch,
-            planar ? ptrdiff_t{g.src_stride} : src_pitch,
-            dst,
-            canvas.chroma_row(),
-            bytes,
-            2,
-            planar};
+    const int32_t bytes = canvas.format.chroma_bytes();
+    Plane plane = {};
+    plane.src = g.src_chroma[number];
+    plane.src_pitch = ptrdiff_t{half_rounded_up(g.src_stride)} * bytes;
+    // Planar edge columns take their lower sample a luma row further on, about two chroma rows
+    // down.
+    plane.edge_pitch = planar ? ptrdiff_t{g.src_stride} : plane.src_pitch;
+    plane.dst_pitch = canvas.chroma_pitch();
+    plane.dst = g.canvas + canvas.chroma_offset(number) + (g.dst_y >> 1) * plane.dst_pitch +
+                ptrdiff_t{g.dst_x >> 1} * bytes;
+    plane.sample_bytes = bytes;
+    plane.subsampling = 2;
+    plane.rounds_columns_up = planar;
+    return plane;
 }
 
 template <class Function>
 void for_each_plane(const BilinearGeometry& g, const Function& function) {
     function(first_plane(g));
     if (g.layout == BilinearLayout::kPixels) return;
-    const int32_t planes = g.canvas_planes().chroma.planes;
+    const int32_t planes = g.canvas_planes().format.chroma_planes;
     for (int32_t i = 0; i < planes; ++i) function(chroma_plane(g, i));
 }
 
-int32_t strip_length(int32_t first, int32_t end) {
-    return end - first < kBilinearColumns ? end - first : kBilinearColumns;
-}
+struct Range {
+    int32_t first;
+    int32_t end;
+};
 
-// Calls function(columns, first sample) for the samples [first, end) of a plane's rows.
+// Calls function(columns, first sample) for strips of a range of samples of a plane's rows.
 template <class Function>
-void for_each_strip(const Plane& plane, const BilinearAxes& axes, int32_t first, int32_t end,
+void for_each_strip(const Plane& plane, const BilinearAxes& axes, Range samples, int32_t to_right,
                     const Function& function) {
     BilinearColumns columns;
-    for (; first < end; first += columns.count) {
-        columns.count = strip_length(first, end);
+    columns.sample_bytes = plane.sample_bytes;
+    columns.to_right = to_right;
+    for (int32_t first = samples.first; first < samples.end; first += columns.count) {
+        const int32_t left = samples.end - first;
+        columns.count = left < kBilinearColumns ? left : kBilinearColumns;
         for (int32_t i = 0; i < columns.count; ++i) {
             const int32_t c = (first + i) * plane.subsampling;
             columns.index[i] = plane.column(axes.col_index[c]);
@@ -90,109 +98,125 @@ void for_each_strip(const Plane& plane, const BilinearAxes& axes, int32_t first,
     }
 }
 
-// A strip's part of a row lies a whole row behind the last one, where the processor does not look
-// by itself.
-void prefetch(const Plane& plane, const BilinearColumns& columns, const uint8_t* row) {
-    constexpr int64_t kCacheLine = 64;
-    const int64_t end = plane.sample_bytes * (columns.index[columns.count - 1] + int64_t{2});
-    for (int64_t i = plane.sample_bytes * int64_t{columns.index[0]}; i < end; i += kCacheLine) {
-        __builtin_prefetch(row + i);
-    }
+// The part of a source row that the columns name.
+struct Span {
+    int64_t first;
+    int64_t bytes;
+};
+
+Span span_of(const BilinearColumns& columns) {
+    const int64_t bytes = columns.sample_bytes;
+    const int64_t first = bytes * columns.index[0];
+    return {first, bytes * (columns.index[columns.count - 1] + int64_t{2}) - first};
 }
 
-// Two source rows of a strip, blended horizontally. A result row takes two neighbouring rows, and
-// the next one often takes one or both of them again.
-class BlendedRows {
+// A strip of a plane, and two of its source rows, blended horizontally. A destination row takes two
+// neighbouring ones, and the next destination row often takes one or both of them again.
+class BlendedStrip {
 public:
-    BlendedRows(const BilinearBlend& blend, const BilinearColumns& columns)
-        : blend_(blend), columns_(columns) {}
+    BlendedStrip(const Kernels& set, const BilinearColumns& columns)
+        : columns_(columns), kernels_(set.plan_bilinear(plan_, columns)) {}
+
+    // Blends destination rows. Their lower samples lie `below` bytes past the upper ones: 0 where
+    // rows are not blended.
+    void blend(const Plane& plane, const BilinearAxes& axes, Range rows, ptrdiff_t below,
+               int32_t first_sample) {
+        const ptrdiff_t offset = ptrdiff_t{first_sample} * plane.sample_bytes;
+        const int32_t step = plane.subsampling;
+        for (int32_t r = plane.first_row(rows.first); r < rows.end; r += step) {
+            const uint8_t* top = plane.src_row(axes.row_index[r]);
+            const uint8_t* bottom = top + below;
+            const BilinearSums& upper = sums(top, bottom);
+            const BilinearSums& lower = sums(bottom, top);
+            const uint8_t* next =
+                r + step < rows.end ? plane.src_row(axes.row_index[r + step]) : top;
+            kernels_.down(plane.dst_row(r) + offset, upper, lower, axes.row_weight[r], plan_,
+                          rows_to_fetch(top, bottom, next, below));
+        }
+    }
+
+private:
+    // What `next` and the row below it take that `top` and `bottom` do not.
+    BilinearNext rows_to_fetch(const uint8_t* top, const uint8_t* bottom, const uint8_t* next,
+                               ptrdiff_t below) const {
+        if (next <= top) return {};
+        const Span span = span_of(columns_);
+        const uint8_t* second = next + below + span.first;
+        return {{next > bottom ? next + span.first : second, second}, span.bytes};
+    }
 
     // The sums of `row`; those of `kept` stay as well if they are there.
     const BilinearSums& sums(const uint8_t* row, const uint8_t* kept) {
         const int held = row == rows_[0] ? 0 : 1;
         if (row == rows_[held]) return sums_[held];
         const int free = kept == rows_[0] ? 1 : 0;
-        blend_.across(sums_[free], row, columns_);
+        kernels_.across(sums_[free], row, plan_);
         rows_[free] = row;
         return sums_[free];
     }
 
-private:
-    const BilinearBlend& blend_;
+    BilinearSums sums_[2];
+    BilinearPlan plan_;
     const BilinearColumns& columns_;
     const uint8_t* rows_[2] = {nullptr, nullptr};
-    BilinearSums sums_[2];
+    const BilinearKernels kernels_;
 };
 
-void blend_plane(const Plane& plane, const BilinearAxes& axes, const BilinearExtent& extent) {
-    const BilinearBlend& blend = kernels().bilinear_blend[plane.sample_bytes >> 1];
-    const BilinearEdges& edges = kernels().bilinear_edges[plane.sample_bytes >> 1];
+// The last columns are blended with what lies below only, the last rows with what lies to the right
+// only.
+void blend_plane(const Kernels& set, const Plane& plane, const BilinearAxes& axes,
+                 const BilinearExtent& extent) {
     const int32_t all = plane.samples(extent.columns);
-    const int32_t blended = plane.samples(extent.columns - extent.edge_cols);
-    const int32_t first_edge_row =
-        extent.rows > extent.edge_rows ? extent.rows - extent.edge_rows : 0;
-    const auto dst = [&](int32_t r, int32_t first) {
-        return plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes;
-    };
-    const auto src = [&](int32_t r) { return plane.src_row(axes.row_index[r]); };
-    // A row without vertical blend is blended with itself.
-    const auto blend_edge_rows = [&](BlendedRows& rows, const BilinearColumns& s, int32_t first) {
-        for (int32_t r = plane.first_row(first_edge_row); r < extent.rows; r += plane.subsampling) {
-            const BilinearSums& row = rows.sums(src(r), nullptr);
-            blend.down(dst(r, first), row, row, 0, s.count * plane.sample_bytes);
-        }
-    };
-    for_each_strip(plane, axes, 0, blended, [&](BilinearColumns& s, int32_t first) {
-        blend.prepare(s);
-        BlendedRows rows(blend, s);
-        for (int32_t r = 0; r < first_edge_row; r += plane.subsampling) {
-            const uint8_t* top = src(r);
-            const uint8_t* bottom = top + plane.src_pitch;
-            const BilinearSums& upper = rows.sums(top, bottom);
-            const BilinearSums& lower = rows.sums(bottom, top);
-            if (r + plane.subsampling < first_edge_row) {
-                const uint8_t* next = src(r + plane.subsampling);
-                if (next > bottom) prefetch(plane, s, next);
-                if (next > top) prefetch(plane, s, next + plane.src_pitch);
+    const int32_t inner = plane.samples(extent.columns - extent.edge_cols);
+    const int32_t inner_rows = extent.rows > extent.edge_rows ? extent.rows - extent.edge_rows : 0;
+    const Range upper_rows = {0, inner_rows};
+    const Range last_rows = {inner_rows, extent.rows};
+    for_each_strip(plane, axes, {0, inner}, 1, [&](const BilinearColumns& columns, int32_t first) {
+        BlendedStrip strip(set, columns);
+        strip.blend(plane, axes, upper_rows, plane.src_pitch, first);
+        strip.blend(plane, axes, last_rows, 0, first);
+    });
+    for_each_strip(
+        plane, axes, {inner, all}, 0, [&](const BilinearColumns& columns, int32_t first) {
+            BlendedStrip(set, columns).blend(plane, axes, upper_rows, plane.edge_pitch, first);
+        });
+    for_each_strip(plane, axes, {inner, all}, 1,
+                   [&](const BilinearColumns& columns, int32_t first) {
+                       BlendedStrip(set, columns).blend(plane, axes, last_rows, 0, first);
+                   });
+}
+
+void copy_plane(const Kernels& set, const Plane& plane, const BilinearAxes& axes, int32_t columns,
+                Range rows) {
+    const auto copy_strip = [&](const BilinearColumns& strip, int32_t first) {
+        BilinearPlan plan;
+        BilinearCopy* copy = set.plan_bilinear_copy(plan, strip);
+        const Span span = span_of(strip);
+        for (int32_t r = plane.first_row(rows.first); r < rows.end; r += plane.subsampling) {
+            const int32_t next = r + plane.subsampling;
+            if (next < rows.end) {
+                prefetch(plane.src_row(axes.row_index[next]) + span.first, span.bytes);
             }
-            blend.down(dst(r, first), upper, lower, axes.row_weight[r],
-                       s.count * plane.sample_bytes);
+            copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
+                 plane.src_row(axes.row_index[r]), plan);
         }
-        blend_edge_rows(rows, s, first);
-    });
-    for_each_strip(plane, axes, blended, all, [&](BilinearColumns& s, int32_t first) {
-        for (int32_t r = 0; r < first_edge_row; r += plane.subsampling) {
-            edges.vertical(dst(r, first), src(r), src(r) + plane.edge_pitch, axes.row_weight[r], s);
-        }
-        blend.prepare(s);
-        BlendedRows rows(blend, s);
-        blend_edge_rows(rows, s, first);
-    });
+    };
+    for_each_strip(plane, axes, {0, plane.samples(columns)}, 0, copy_strip);
 }
 
 }  // namespace
 
-void blend_rows(const BilinearGeometry& geometry, const BilinearAxes& axes,
+void blend_rows(const Kernels& set, const BilinearGeometry& geometry, const BilinearAxes& axes,
                 const BilinearExtent& extent) {
     if (extent.columns < 1 || extent.rows < 1) return;
-    for_each_plane(geometry, [&](const Plane& plane) { blend_plane(plane, axes, extent); });
+    for_each_plane(geometry, [&](const Plane& plane) { blend_plane(set, plane, axes, extent); });
 }
 
-void copy_rows(const BilinearGeometry& geometry, const BilinearAxes& axes, int32_t columns,
-               int32_t first_row, int32_t end_row) {
+void copy_rows(const Kernels& set, const BilinearGeometry& geometry, const BilinearAxes& axes,
+               int32_t columns, int32_t first_row, int32_t end_row) {
     if (columns < 1 || first_row >= end_row) return;
     for_each_plane(geometry, [&](const Plane& plane) {
-        const BilinearCopy& copy = kernels().bilinear_copy[plane.sample_bytes >> 1];
-        const auto strip = [&](BilinearColumns& s, int32_t first) {
-            copy.prepare(s);
-            for (int32_t r = plane.first_row(first_row); r < end_row; r += plane.subsampling) {
-                const int32_t next = r + plane.subsampling;
-                if (next < end_row) prefetch(plane, s, plane.src_row(axes.row_index[next]));
-                copy.copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
-                          plane.src_row(axes.row_index[r]), s);
-            }
-        };
-        for_each_strip(plane, axes, 0, plane.samples(columns), strip);
+        copy_plane(set, plane, axes, columns, {first_row, end_row});
     });
 }
 

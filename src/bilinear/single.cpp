@@ -15,5 +15,5 @@ void ov_bilinear_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src
     tables.fill(geometry);
     const BilinearExtent extent = extent_of(geometry, tables);
     clear_canvas(geometry, extent);
-    blend_rows(geometry, axes_of(tables), extent);
+    blend_rows(kernels(), geometry, tables, extent);
 }

@@ -1,55 +1,60 @@
 // SPDX-License-Identifier: Apache-2.0
-// Blended bilinear rows with AVX2: two lanes at a time.
+// Blended bilinear rows with AVX2: two quads in a vector.
 #include <immintrin.h>
+#include <stddef.h>
 #include <string.h>
 
-#include "kernels/bilinear_lanes.h"
+#include "kernels/bilinear_quads_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
 
 namespace {
 
-constexpr int32_t kStepLanes = 2;
-constexpr int32_t kStepSums = kStepLanes * kLaneBytes;
+constexpr int32_t kStepQuads = 4;
 constexpr int32_t kStepBytes = 32;  // of a finished row
-
-template <int N>
-void prepare(BilinearColumns& columns) {
-    prepare_lanes<N, 1, kStepLanes>(columns, 16);
-}
 
 __m256i load_sums(const uint32_t* sums) {
     return _mm256_load_si256(reinterpret_cast<const __m256i*>(sums));
 }
 
-// Left and right samples of two lanes, blended.
-__m256i blend_lanes(const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
-    const auto* low = reinterpret_cast<const __m128i*>(row + columns.lane_base[lane]);
-    const auto* high = reinterpret_cast<const __m128i*>(row + columns.lane_base[lane + 1]);
-    const __m256i windows = _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
-                                                    _mm_loadu_si128(high), 1);
-    const auto* shuffle = reinterpret_cast<const __m256i*>(columns.lane_shuffle[lane]);
-    const auto* weights = reinterpret_cast<const __m256i*>(columns.lane_weights[lane]);
-    return _mm256_madd_epi16(_mm256_shuffle_epi8(windows, _mm256_load_si256(shuffle)),
-                             _mm256_load_si256(weights));
+// The windows of two quads, which may be one.
+template <int kWindowQuads>
+__m256i load_windows(const uint8_t* row, const BilinearPlan& plan, ptrdiff_t quad) {
+    const auto* low = reinterpret_cast<const __m128i*>(row + plan.windows[quad]);
+    if (kWindowQuads == 2) return _mm256_broadcastsi128_si256(_mm_loadu_si128(low));
+    const auto* high = reinterpret_cast<const __m128i*>(row + plan.windows[quad + 1]);
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
+                                   _mm_loadu_si128(high), 1);
 }
 
-template <int N>
-void across(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns) {
-    if (columns.window_bytes == 0) return bilinear_blend_scalar[N >> 1].across(sums, row, columns);
-    const int32_t count = whole_steps(columns.count * N, kStepSums);
-    for (int32_t i = 0; i < count; i += kStepSums) {
-        _mm256_store_si256(reinterpret_cast<__m256i*>(sums.values + i),
-                           blend_lanes(row, columns, i / kLaneBytes));
+// Left and right samples of two quads, blended.
+template <int kWindowQuads>
+void blend_quads(uint32_t* sums, const uint8_t* row, const BilinearPlan& plan, ptrdiff_t quad) {
+    const auto* shuffle = reinterpret_cast<const __m256i*>(plan.shuffles[quad]);
+    const auto* weights = reinterpret_cast<const __m256i*>(plan.weights[quad]);
+    const __m256i samples = _mm256_shuffle_epi8(load_windows<kWindowQuads>(row, plan, quad),
+                                                _mm256_load_si256(shuffle));
+    _mm256_store_si256(reinterpret_cast<__m256i*>(sums + quad * kQuadBytes),
+                       _mm256_madd_epi16(samples, _mm256_load_si256(weights)));
+}
+
+template <int kWindowQuads>
+void across(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
+    const ptrdiff_t quads = (plan.bytes() + kQuadBytes - 1) / kQuadBytes;
+    for (ptrdiff_t quad = 0; quad < quads; quad += kStepQuads) {
+        blend_quads<kWindowQuads>(sums.values, row, plan, quad);
+        blend_quads<kWindowQuads>(sums.values, row, plan, quad + 2);
     }
 }
 
-// Eight target bytes as 32-bit numbers. upper * (4096 - wy) + lower * wy with one multiplication.
+// Eight destination bytes as 32-bit numbers: upper * (4096 - wy) + lower * wy with one
+// multiplication.
 __m256i blend_eight(const uint32_t* upper, const uint32_t* lower, __m256i wy) {
     const __m256i from = load_sums(upper);
     const __m256i step = _mm256_mullo_epi32(_mm256_sub_epi32(load_sums(lower), from), wy);
-    return _mm256_srli_epi32(_mm256_add_epi32(_mm256_slli_epi32(from, 12), step), 24);
+    return _mm256_srli_epi32(_mm256_add_epi32(_mm256_slli_epi32(from, kBilinearWeightBits), step),
+                             kBilinearResultBits);
 }
 
 __m256i blend_bytes(const uint32_t* upper, const uint32_t* lower, __m256i wy) {
@@ -62,24 +67,22 @@ __m256i blend_bytes(const uint32_t* upper, const uint32_t* lower, __m256i wy) {
 }
 
 void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
-          int32_t bytes) {
+          const BilinearPlan& plan, const BilinearNext& next) {
+    const int32_t bytes = plan.bytes();
+    SteadyFetch fetch(next, bytes / kStepBytes);
     const __m256i weight = _mm256_set1_epi32(wy);
     int32_t i = 0;
     for (; i + kStepBytes <= bytes; i += kStepBytes) {
+        fetch.step();
         _mm256_storeu_si256(reinterpret_cast<__m256i*>(dst + i),
                             blend_bytes(upper.values + i, lower.values + i, weight));
     }
     if (i < bytes) {
-        alignas(32) uint8_t copy[kStepBytes];
-        _mm256_store_si256(reinterpret_cast<__m256i*>(copy),
+        alignas(32) uint8_t last[kStepBytes];
+        _mm256_store_si256(reinterpret_cast<__m256i*>(last),
                            blend_bytes(upper.values + i, lower.values + i, weight));
-        memcpy(dst + i, copy, static_cast<size_t>(bytes - i));
+        memcpy(dst + i, last, static_cast<size_t>(bytes - i));
     }
-}
-
-template <int N>
-void prepare_copy(BilinearColumns& columns) {
-    if (!prepare_groups<N>(columns, 16, 32)) prepare_groups<N>(columns, 8, 32);
 }
 
 // 16 bytes of a window of 32. Shuffles give 0 where the top bit of an index is set.
@@ -91,32 +94,34 @@ __m128i shuffle_window(const uint8_t* window, __m128i indices) {
                         _mm_shuffle_epi8(_mm_loadu_si128(halves + 1), in_high));
 }
 
-template <int N>
-void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
-    if (columns.window_bytes == 0) return bilinear_copy_scalar[N >> 1].copy(dst, row, columns);
-    if (columns.group_bytes == 16) {
-        copy_groups<N, 16>(dst, row, columns,
-                           [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
-                               const auto* indices = reinterpret_cast<const __m128i*>(shuffle);
-                               _mm_storeu_si128(reinterpret_cast<__m128i*>(to),
-                                                shuffle_window(window, _mm_loadu_si128(indices)));
-                           });
-    } else {
-        copy_groups<N, 8>(dst, row, columns,
-                          [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
-                              const auto* indices = reinterpret_cast<const __m128i*>(shuffle);
-                              _mm_storel_epi64(reinterpret_cast<__m128i*>(to),
-                                               shuffle_window(window, _mm_loadl_epi64(indices)));
-                          });
-    }
+void copy_groups_of_16(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<16>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        const auto* indices = reinterpret_cast<const __m128i*>(shuffle);
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(to),
+                         shuffle_window(window, _mm_loadu_si128(indices)));
+    });
+}
+
+void copy_groups_of_8(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<8>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        const auto* indices = reinterpret_cast<const __m128i*>(shuffle);
+        _mm_storel_epi64(reinterpret_cast<__m128i*>(to),
+                         shuffle_window(window, _mm_loadl_epi64(indices)));
+    });
 }
 
 }  // namespace
 
-const BilinearBlend bilinear_blend_avx2[3] = {
-    {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
+BilinearKernels plan_bilinear_avx2(BilinearPlan& plan, const BilinearColumns& columns) {
+    if (plan_quads(plan, columns, {16, 2, kStepQuads})) return {across<2>, down};
+    if (plan_quads(plan, columns, {16, 1, kStepQuads})) return {across<1>, down};
+    return {plan_bilinear_scalar(plan, columns).across, down};
+}
 
-const BilinearCopy bilinear_copy_avx2[3] = {
-    {prepare_copy<1>, copy<1>}, {prepare_copy<2>, copy<2>}, {prepare_copy<4>, copy<4>}};
+BilinearCopy* plan_bilinear_copy_avx2(BilinearPlan& plan, const BilinearColumns& columns) {
+    if (plan_groups(plan, columns, 16, 32)) return copy_groups_of_16;
+    if (plan_groups(plan, columns, 8, 32)) return copy_groups_of_8;
+    return plan_bilinear_copy_scalar(plan, columns);
+}
 
 }  // namespace ovrin

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-// Blended bilinear rows with AVX-512: one window and one shuffle for four lanes.
-#include "kernels/bilinear_lanes.h"
+// Blended bilinear rows with AVX-512: one window and one shuffle for four quads.
+#include "kernels/bilinear_quads_inl.h"
 #include "kernels/intrinsics_avx512.h"
 #include "kernels/sets.h"
 
@@ -8,22 +8,9 @@ namespace ovrin {
 
 namespace {
 
-constexpr int32_t kLanes = 4;
-constexpr int32_t kStepSums = kLanes * kLaneBytes;
-constexpr int32_t kStepBytes = 64;     // of a finished row
-constexpr int32_t kNarrowWindows = 1;  // instead of a size: windows as AVX2 plans them
-
-// The smallest window that will do: it crosses fewer cache lines. Reductions to less than a third
-// or so take more than the largest.
-template <int N>
-void prepare(BilinearColumns& columns) {
-    for (int32_t window_bytes = 16; window_bytes <= 64; window_bytes *= 2) {
-        prepare_lanes<N, kLanes, kLanes>(columns, window_bytes);
-        if (columns.window_bytes != 0) return;
-    }
-    bilinear_blend_avx2[N >> 1].prepare(columns);
-    if (columns.window_bytes != 0) columns.window_bytes = kNarrowWindows;
-}
+constexpr int32_t kQuads = 4;
+constexpr int32_t kStepSums = kQuads * kQuadBytes;
+constexpr int32_t kStepBytes = 64;  // of a finished row
 
 template <int kBytes>
 __m512i load_window(const uint8_t* bytes) {
@@ -36,41 +23,26 @@ __m512i load_window(const uint8_t* bytes) {
     return _mm512_loadu_si512(bytes);
 }
 
-template <int kBytes>
-void across_windows(uint32_t* sums, const uint8_t* row, const BilinearColumns& columns,
-                    int32_t count) {
+template <int kWindowBytes>
+void across(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
     const __mmask64 low_bytes = 0x5555555555555555;
+    const int32_t count = plan.bytes();
     for (int32_t i = 0; i < count; i += kStepSums) {
-        const int32_t lane = i / kLaneBytes;
-        const __m512i window = load_window<kBytes>(row + columns.lane_base[lane]);
-        const __m512i shuffle = _mm512_load_si512(columns.lane_shuffle[lane]);
-        const __m512i weights = _mm512_load_si512(columns.lane_weights[lane]);
+        const int32_t quad = i / kQuadBytes;
+        const __m512i window = load_window<kWindowBytes>(row + plan.windows[quad]);
+        const __m512i shuffle = _mm512_load_si512(plan.shuffles[quad]);
+        const __m512i weights = _mm512_load_si512(plan.weights[quad]);
         const __m512i samples = _mm512_maskz_permutexvar_epi8(low_bytes, shuffle, window);
-        _mm512_store_si512(sums + i, _mm512_madd_epi16(samples, weights));
+        _mm512_store_si512(sums.values + i, _mm512_madd_epi16(samples, weights));
     }
 }
 
-template <int N>
-void across(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns) {
-    const int32_t count = whole_steps(columns.count * N, kStepSums);
-    switch (columns.window_bytes) {
-        case 16:
-            return across_windows<16>(sums.values, row, columns, count);
-        case 32:
-            return across_windows<32>(sums.values, row, columns, count);
-        case 64:
-            return across_windows<64>(sums.values, row, columns, count);
-        default:
-            return bilinear_blend_avx2[N >> 1].across(sums, row, columns);
-    }
-}
-
-// Sixteen target bytes, the top ones of 32-bit numbers. upper * (4096 - wy) + lower * wy with one
-// multiplication.
+// Sixteen destination bytes, the top ones of 32-bit numbers: upper * (4096 - wy) + lower * wy with
+// one multiplication.
 __m512i blend_sixteen(const uint32_t* upper, const uint32_t* lower, __m512i wy) {
     const __m512i from = _mm512_load_si512(upper);
     const __m512i step = _mm512_mullo_epi32(_mm512_sub_epi32(_mm512_load_si512(lower), from), wy);
-    return _mm512_add_epi32(_mm512_slli_epi32(from, 12), step);
+    return _mm512_add_epi32(_mm512_slli_epi32(from, kBilinearWeightBits), step);
 }
 
 // The top bytes of two vectors of 32-bit numbers.
@@ -89,10 +61,13 @@ __m512i blend_bytes(const uint32_t* upper, const uint32_t* lower, __m512i wy) {
 }
 
 void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
-          int32_t bytes) {
+          const BilinearPlan& plan, const BilinearNext& next) {
+    const int32_t bytes = plan.bytes();
+    SteadyFetch fetch(next, bytes / kStepBytes);
     const __m512i weight = _mm512_set1_epi32(wy);
     int32_t i = 0;
     for (; i + kStepBytes <= bytes; i += kStepBytes) {
+        fetch.step();
         _mm512_storeu_si512(dst + i, blend_bytes(upper.values + i, lower.values + i, weight));
     }
     if (i < bytes) {
@@ -102,63 +77,59 @@ void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, in
     }
 }
 
-// Windows of one vector, or of two for groups of less and less.
-template <int N>
-void prepare_copy(BilinearColumns& columns) {
-    if (prepare_groups<N>(columns, 64, 64)) return;
-    for (int32_t group_bytes = 64; group_bytes >= 16; group_bytes /= 2) {
-        if (prepare_groups<N>(columns, group_bytes, 128)) return;
-    }
-}
-
 // The bytes of a window of 128.
 __m512i shuffle_window(const uint8_t* window, __m512i indices) {
     return _mm512_permutex2var_epi8(_mm512_loadu_si512(window), indices,
                                     _mm512_loadu_si512(window + 64));
 }
 
-void copy_64_of_64(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
-    _mm512_storeu_si512(
-        dst, _mm512_permutexvar_epi8(_mm512_loadu_si512(shuffle), _mm512_loadu_si512(window)));
+void copy_64_of_64(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<64>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        const __m512i indices = _mm512_loadu_si512(shuffle);
+        _mm512_storeu_si512(to, _mm512_permutexvar_epi8(indices, _mm512_loadu_si512(window)));
+    });
 }
 
-void copy_64_of_128(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
-    _mm512_storeu_si512(dst, shuffle_window(window, _mm512_loadu_si512(shuffle)));
+void copy_64_of_128(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<64>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        _mm512_storeu_si512(to, shuffle_window(window, _mm512_loadu_si512(shuffle)));
+    });
 }
 
-void copy_32_of_128(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
-    const __m256i indices = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(shuffle));
-    const __m512i bytes = shuffle_window(window, _mm512_castsi256_si512(indices));
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(dst), _mm512_castsi512_si256(bytes));
+void copy_32_of_128(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<32>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        const __m256i indices = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(shuffle));
+        const __m512i bytes = shuffle_window(window, _mm512_castsi256_si512(indices));
+        _mm256_storeu_si256(reinterpret_cast<__m256i*>(to), _mm512_castsi512_si256(bytes));
+    });
 }
 
-void copy_16_of_128(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
-    const __m128i indices = _mm_loadu_si128(reinterpret_cast<const __m128i*>(shuffle));
-    const __m512i bytes = shuffle_window(window, _mm512_castsi128_si512(indices));
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), _mm512_castsi512_si128(bytes));
-}
-
-template <int N>
-void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
-    if (columns.window_bytes == 0) {
-        bilinear_copy_scalar[N >> 1].copy(dst, row, columns);
-    } else if (columns.window_bytes == 64) {
-        copy_groups<N, 64>(dst, row, columns, copy_64_of_64);
-    } else if (columns.group_bytes == 64) {
-        copy_groups<N, 64>(dst, row, columns, copy_64_of_128);
-    } else if (columns.group_bytes == 32) {
-        copy_groups<N, 32>(dst, row, columns, copy_32_of_128);
-    } else {
-        copy_groups<N, 16>(dst, row, columns, copy_16_of_128);
-    }
+void copy_16_of_128(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<16>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        const __m128i indices = _mm_loadu_si128(reinterpret_cast<const __m128i*>(shuffle));
+        const __m512i bytes = shuffle_window(window, _mm512_castsi128_si512(indices));
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(to), _mm512_castsi512_si128(bytes));
+    });
 }
 
 }  // namespace
 
-const BilinearBlend bilinear_blend_avx512[3] = {
-    {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
+// The smallest window that will do: it crosses fewer cache lines. Reductions to less than a third
+// or so take more than the largest; of those, windows as AVX2 takes them serve a quad each.
+BilinearKernels plan_bilinear_avx512(BilinearPlan& plan, const BilinearColumns& columns) {
+    if (plan_quads(plan, columns, {16, kQuads, kQuads})) return {across<16>, down};
+    if (plan_quads(plan, columns, {32, kQuads, kQuads})) return {across<32>, down};
+    if (plan_quads(plan, columns, {64, kQuads, kQuads})) return {across<64>, down};
+    return {plan_bilinear_avx2(plan, columns).across, down};
+}
 
-const BilinearCopy bilinear_copy_avx512[3] = {
-    {prepare_copy<1>, copy<1>}, {prepare_copy<2>, copy<2>}, {prepare_copy<4>, copy<4>}};
+// Windows of one vector, or of two for smaller and smaller groups.
+BilinearCopy* plan_bilinear_copy_avx512(BilinearPlan& plan, const BilinearColumns& columns) {
+    if (plan_groups(plan, columns, 64, 64)) return copy_64_of_64;
+    if (plan_groups(plan, columns, 64, 128)) return copy_64_of_128;
+    if (plan_groups(plan, columns, 32, 128)) return copy_32_of_128;
+    if (plan_groups(plan, columns, 16, 128)) return copy_16_of_128;
+    return plan_bilinear_copy_scalar(plan, columns);
+}
 
 }  // namespace ovrin

@@ -1,36 +1,31 @@
 // SPDX-License-Identifier: Apache-2.0
-// Blended bilinear rows with NEON, a lane at a time.
+// Blended bilinear rows with NEON, a quad at a time.
 #include <arm_neon.h>
 #include <string.h>
 
-#include "kernels/bilinear_lanes.h"
+#include "kernels/bilinear_quads_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
 
 namespace {
 
-constexpr int32_t kStepLanes = 4;
-constexpr int32_t kStepSums = kStepLanes * kLaneBytes;
+constexpr int32_t kStepQuads = 4;
+constexpr int32_t kStepSums = kStepQuads * kQuadBytes;
 constexpr int32_t kStepBytes = 16;  // of a finished row
 
-template <int N>
-void prepare(BilinearColumns& columns) {
-    prepare_lanes<N, 1, kStepLanes>(columns, 16);
-}
-
-// What follows goes through four lanes in step: processors that work in order would wait for each
+// What follows goes through four quads in step: processors that work in order would wait for each
 // result before they use it.
 
-// Left and right samples of four lanes, blended.
-void blend_lanes(uint32_t* sums, const uint8_t* row, const BilinearColumns& columns, int32_t lane) {
+// Left and right samples of four quads, blended.
+void blend_quads(uint32_t* sums, const uint8_t* row, const BilinearPlan& plan, int32_t quad) {
     // Lookups outside the table give 0: the high bytes of the 16-bit samples.
     const auto samples = [&](int32_t k) {
-        return vreinterpretq_s16_u8(vqtbl1q_u8(vld1q_u8(row + columns.lane_base[lane + k]),
-                                               vld1q_u8(columns.lane_shuffle[lane + k])));
+        return vreinterpretq_s16_u8(
+            vqtbl1q_u8(vld1q_u8(row + plan.windows[quad + k]), vld1q_u8(plan.shuffles[quad + k])));
     };
     const auto weights = [&](int32_t k) {
-        return vreinterpretq_s16_s32(vld1q_s32(columns.lane_weights[lane + k]));
+        return vreinterpretq_s16_s32(vld1q_s32(plan.weights[quad + k]));
     };
     const int16x8_t s[] = {samples(0), samples(1), samples(2), samples(3)};
     const int16x8_t w[] = {weights(0), weights(1), weights(2), weights(3)};
@@ -46,12 +41,10 @@ void blend_lanes(uint32_t* sums, const uint8_t* row, const BilinearColumns& colu
     vst1q_u32(sums + 12, all[3]);
 }
 
-template <int N>
-void across(BilinearSums& sums, const uint8_t* row, const BilinearColumns& columns) {
-    if (columns.window_bytes == 0) return bilinear_blend_scalar[N >> 1].across(sums, row, columns);
-    const int32_t count = whole_steps(columns.count * N, kStepSums);
+void across(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
+    const int32_t count = plan.bytes();
     for (int32_t i = 0; i < count; i += kStepSums) {
-        blend_lanes(sums.values + i, row, columns, i / kLaneBytes);
+        blend_quads(sums.values + i, row, plan, i / kQuadBytes);
     }
 }
 
@@ -61,7 +54,7 @@ uint8x16_t blend_bytes(const uint32_t* upper, const uint32_t* lower, uint32_t wy
     const auto load_lower = [&](int32_t k) { return vld1q_u32(lower + 4 * k); };
     const uint32x4_t from[] = {load_upper(0), load_upper(1), load_upper(2), load_upper(3)};
     const uint32x4_t to[] = {load_lower(0), load_lower(1), load_lower(2), load_lower(3)};
-    const auto shifted = [&](int32_t k) { return vshlq_n_u32(from[k], 12); };
+    const auto shifted = [&](int32_t k) { return vshlq_n_u32(from[k], kBilinearWeightBits); };
     const auto step = [&](int32_t k) { return vsubq_u32(to[k], from[k]); };
     const uint32x4_t begin[] = {shifted(0), shifted(1), shifted(2), shifted(3)};
     const uint32x4_t steps[] = {step(0), step(1), step(2), step(3)};
@@ -76,57 +69,52 @@ uint8x16_t blend_bytes(const uint32_t* upper, const uint32_t* lower, uint32_t wy
 }
 
 void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
-          int32_t bytes) {
+          const BilinearPlan& plan, const BilinearNext& next) {
+    const int32_t bytes = plan.bytes();
+    SteadyFetch fetch(next, bytes / kStepBytes);
     const uint32_t weight = static_cast<uint32_t>(wy);
     int32_t i = 0;
     for (; i + kStepBytes <= bytes; i += kStepBytes) {
+        fetch.step();
         vst1q_u8(dst + i, blend_bytes(upper.values + i, lower.values + i, weight));
     }
     if (i < bytes) {
-        uint8_t copy[kStepBytes];
-        vst1q_u8(copy, blend_bytes(upper.values + i, lower.values + i, weight));
-        memcpy(dst + i, copy, static_cast<size_t>(bytes - i));
+        uint8_t last[kStepBytes];
+        vst1q_u8(last, blend_bytes(upper.values + i, lower.values + i, weight));
+        memcpy(dst + i, last, static_cast<size_t>(bytes - i));
     }
 }
 
-template <int N>
-void prepare_copy(BilinearColumns& columns) {
-    for (int32_t window_bytes = 16; window_bytes <= 64; window_bytes *= 2) {
-        if (prepare_groups<N>(columns, 16, window_bytes)) return;
-    }
+void copy_of_16(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<16>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        vst1q_u8(to, vqtbl1q_u8(vld1q_u8(window), vld1q_u8(shuffle)));
+    });
 }
 
-void copy_of_16(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
-    vst1q_u8(dst, vqtbl1q_u8(vld1q_u8(window), vld1q_u8(shuffle)));
+void copy_of_32(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<16>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        vst1q_u8(to, vqtbl2q_u8(vld1q_u8_x2(window), vld1q_u8(shuffle)));
+    });
 }
 
-void copy_of_32(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
-    vst1q_u8(dst, vqtbl2q_u8(vld1q_u8_x2(window), vld1q_u8(shuffle)));
-}
-
-void copy_of_64(uint8_t* dst, const uint8_t* window, const uint8_t* shuffle) {
-    vst1q_u8(dst, vqtbl4q_u8(vld1q_u8_x4(window), vld1q_u8(shuffle)));
-}
-
-template <int N>
-void copy(uint8_t* dst, const uint8_t* row, const BilinearColumns& columns) {
-    if (columns.window_bytes == 0) {
-        bilinear_copy_scalar[N >> 1].copy(dst, row, columns);
-    } else if (columns.window_bytes == 16) {
-        copy_groups<N, 16>(dst, row, columns, copy_of_16);
-    } else if (columns.window_bytes == 32) {
-        copy_groups<N, 16>(dst, row, columns, copy_of_32);
-    } else {
-        copy_groups<N, 16>(dst, row, columns, copy_of_64);
-    }
+void copy_of_64(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan) {
+    copy_groups<16>(dst, row, plan, [](uint8_t* to, const uint8_t* window, const uint8_t* shuffle) {
+        vst1q_u8(to, vqtbl4q_u8(vld1q_u8_x4(window), vld1q_u8(shuffle)));
+    });
 }
 
 }  // namespace
 
-const BilinearBlend bilinear_blend_neon[3] = {
-    {prepare<1>, across<1>, down}, {prepare<2>, across<2>, down}, {prepare<4>, across<4>, down}};
+BilinearKernels plan_bilinear_neon(BilinearPlan& plan, const BilinearColumns& columns) {
+    if (plan_quads(plan, columns, {16, 1, kStepQuads})) return {across, down};
+    return {plan_bilinear_scalar(plan, columns).across, down};
+}
 
-const BilinearCopy bilinear_copy_neon[3] = {
-    {prepare_copy<1>, copy<1>}, {prepare_copy<2>, copy<2>}, {prepare_copy<4>, copy<4>}};
+BilinearCopy* plan_bilinear_copy_neon(BilinearPlan& plan, const BilinearColumns& columns) {
+    if (plan_groups(plan, columns, 16, 16)) return copy_of_16;
+    if (plan_groups(plan, columns, 16, 32)) return copy_of_32;
+    if (plan_groups(plan, columns, 16, 64)) return copy_of_64;
+    return plan_bilinear_copy_scalar(plan, columns);
+}
 
 }  // namespace ovrin

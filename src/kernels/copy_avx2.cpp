@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-// Every step-th word with AVX2: of each source vector, its words go to their places in the target
-// vector. Longer vectors are no faster: the rows are waited for.
+// Every step-th word with AVX2: of each source vector, its words go to their places in the
+// destination vector. Longer vectors are no faster: the rows are waited for.
 #include <immintrin.h>
 
+#include "kernels/copy_words_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
@@ -10,9 +11,9 @@ namespace ovrin {
 namespace {
 
 constexpr int32_t kWords = 8;
-constexpr int32_t kMostVectors = 8;  // beyond this step, word by word is as fast
+constexpr int32_t kMaxVectors = 8;  // beyond this step, word by word is as fast
 
-// Which words of the target vector come from a source vector, and which words of it they are.
+// Which words of the destination vector come from a source vector, and which words of it they are.
 struct Part {
     __m256i index;
     __m256i mask;
@@ -47,7 +48,7 @@ void copy_vectors(uint32_t* dst, const uint32_t* src, int32_t vectors, const uin
 }
 
 using CopyVectors = void(uint32_t* dst, const uint32_t* src, int32_t vectors, const uint32_t* next);
-constexpr CopyVectors* kCopyVectors[kMostVectors + 1] = {
+constexpr CopyVectors* kCopyVectors[kMaxVectors + 1] = {
     nullptr,         nullptr,         copy_vectors<2>, copy_vectors<3>, copy_vectors<4>,
     copy_vectors<5>, copy_vectors<6>, copy_vectors<7>, copy_vectors<8>};
 
@@ -55,16 +56,16 @@ constexpr CopyVectors* kCopyVectors[kMostVectors + 1] = {
 
 void copy_every_avx2(uint32_t* dst, const uint32_t* src, int32_t step, int32_t count,
                      const uint32_t* next) {
-    if (step < 2 || step > kMostVectors) {
-        copy_every_scalar(dst, src, step, count, next);
+    if (step < 2 || step > kMaxVectors) {
+        copy_words(dst, src, step, count, next);
         return;
     }
     // Vectors read up to the word that follows; so one must follow.
     const int32_t vectors = (count - 1) / kWords;
     kCopyVectors[step](dst, src, vectors, next);
-    const ptrdiff_t done = ptrdiff_t{vectors} * kWords;
-    copy_every_scalar(dst + done, src + done * step, step, count - static_cast<int32_t>(done),
-                      next + done * step);
+    const int64_t done = int64_t{vectors} * kWords;
+    copy_words(dst + done, src + done * step, step, count - static_cast<int32_t>(done),
+               next + done * step);
 }
 
 }  // namespace ovrin

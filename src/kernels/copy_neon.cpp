@@ -2,6 +2,7 @@
 // Every step-th word with NEON: the loads that part interleaved elements do it.
 #include <arm_neon.h>
 
+#include "kernels/copy_words_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
@@ -29,7 +30,7 @@ void copy_every_neon(uint32_t* dst, const uint32_t* src, int32_t step, int32_t c
         src += kWords * step;
         next += kWords * step;
     }
-    copy_every_scalar(dst, src, step, count - vectors * kWords, next);
+    copy_words(dst, src, step, count - vectors * kWords, next);
 }
 
 }  // namespace ovrin

@@ -1,31 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <string.h>
-
 #include "kernels/sets.h"
 
 namespace ovrin {
 
-namespace {
-
-constexpr int32_t kLineWords = 16;
-
-}  // namespace
-
 void copy_every_scalar(uint32_t* dst, const uint32_t* src, int32_t step, int32_t count,
-                       const uint32_t* next) {
-    if (step == 1) {
-        memcpy(dst, src, static_cast<size_t>(count) * sizeof *dst);
-        return;
-    }
-    const int32_t line = step < kLineWords ? kLineWords : step;
-    int64_t fetched = 0;
-    for (int32_t i = 0; i < count; ++i, src += step) {
-        dst[i] = *src;
-        if (int64_t{i} * step >= fetched) {
-            __builtin_prefetch(next + fetched);
-            fetched += line;
-        }
-    }
+                       const uint32_t* /*next*/) {
+    for (int64_t i = 0; i < count; ++i) dst[i] = src[i * step];
 }
 
 }  // namespace ovrin

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
-// Lanczos rows with AVX2 and FMA; see lanczos_approximation.h for how the byte is decided.
+// Lanczos rows with AVX2 and FMA; see lanczos_approximation_inl.h for how the byte is decided.
 #include <immintrin.h>
 #include <string.h>
 
-#include "kernels/lanczos_approximation.h"
-#include "kernels/lanczos_chains_x86.h"
+#include "kernels/lanczos_approximation_inl.h"
+#include "kernels/lanczos_x86_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
@@ -13,23 +13,18 @@ namespace {
 
 constexpr int32_t kVectorFloats = 8;
 
-void convert_vector(float* floats, const uint8_t* bytes) {
-    const __m128i eight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes));
-    _mm256_storeu_ps(floats, _mm256_cvtepi32_ps(_mm256_cvtepu8_epi32(eight)));
-}
-
 // Taps `first` and `first + 1` of a pixel.
 __m256 two_weights(__m256 weights, int first) {
     const __m256i lanes = _mm256_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1);
     return _mm256_permutevar8x32_ps(weights, _mm256_add_epi32(lanes, _mm256_set1_epi32(first)));
 }
 
-// Seven taps of a pixel, added up to two partial sums per component.
+// The taps of a pixel, added up to two partial sums per component.
 __m256 weigh_taps(const float* taps, const float* weights) {
-    const __m256 seven = _mm256_load_ps(weights);
-    __m256 sum = _mm256_mul_ps(two_weights(seven, 0), _mm256_loadu_ps(taps));
-    for (int32_t i = 2; i < kTaps; i += 2) {
-        sum = _mm256_fmadd_ps(two_weights(seven, i), _mm256_loadu_ps(taps + i * kPixel), sum);
+    const __m256 eight = _mm256_load_ps(weights);
+    __m256 sum = _mm256_mul_ps(two_weights(eight, 0), _mm256_loadu_ps(taps));
+    for (int32_t i = 2; i < kLanczosTaps; i += 2) {
+        sum = _mm256_fmadd_ps(two_weights(eight, i), _mm256_loadu_ps(taps + i * kPixel), sum);
     }
     return sum;
 }
@@ -54,75 +49,53 @@ __m128i pack(__m256 low, __m256 high) {
         _mm256_permutevar8x32_epi32(bytes, _mm256_setr_epi32(0, 4, 1, 5, 0, 0, 0, 0)));
 }
 
-// Seven rows of sums, to be weighed and added.
-class Avx2Sums {
-public:
-    Avx2Sums(const float* const* rows, const double* weights, float uncertain)
-        : uncertain_(_mm256_set1_ps(uncertain)) {
-        for (int32_t r = 0; r < kTaps; ++r) {
-            rows_[r] = rows[r];
-            weights_[r] = _mm256_set1_ps(static_cast<float>(weights[r]));
-        }
-    }
-
-    uint64_t add_block(uint8_t* dst, int32_t x) const {
-        uint64_t near = 0;
-        for (int32_t i = 0; i < kBlock; i += kGroup) {
-            const __m256 low = add_pair(x + i);
-            const __m256 high = add_pair(x + i + 2);
-            _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + i * kPixel), pack(low, high));
-            const uint32_t some = find_uncertain(low, uncertain_) | find_uncertain(high, uncertain_)
-                                                                        << kVectorFloats;
-            near |= uint64_t{some} << (i * kPixel);
-        }
-        return near;
-    }
-
-private:
-    // Two pixels, 0.5 added. Below and above, results are 0 and 255 anyway, and so are these: far
-    // from others.
-    __m256 add_pair(int32_t x) const {
-        __m256 value = _mm256_set1_ps(0.5F);
-        for (int32_t r = 0; r < kTaps; ++r) {
-            value = _mm256_fmadd_ps(weights_[r], _mm256_load_ps(rows_[r] + x * kPixel), value);
-        }
-        value = _mm256_max_ps(value, _mm256_set1_ps(0.5F));
-        return _mm256_min_ps(value, _mm256_set1_ps(255.5F));
-    }
-
-    const float* rows_[kTaps];
-    __m256 weights_[kTaps];
-    __m256 uncertain_;
-};
-
 struct Avx2 {
-    using Sums = Avx2Sums;
+    using Vector = __m256;
+    using WeightedRows = WeightedRowsX86<Avx2>;
 
-    static void convert(float* floats, const uint8_t* bytes, int32_t count) {
-        for (int32_t i = 0; i < count - kVectorFloats; i += kVectorFloats) {
-            convert_vector(floats + i, bytes + i);
-        }
-        const int32_t last = count - kVectorFloats;
-        convert_vector(floats + last, bytes + last);
+    static constexpr int32_t kConverted = kVectorFloats;
+    static void convert(float* floats, const uint8_t* bytes) {
+        const __m128i eight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes));
+        _mm256_storeu_ps(floats, _mm256_cvtepi32_ps(_mm256_cvtepu8_epi32(eight)));
     }
 
-    static void sum_group(float* sums, const float* span, const LanczosStrip& strip, int32_t x,
+    static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,
                           int32_t first) {
         const auto pixel = [&](int32_t i) {
-            return weigh_taps(span + (strip.index[x + i] - first) * kPixel, strip.weights[x + i]);
+            return weigh_taps(span + (plan.index[x + i] - first) * kPixel, plan.weights[x + i]);
         };
         _mm256_store_ps(sums, add_halves(pixel(0), pixel(1)));
         _mm256_store_ps(sums + kVectorFloats, add_halves(pixel(2), pixel(3)));
     }
 
-    static void run_chains(const LanczosStrip& strip, const LanczosRow& row, const int32_t* columns,
-                           int32_t count) {
-        run_chains_of(strip, row, columns, count);
+    static Vector broadcast(float value) { return _mm256_set1_ps(value); }
+
+    static Vector multiply_add(Vector weight, const float* sums, Vector value) {
+        return _mm256_fmadd_ps(weight, _mm256_load_ps(sums), value);
+    }
+
+    static Vector clamp(Vector value, Vector min, Vector max) {
+        return _mm256_min_ps(_mm256_max_ps(value, min), max);
+    }
+
+    template <class Pixels>
+    static uint32_t store_group(uint8_t* dst, const Pixels& pixels, Vector uncertain) {
+        const Vector low = pixels(0);
+        const Vector high = pixels(2);
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), pack(low, high));
+        return find_uncertain(low, uncertain) | find_uncertain(high, uncertain) << kVectorFloats;
+    }
+
+    static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
+                           const int32_t* pixels, int32_t count) {
+        run_chains_x86(columns, row, pixels, count);
     }
 };
 
 }  // namespace
 
-const LanczosKernels lanczos_avx2 = {prepare, filter_row<Avx2>};
+FilterLanczos* plan_lanczos_avx2(LanczosStripPlan& plan, const LanczosColumns& columns) {
+    return plan_filter<Avx2>(plan, columns);
+}
 
 }  // namespace ovrin

@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
-// Lanczos rows with NEON; see lanczos_approximation.h for how the byte is decided.
+// Lanczos rows with NEON; see lanczos_approximation_inl.h for how the byte is decided.
 #include <arm_neon.h>
 #include <string.h>
 
-#include "kernels/lanczos_approximation.h"
+#include "kernels/lanczos_approximation_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
@@ -11,16 +11,6 @@ namespace ovrin {
 namespace {
 
 constexpr int32_t kVectorBytes = 16;
-
-void convert_vector(float* floats, const uint8_t* bytes) {
-    const uint8x16_t sixteen = vld1q_u8(bytes);
-    const uint16x8_t low = vmovl_u8(vget_low_u8(sixteen));
-    const uint16x8_t high = vmovl_high_u8(sixteen);
-    vst1q_f32(floats, vcvtq_f32_u32(vmovl_u16(vget_low_u16(low))));
-    vst1q_f32(floats + 4, vcvtq_f32_u32(vmovl_high_u16(low)));
-    vst1q_f32(floats + 8, vcvtq_f32_u32(vmovl_u16(vget_low_u16(high))));
-    vst1q_f32(floats + 12, vcvtq_f32_u32(vmovl_high_u16(high)));
-}
 
 // What follows goes through four pixels in step: processors that work in order would wait for each
 // sum to be ready before they add to it.
@@ -35,7 +25,7 @@ void add_tap(float32x4_t (&sums)[kGroup], const float* const (&taps)[kGroup],
     }
 }
 
-// Multiplies it.
+// Begins the sums with tap `kTap` of each pixel.
 template <int kTap>
 void weigh_tap(float32x4_t (&sums)[kGroup], const float* const (&taps)[kGroup],
                const float32x4_t (&weights)[kGroup]) {
@@ -45,7 +35,7 @@ void weigh_tap(float32x4_t (&sums)[kGroup], const float* const (&taps)[kGroup],
     }
 }
 
-// Adds row `kRow`, seven taps of which are weighed already, to each pixel.
+// Adds row `kRow`, whose taps are weighed already, to each pixel.
 template <int kRow>
 void add_row(float32x4_t (&values)[kGroup], const float* sums, float32x4_t weights) {
     for (int32_t k = 0; k < kGroup; ++k) {
@@ -60,13 +50,13 @@ uint8x16_t narrow(uint32x4_t a, uint32x4_t b, uint32x4_t c, uint32x4_t d) {
     return vuzp1q_u8(vreinterpretq_u8_u16(low), vreinterpretq_u8_u16(high));
 }
 
-// Seven rows of sums, to be weighed and added.
-class NeonSums {
+// The sums of all source rows, to be weighed and added.
+class NeonRows {
 public:
-    NeonSums(const float* const* rows, const double* weights, float uncertain)
+    NeonRows(const float* const* rows, const double* weights, float uncertain)
         : low_(vdupq_n_f32(0.0F)), high_(low_), uncertain_(vdupq_n_f32(uncertain)) {
-        float floats[kTaps + 1] = {};
-        for (int32_t r = 0; r < kTaps; ++r) {
+        float floats[kLanczosTaps + 1] = {};
+        for (int32_t r = 0; r < kLanczosTaps; ++r) {
             rows_[r] = rows[r];
             floats[r] = static_cast<float>(weights[r]);
         }
@@ -108,7 +98,7 @@ private:
         return vpmaxq_u32(vpmaxq_u32(near(0), near(1)), vpmaxq_u32(near(2), near(3)));
     }
 
-    const float* rows_[kTaps];
+    const float* rows_[kLanczosTaps];
     float32x4_t low_;
     float32x4_t high_;
     float32x4_t uncertain_;
@@ -140,16 +130,16 @@ struct Chain {
 };
 
 // Two pixels side by side, to hide the latency.
-void run_two_chains(const LanczosStrip& strip, const LanczosRow& row, int32_t a, int32_t b) {
-    const double* weights_a = strip.column_weights + int64_t{a} * kTaps;
-    const double* weights_b = strip.column_weights + int64_t{b} * kTaps;
+void run_two_chains(const LanczosColumns& columns, const LanczosRow& row, int32_t a, int32_t b) {
+    const double* weights_a = columns.weights + int64_t{a} * kLanczosTaps;
+    const double* weights_b = columns.weights + int64_t{b} * kLanczosTaps;
     Chain chain_a;
     Chain chain_b;
-    for (int32_t r = 0; r < kTaps; ++r) {
-        const double weight = row.row_weights[r];
-        const uint8_t* taps_a = row.taps[r] + int64_t{strip.index[a]} * kPixel;
-        const uint8_t* taps_b = row.taps[r] + int64_t{strip.index[b]} * kPixel;
-        for (int32_t i = 0; i < kTaps; ++i) {
+    for (int32_t r = 0; r < kLanczosTaps; ++r) {
+        const double weight = row.weights[r];
+        const uint8_t* taps_a = row.taps[r] + int64_t{columns.index[a]} * kPixel;
+        const uint8_t* taps_b = row.taps[r] + int64_t{columns.index[b]} * kPixel;
+        for (int32_t i = 0; i < kLanczosTaps; ++i) {
             chain_a.add(taps_a + i * kPixel, weight * weights_a[i]);
             chain_b.add(taps_b + i * kPixel, weight * weights_b[i]);
         }
@@ -159,21 +149,24 @@ void run_two_chains(const LanczosStrip& strip, const LanczosRow& row, int32_t a,
 }
 
 struct Neon {
-    using Sums = NeonSums;
+    using WeightedRows = NeonRows;
 
-    static void convert(float* floats, const uint8_t* bytes, int32_t count) {
-        for (int32_t i = 0; i < count - kVectorBytes; i += kVectorBytes) {
-            convert_vector(floats + i, bytes + i);
-        }
-        const int32_t last = count - kVectorBytes;
-        convert_vector(floats + last, bytes + last);
+    static constexpr int32_t kConverted = kVectorBytes;
+    static void convert(float* floats, const uint8_t* bytes) {
+        const uint8x16_t sixteen = vld1q_u8(bytes);
+        const uint16x8_t low = vmovl_u8(vget_low_u8(sixteen));
+        const uint16x8_t high = vmovl_high_u8(sixteen);
+        vst1q_f32(floats, vcvtq_f32_u32(vmovl_u16(vget_low_u16(low))));
+        vst1q_f32(floats + 4, vcvtq_f32_u32(vmovl_high_u16(low)));
+        vst1q_f32(floats + 8, vcvtq_f32_u32(vmovl_u16(vget_low_u16(high))));
+        vst1q_f32(floats + 12, vcvtq_f32_u32(vmovl_high_u16(high)));
     }
 
-    static void sum_group(float* sums, const float* span, const LanczosStrip& strip, int32_t x,
+    static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,
                           int32_t first) {
-        const auto tap = [&](int32_t k) { return span + (strip.index[x + k] - first) * kPixel; };
+        const auto tap = [&](int32_t k) { return span + (plan.index[x + k] - first) * kPixel; };
         const auto weights = [&](int32_t k, int32_t i) {
-            return vld1q_f32(strip.weights[x + k] + i);
+            return vld1q_f32(plan.weights[x + k] + i);
         };
         const float* const taps[kGroup] = {tap(0), tap(1), tap(2), tap(3)};
         const float32x4_t low[kGroup] = {weights(0, 0), weights(1, 0), weights(2, 0),
@@ -195,16 +188,18 @@ struct Neon {
     }
 
     // The last pixel may be computed twice.
-    static void run_chains(const LanczosStrip& strip, const LanczosRow& row, const int32_t* columns,
-                           int32_t count) {
+    static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
+                           const int32_t* pixels, int32_t count) {
         for (int32_t i = 0; i < count; i += 2) {
-            run_two_chains(strip, row, columns[i], columns[i + 1 < count ? i + 1 : i]);
+            run_two_chains(columns, row, pixels[i], pixels[i + 1 < count ? i + 1 : i]);
         }
     }
 };
 
 }  // namespace
 
-const LanczosKernels lanczos_neon = {prepare, filter_row<Neon>};
+FilterLanczos* plan_lanczos_neon(LanczosStripPlan& plan, const LanczosColumns& columns) {
+    return plan_filter<Neon>(plan, columns);
+}
 
 }  // namespace ovrin

@@ -1,19 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
-#include "kernels/lanczos_chain.h"
+#include "kernels/lanczos_chain_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
 
-namespace {
-
-void prepare(LanczosStrip& /*strip*/) {}
-
-void filter_row(LanczosStrip& strip, const LanczosRow& row) {
-    filter_by_chains(strip, row);
+FilterLanczos* plan_lanczos_scalar(LanczosStripPlan& plan, const LanczosColumns& columns) {
+    plan.columns = &columns;
+    return filter_by_chains;
 }
-
-}  // namespace
-
-const LanczosKernels lanczos_scalar = {prepare, filter_row};
 
 }  // namespace ovrin

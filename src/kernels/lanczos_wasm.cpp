@@ -1,9 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 // Lanczos rows for WebAssembly, with 128-bit vectors or, where those are missing, what the compiler
-// makes of them; see lanczos_approximation.h for how the byte is decided. Products are rounded
+// makes of them; see lanczos_approximation_inl.h for how the byte is decided. Products are rounded
 // before they are added. Seven of them and 0.5, added in pairs, go through fewer roundings all the
 // same than one after the other.
-#include "kernels/lanczos_approximation.h"
+#include "kernels/lanczos_approximation_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {
@@ -33,11 +33,11 @@ bool any(Ints mask) {
 }
 
 // Seven rows of sums, to be weighed and added.
-class WasmSums {
+class WasmRows {
 public:
-    WasmSums(const float* const* rows, const double* weights, float uncertain)
+    WasmRows(const float* const* rows, const double* weights, float uncertain)
         : uncertain_(uncertain) {
-        for (int32_t r = 0; r < kTaps; ++r) {
+        for (int32_t r = 0; r < kLanczosTaps; ++r) {
             rows_[r] = rows[r];
             weights_[r] = static_cast<float>(weights[r]);
         }
@@ -74,23 +74,24 @@ private:
         return (fraction < uncertain_) | (1.0F - fraction < uncertain_);
     }
 
-    const float* rows_[kTaps];
-    float weights_[kTaps];
+    const float* rows_[kLanczosTaps];
+    float weights_[kLanczosTaps];
     float uncertain_;
 };
 
 struct Wasm {
-    using Sums = WasmSums;
+    using WeightedRows = WasmRows;
 
-    static void convert(float* floats, const uint8_t* bytes, int32_t count) {
-        for (int32_t i = 0; i < count; ++i) floats[i] = bytes[i];
+    static constexpr int32_t kConverted = 16;
+    static void convert(float* floats, const uint8_t* bytes) {
+        for (int32_t i = 0; i < kConverted; ++i) floats[i] = bytes[i];
     }
 
-    static void sum_group(float* sums, const float* span, const LanczosStrip& strip, int32_t x,
+    static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,
                           int32_t first) {
         for (int32_t k = 0; k < kGroup; ++k) {
-            const float* const taps = span + (strip.index[x + k] - first) * kPixel;
-            const float* const weights = strip.weights[x + k];
+            const float* const taps = span + (plan.index[x + k] - first) * kPixel;
+            const float* const weights = plan.weights[x + k];
             const auto product = [&](int32_t i) { return load(taps + i * kPixel) * weights[i]; };
             const Floats sum = ((product(0) + product(1)) + (product(2) + product(3))) +
                                ((product(4) + product(5)) + product(6));
@@ -98,12 +99,12 @@ struct Wasm {
         }
     }
 
-    static void run_chains(const LanczosStrip& strip, const LanczosRow& row, const int32_t* columns,
-                           int32_t count) {
+    static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
+                           const int32_t* pixels, int32_t count) {
         for (int32_t i = 0; i < count; ++i) {
-            const int32_t x = columns[i];
-            const double* weights = strip.column_weights + int64_t{x} * kTaps;
-            const int64_t first = int64_t{strip.index[x]} * kPixel;
+            const int32_t x = pixels[i];
+            const double* weights = columns.weights + int64_t{x} * kLanczosTaps;
+            const int64_t first = int64_t{columns.index[x]} * kPixel;
             for (int32_t k = 0; k < kPixel; ++k) {
                 row.dst[x * kPixel + k] = rounded(sum_of_taps(row, weights, first + k, kPixel));
             }
@@ -113,6 +114,8 @@ struct Wasm {
 
 }  // namespace
 
-const LanczosKernels lanczos_wasm = {prepare, filter_row<Wasm>};
+FilterLanczos* plan_lanczos_wasm(LanczosStripPlan& plan, const LanczosColumns& columns) {
+    return plan_filter<Wasm>(plan, columns);
+}
 
 }  // namespace ovrin

@@ -8,33 +8,32 @@
 
 namespace ovrin {
 
-const Kernels scalar_kernels = {plan_quarters_scalar, bilinear_blend_scalar, bilinear_edges_scalar,
-                                bilinear_copy_scalar, &lanczos_scalar,       copy_every_scalar};
+const Kernels scalar_kernels = {plan_quarters_scalar, plan_bilinear_scalar,
+                                plan_bilinear_copy_scalar, plan_lanczos_scalar, copy_every_scalar};
 
 namespace {
 
 #if defined(__x86_64__)
-constexpr Kernels kAvx2Kernels = {plan_quarters_avx2, bilinear_blend_avx2, bilinear_edges_scalar,
-                                  bilinear_copy_avx2, &lanczos_avx2,       copy_every_avx2};
-constexpr Kernels kAvx512Kernels = {plan_quarters_avx512,  bilinear_blend_avx512,
-                                    bilinear_edges_scalar, bilinear_copy_avx512,
-                                    &lanczos_avx512,       copy_every_avx2};
+constexpr Kernels kAvx2Kernels = {plan_quarters_avx2, plan_bilinear_avx2, plan_bilinear_copy_avx2,
+                                  plan_lanczos_avx2, copy_every_avx2};
+constexpr Kernels kAvx512Kernels = {plan_quarters_avx512, plan_bilinear_avx512,
+                                    plan_bilinear_copy_avx512, plan_lanczos_avx512,
+                                    copy_every_avx2};
 #elif defined(__aarch64__)
-constexpr Kernels kNeonKernels = {plan_quarters_neon, bilinear_blend_neon, bilinear_edges_scalar,
-                                  bilinear_copy_neon, &lanczos_neon,       copy_every_neon};
+constexpr Kernels kNeonKernels = {plan_quarters_neon, plan_bilinear_neon, plan_bilinear_copy_neon,
+                                  plan_lanczos_neon, copy_every_neon};
 #elif defined(__wasm_simd128__)
 // The NEON kernels, in WebAssembly's instructions. Those have no fused multiply-add, and no loads
 // that part interleaved words.
-constexpr Kernels kSimd128Kernels = {plan_quarters_neon, bilinear_blend_neon, bilinear_edges_scalar,
-                                     bilinear_copy_neon, &lanczos_wasm,       copy_every_scalar};
+constexpr Kernels kSimd128Kernels = {plan_quarters_neon, plan_bilinear_neon,
+                                     plan_bilinear_copy_neon, plan_lanczos_wasm, copy_every_scalar};
 #elif defined(__wasm__)
-constexpr Kernels kWasmKernels = {plan_quarters_scalar,  bilinear_blend_scalar,
-                                  bilinear_edges_scalar, bilinear_copy_scalar,
-                                  &lanczos_wasm,         copy_every_scalar};
+constexpr Kernels kWasmKernels = {plan_quarters_scalar, plan_bilinear_scalar,
+                                  plan_bilinear_copy_scalar, plan_lanczos_wasm, copy_every_scalar};
 #endif
 
 const Kernels* best_kernels() {
-    NamedKernels sets[kMostSets];
+    NamedKernels sets[kMaxSets];
     int32_t best = available_kernels(sets) - 1;
 #if defined(OVRIN_KERNELS)
     // A build for tests of one set; it runs only where the processor has it.
@@ -64,7 +63,7 @@ void force_kernels(const Kernels& set) {
 }
 
 // In ascending order of speed.
-int32_t available_kernels(NamedKernels sets[kMostSets]) {
+int32_t available_kernels(NamedKernels sets[kMaxSets]) {
     int32_t count = 0;
     sets[count++] = {"scalar", &scalar_kernels};
 #if defined(__x86_64__)

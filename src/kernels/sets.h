@@ -10,22 +10,24 @@ PlanQuarters plan_quarters_scalar;
 PlanQuarters plan_quarters_avx2;
 PlanQuarters plan_quarters_avx512;
 PlanQuarters plan_quarters_neon;
+PlanSimpleQuarters plan_simple_quarters_avx2;
+PlanSimpleQuarters plan_simple_quarters_neon;
 
-extern const BilinearBlend bilinear_blend_scalar[3];
-extern const BilinearBlend bilinear_blend_avx2[3];
-extern const BilinearBlend bilinear_blend_avx512[3];
-extern const BilinearBlend bilinear_blend_neon[3];
-extern const BilinearEdges bilinear_edges_scalar[3];
-extern const BilinearCopy bilinear_copy_scalar[3];
-extern const BilinearCopy bilinear_copy_avx2[3];
-extern const BilinearCopy bilinear_copy_avx512[3];
-extern const BilinearCopy bilinear_copy_neon[3];
+PlanBilinear plan_bilinear_scalar;
+PlanBilinear plan_bilinear_avx2;
+PlanBilinear plan_bilinear_avx512;
+PlanBilinear plan_bilinear_neon;
 
-extern const LanczosKernels lanczos_scalar;
-extern const LanczosKernels lanczos_avx2;
-extern const LanczosKernels lanczos_avx512;
-extern const LanczosKernels lanczos_neon;
-extern const LanczosKernels lanczos_wasm;
+PlanBilinearCopy plan_bilinear_copy_scalar;
+PlanBilinearCopy plan_bilinear_copy_avx2;
+PlanBilinearCopy plan_bilinear_copy_avx512;
+PlanBilinearCopy plan_bilinear_copy_neon;
+
+PlanLanczos plan_lanczos_scalar;
+PlanLanczos plan_lanczos_avx2;
+PlanLanczos plan_lanczos_avx512;
+PlanLanczos plan_lanczos_neon;
+PlanLanczos plan_lanczos_wasm;
 
 CopyEvery copy_every_scalar;
 CopyEvery copy_every_avx2;

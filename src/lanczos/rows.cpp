@@ -3,11 +3,11 @@
 
 #include <string.h>
 
+#include "kernels/prefetch.h"
+
 namespace ovrin {
 
 namespace {
-
-constexpr int32_t kCacheLine = 64;
 
 int32_t clamped(int64_t row, int32_t rows) {
     if (row < 0) return 0;
@@ -17,7 +17,7 @@ int32_t clamped(int64_t row, int32_t rows) {
 // Columns lie at a running sum over the whole row.
 class ColumnPositions {
 public:
-    explicit ColumnPositions(const LanczosRows& picture)
+    explicit ColumnPositions(const LanczosPicture& picture)
         : step_(static_cast<double>(picture.src_w) / picture.dst_w), src_w_(picture.src_w) {}
 
     // Only rounding on absurdly wide rows could carry a position past the last column.
@@ -37,28 +37,28 @@ private:
 
 // Destination pixels with more components than the source's run past the last slot; they read zeros
 // there.
-LanczosCache::LanczosCache(const LanczosRows& picture)
+LanczosCache::LanczosCache(const LanczosPicture& picture)
     : pitch_((picture.src_w + ptrdiff_t{2} * kLanczosMargin) * picture.src_components),
       data_(static_cast<uint8_t*>(
           calloc(static_cast<size_t>(pitch_ + picture.dst_components), kLanczosTaps))) {
     narrow_to(picture, 0, picture.src_w + int64_t{2} * kLanczosMargin);
 }
 
-// Where taps run on into the slot behind theirs they need all of it.
-void LanczosCache::narrow_to(const LanczosRows& picture, int32_t first, int64_t end) {
+// Where taps run on into the slot after theirs they need all of it.
+void LanczosCache::narrow_to(const LanczosPicture& picture, int32_t first, int64_t end) {
     const bool whole = picture.src_components != picture.dst_components;
     first_ = whole ? 0 : first;
     end_ = whole ? picture.src_w + int64_t{2} * kLanczosMargin : end;
     for (int32_t& row : rows_) row = -1;
 }
 
-void LanczosCache::copy_row(const LanczosRows& picture, int32_t slot, int32_t row) {
+void LanczosCache::copy_row(const LanczosPicture& picture, int32_t slot, int32_t row) {
     const int64_t pixel = picture.src_components;
     const uint8_t* src = picture.src + row * picture.src_pitch;
     uint8_t* dst = data_ + slot * pitch_;
-    const int64_t behind = kLanczosMargin + int64_t{picture.src_w};
+    const int64_t row_end = kLanczosMargin + int64_t{picture.src_w};
     const int64_t first = first_ < kLanczosMargin ? kLanczosMargin : first_;
-    const int64_t end = end_ < behind ? end_ : behind;
+    const int64_t end = end_ < row_end ? end_ : row_end;
     if (first < end) {
         memcpy(dst + first * pixel, src + (first - kLanczosMargin) * pixel,
                static_cast<size_t>((end - first) * pixel));
@@ -67,17 +67,16 @@ void LanczosCache::copy_row(const LanczosRows& picture, int32_t slot, int32_t ro
         memcpy(dst + column * pixel, src + source_column * pixel, static_cast<size_t>(pixel));
     };
     for (int64_t i = first_; i < kLanczosMargin; ++i) repeat(i, 0);
-    for (int64_t i = behind; i < end_; ++i) repeat(i, picture.src_w - 1);
+    for (int64_t i = row_end; i < end_; ++i) repeat(i, picture.src_w - 1);
     rows_[slot] = row;
-    // The row below lies a whole row further on, where the processor does not look by itself.
     if (row + 1 == picture.src_h) return;
-    const uint8_t* next = src + picture.src_pitch + (first - kLanczosMargin) * pixel;
-    for (int64_t i = 0; i < (end - first) * pixel; i += kCacheLine) __builtin_prefetch(next + i);
+    prefetch(src + picture.src_pitch + (first - kLanczosMargin) * pixel, (end - first) * pixel);
 }
 
-// Rows that stay are not copied again: of seven rows in a row no two share a slot. Only where taps
-// run on into the slot behind theirs must slots lie in the order of the taps.
-void LanczosCache::load(const LanczosRows& picture, int64_t middle_row, LanczosRow& row) {
+// Rows that stay are not copied again: of as many neighbouring rows as there are taps no two share
+// a slot. Only where taps run on into the slot after theirs must slots lie in the order of the
+// taps.
+void LanczosCache::load(const LanczosPicture& picture, int64_t middle_row, LanczosRow& row) {
     const bool in_order = picture.src_components != picture.dst_components;
     for (int32_t k = 0; k < kLanczosTaps; ++k) {
         const int32_t source_row = clamped(middle_row - kLanczosMargin + k, picture.src_h);
@@ -89,28 +88,31 @@ void LanczosCache::load(const LanczosRows& picture, int64_t middle_row, LanczosR
 }
 
 // Strip by strip: what kernels keep of a strip and its source rows stays small.
-void filter_rows(const LanczosRows& picture, LanczosCache& cache, int32_t first, int32_t end) {
+void filter_rows(PlanLanczos* plan_lanczos, const LanczosPicture& picture, LanczosCache& cache,
+                 int32_t first, int32_t end) {
     const double row_step = static_cast<double>(picture.src_h) / picture.dst_h;
-    const LanczosKernels& kernel = *kernels().lanczos;
-    ColumnPositions columns(picture);
-    LanczosStrip strip;
-    strip.src_components = picture.src_components;
-    strip.dst_components = picture.dst_components;
-    for (int32_t x = 0; x < picture.dst_w; x += strip.count) {
+    ColumnPositions positions(picture);
+    LanczosColumns columns;
+    LanczosStripPlan plan;
+    LanczosSums sums;
+    columns.src_components = picture.src_components;
+    columns.dst_components = picture.dst_components;
+    for (int32_t x = 0; x < picture.dst_w; x += columns.count) {
         const int32_t left = picture.dst_w - x;
-        strip.count = left < kLanczosColumns ? left : kLanczosColumns;
-        strip.column_weights = picture.column_weights + int64_t{x} * kLanczosTaps;
-        for (int32_t i = 0; i < strip.count; ++i) strip.index[i] = columns.next();
-        kernel.prepare(strip);
-        cache.narrow_to(picture, strip.index[0],
-                        int64_t{strip.index[strip.count - 1]} + kLanczosTaps);
+        columns.count = left < kLanczosColumns ? left : kLanczosColumns;
+        columns.weights = picture.column_weights + int64_t{x} * kLanczosTaps;
+        for (int32_t i = 0; i < columns.count; ++i) columns.index[i] = positions.next();
+        FilterLanczos* filter = plan_lanczos(plan, columns);
+        sums.clear();
+        cache.narrow_to(picture, columns.index[0],
+                        int64_t{columns.index[columns.count - 1]} + kLanczosTaps);
         for (int32_t y = first; y < end; ++y) {
             LanczosRow row;
             cache.load(picture, static_cast<int64_t>(row_step * y), row);
             row.dst = picture.dst + ptrdiff_t{y - first} * picture.dst_pitch +
                       ptrdiff_t{x} * picture.dst_components;
-            row.row_weights = picture.row_weights + int64_t{y} * kLanczosTaps;
-            kernel.row(strip, row);
+            row.weights = picture.row_weights + int64_t{y} * kLanczosTaps;
+            filter(row, plan, sums);
         }
     }
 }

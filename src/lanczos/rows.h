@@ -5,12 +5,12 @@
 #include <stddef.h>
 #include <stdint.h>
 
-#include "kernels/kernels.h"
+#include "kernels/lanczos.h"
 #include "lanczos/weights.h"
 
 namespace ovrin {
 
-struct LanczosRows {
+struct LanczosPicture {
     const uint8_t* src;
     int32_t src_w;
     int32_t src_h;
@@ -25,11 +25,12 @@ struct LanczosRows {
     const double* row_weights;
 };
 
-// Seven source rows with their first and last pixels repeated three times on either side, or the
-// part of them that a strip of the picture needs. Pixels count from the first of the repeated ones.
+// The source rows of a destination row, with their first and last pixels repeated three times on
+// either side, or the part of them that a strip of the picture needs. Pixels count from the first
+// of the repeated ones.
 class LanczosCache {
 public:
-    explicit LanczosCache(const LanczosRows& picture);
+    explicit LanczosCache(const LanczosPicture& picture);
     ~LanczosCache() { free(data_); }
     LanczosCache(const LanczosCache&) = delete;
     LanczosCache& operator=(const LanczosCache&) = delete;
@@ -37,13 +38,13 @@ public:
     bool ready() const { return data_ != nullptr; }
 
     // From now on rows are wanted from pixel `first` to before pixel `end`.
-    void narrow_to(const LanczosRows& picture, int32_t first, int64_t end);
+    void narrow_to(const LanczosPicture& picture, int32_t first, int64_t end);
 
     // Points row.taps[k] to source row middle_row - 3 + k, or the nearest one that exists.
-    void load(const LanczosRows& picture, int64_t middle_row, LanczosRow& row);
+    void load(const LanczosPicture& picture, int64_t middle_row, LanczosRow& row);
 
 private:
-    void copy_row(const LanczosRows& picture, int32_t slot, int32_t row);
+    void copy_row(const LanczosPicture& picture, int32_t slot, int32_t row);
 
     ptrdiff_t pitch_;
     uint8_t* data_;
@@ -53,6 +54,7 @@ private:
 };
 
 // Computes destination rows [first, end).
-void filter_rows(const LanczosRows& picture, LanczosCache& cache, int32_t first, int32_t end);
+void filter_rows(PlanLanczos* plan_lanczos, const LanczosPicture& picture, LanczosCache& cache,
+                 int32_t first, int32_t end);
 
 }  // namespace ovrin

@@ -28,73 +28,75 @@ int32_t entry_of(double distance) {
     return step > last ? last : static_cast<int32_t>(step);
 }
 
-constexpr float kWanted = 1.0F;
-
 float* new_table() {
     return static_cast<float*>(malloc(kTableEntries * sizeof(float)));
 }
 
-// Computes the entries that are kWanted. Distances are a running sum: it drifts below the exact
+// Entries of the filter's table.
+struct Wanted {
+    bool entries[kTableEntries];
+};
+
+// Computes the entries that are wanted. Distances are a running sum: it drifts below the exact
 // multiples, so that entry 12000 lies just short of 3 and is not 0.
-void fill_wanted(float* table) {
+void fill_table(float* table, const Wanted& wanted) {
     double x = 0.0;
     for (int32_t i = 0; i < kTableEntries; ++i, x += kStep) {
-        if (table[i] == kWanted) table[i] = static_cast<float>(kernel(x));
+        table[i] = wanted.entries[i] ? static_cast<float>(kernel(x)) : 0.0F;
     }
-}
-
-// Marks the table's entries for samples c - 3 ... c + 3 around a position with fraction `fraction`,
-// and notes them in place of the weights. A scale below 1 stretches the kernel over the samples.
-void want_taps(double* weights, float* table, double fraction, float scale) {
-    for (int32_t j = 0; j < kLanczosTaps; ++j) {
-        double distance = fraction + (kLanczosMargin - j);
-        if (scale < 1.0F) distance *= static_cast<double>(scale);
-        const int32_t entry = entry_of(distance);
-        table[entry] = kWanted;
-        weights[j] = entry;
-    }
-}
-
-void fill_taps(double* weights, const float* table) {
-    for (int32_t j = 0; j < kLanczosTaps; ++j) {
-        weights[j] = static_cast<double>(table[static_cast<int32_t>(weights[j])]);
-    }
-    // From the smallest distance up: the order is part of the result.
-    double sum = weights[kLanczosTaps - 1];
-    for (int32_t j = kLanczosTaps - 2; j >= 0; --j) sum += weights[j];
-    for (int32_t j = 0; j < kLanczosTaps; ++j) weights[j] /= sum;
 }
 
 double fraction_of(double position) {
     return position - static_cast<double>(static_cast<int32_t>(position));
 }
 
-float scale_of(int32_t src, int32_t dst) {
-    return static_cast<float>(dst) / static_cast<float>(src);
+// An axis of the picture. Columns lie at a running sum of source / destination, rows at a multiple
+// of it: the two round differently.
+enum class Positions { kRunningSum, kMultiple };
+struct Axis {
+    int32_t source;
+    int32_t destination;
+    Positions positions;
+};
+
+// Calls function(sample, entries of the table for its taps) for the samples of an axis. The taps
+// lie around a position, from three before its whole part to three after it. A reduction stretches
+// the filter over the samples.
+template <class Function>
+void for_each_sample(const Axis& axis, const Function& function) {
+    const double step = static_cast<double>(axis.source) / axis.destination;
+    const float scale = static_cast<float>(axis.destination) / static_cast<float>(axis.source);
+    double sum = 0.0;
+    for (int32_t i = 0; i < axis.destination; ++i, sum += step) {
+        const double position = axis.positions == Positions::kRunningSum ? sum : step * i;
+        int32_t entries[kLanczosTaps];
+        for (int32_t j = 0; j < kLanczosTaps; ++j) {
+            double distance = fraction_of(position) + (kLanczosMargin - j);
+            if (scale < 1.0F) distance *= static_cast<double>(scale);
+            entries[j] = entry_of(distance);
+        }
+        function(i, entries);
+    }
+}
+
+void want_entries(Wanted& wanted, const Axis& axis) {
+    for_each_sample(axis, [&](int32_t, const int32_t(&entries)[kLanczosTaps]) {
+        for (const int32_t entry : entries) wanted.entries[entry] = true;
+    });
+}
+
+void fill_weights(LanczosWeights& weights, const Axis& axis, const float* table) {
+    for_each_sample(axis, [&](int32_t sample, const int32_t(&entries)[kLanczosTaps]) {
+        double* taps = weights.of_sample(sample);
+        for (int32_t j = 0; j < kLanczosTaps; ++j) taps[j] = static_cast<double>(table[entries[j]]);
+        // From the last one down: the order is part of the result.
+        double sum = taps[kLanczosTaps - 1];
+        for (int32_t j = kLanczosTaps - 2; j >= 0; --j) sum += taps[j];
+        for (int32_t j = 0; j < kLanczosTaps; ++j) taps[j] /= sum;
+    });
 }
 
 }  // namespace
-
-void LanczosWeights::want_columns(float* table, int32_t src_w) {
-    const double step = static_cast<double>(src_w) / count_;
-    double position = 0.0;
-    for (int32_t x = 0; x < count_; ++x, position += step) {
-        want_taps(data_ + int64_t{x} * kLanczosTaps, table, fraction_of(position),
-                  scale_of(src_w, count_));
-    }
-}
-
-void LanczosWeights::want_rows(float* table, int32_t src_h) {
-    const double step = static_cast<double>(src_h) / count_;
-    for (int32_t y = 0; y < count_; ++y) {
-        want_taps(data_ + int64_t{y} * kLanczosTaps, table, fraction_of(step * y),
-                  scale_of(src_h, count_));
-    }
-}
-
-void LanczosWeights::fill(const float* table) {
-    for (int32_t i = 0; i < count_; ++i) fill_taps(data_ + int64_t{i} * kLanczosTaps, table);
-}
 
 LanczosPlan::LanczosPlan(int32_t dst_w, int32_t dst_h)
     : columns(dst_w), rows(dst_h), table(new_table()) {}
@@ -107,15 +109,16 @@ bool LanczosPlan::ready() const {
     return columns.data() != nullptr && rows.data() != nullptr && table != nullptr;
 }
 
-// A sine takes longer than to find out that nobody wants it: most ratios use a small part of the
-// table.
+// Most ratios use a small part of the table, and sines take long.
 void LanczosPlan::fill(int32_t src_w, int32_t src_h) {
-    for (int32_t i = 0; i < kTableEntries; ++i) table[i] = 0.0F;
-    columns.want_columns(table, src_w);
-    rows.want_rows(table, src_h);
-    fill_wanted(table);
-    columns.fill(table);
-    rows.fill(table);
+    const Axis across = {src_w, columns.count(), Positions::kRunningSum};
+    const Axis down = {src_h, rows.count(), Positions::kMultiple};
+    Wanted wanted = {};
+    want_entries(wanted, across);
+    want_entries(wanted, down);
+    fill_table(table, wanted);
+    fill_weights(columns, across, table);
+    fill_weights(rows, down, table);
 }
 
 }  // namespace ovrin
@@ -123,7 +126,8 @@ void LanczosPlan::fill(int32_t src_w, int32_t src_h) {
 float* create_lanczos_lookup(void) {
     float* table = ovrin::new_table();
     if (table == nullptr) return nullptr;
-    for (int32_t i = 0; i < ovrin::kTableEntries; ++i) table[i] = ovrin::kWanted;
-    ovrin::fill_wanted(table);
+    ovrin::Wanted all;
+    for (bool& entry : all.entries) entry = true;
+    ovrin::fill_table(table, all);
     return table;
 }

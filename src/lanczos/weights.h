@@ -4,12 +4,14 @@
 #include <stdint.h>
 #include <stdlib.h>
 
+#include "kernels/lanczos.h"
+
 namespace ovrin {
 
-constexpr int32_t kLanczosTaps = 7;
 constexpr int32_t kLanczosMargin = 3;  // taps on either side of the middle one
 
-// Seven weights for each sample of a destination axis. Null data when there was no memory.
+// For each sample of a destination axis, the weights of its taps. Null data when there was no
+// memory.
 class LanczosWeights {
 public:
     explicit LanczosWeights(int32_t count)
@@ -20,14 +22,9 @@ public:
     LanczosWeights(const LanczosWeights&) = delete;
     LanczosWeights& operator=(const LanczosWeights&) = delete;
 
+    int32_t count() const { return count_; }
     const double* data() const { return data_; }
-
-    // First what an axis wants of the kernel's table, then, when that is filled, the weights.
-    // Columns lie at a running sum of src / dst, rows at a multiple of it: the two round
-    // differently.
-    void want_columns(float* table, int32_t src_w);
-    void want_rows(float* table, int32_t src_h);
-    void fill(const float* table);
+    double* of_sample(int32_t i) { return data_ + int64_t{i} * kLanczosTaps; }
 
 private:
     int32_t count_;
@@ -46,7 +43,7 @@ struct LanczosPlan {
 
     LanczosWeights columns;
     LanczosWeights rows;
-    float* table;  // the kernel's, where it is wanted
+    float* table;  // the filter's, where it is wanted; 0 elsewhere
 };
 
 }  // namespace ovrin

@@ -5,10 +5,9 @@
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
 
-#include <algorithm>
-
 #include "reference/bands.h"
 #include "reference/keep_ratio_rgba.h"
+#include "support/band_walk.h"
 #include "support/bands.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
@@ -61,23 +60,9 @@ struct RgbaBand {
           dst(small_words(random,
                           static_cast<size_t>((s.dst_h - 1) * (x + s.dst_w + skip) + x + s.dst_w)),
               flush),
-          band(marked_record<ovrin_rgba_band>()) {
-        band.start_row = band.row_acc = band.src_offset = 0;
-        band.di_11 = band.di_13 = band.di_31 = band.di_33 = 0;
-        band.src_w = s.src_w;
-        band.src_h = s.src_h;
-        band.src_stride = stride;
-        band.dst_w = s.dst_w;
-        band.dst_h = s.dst_h;
-        band.dst_x = x;
-        band.dst_skip = skip;
-        band.band_rows = band_rows;
+          band(walk_to(marked_record<ovrin_rgba_band>(), s, band_rows, stride, x, skip, index)) {
         band.src = src.first();
         band.dst = dst.data();
-        for (int32_t i = 0; i < index; ++i) {
-            reference::rgba8888_get_pos_keep_ratio(s.src_h, s.dst_h, x + s.dst_w + skip, band);
-        }
-        band.rows_to_do = std::min(band_rows, s.src_h - band.start_row);
     }
 };
 
@@ -105,62 +90,10 @@ bool fits_grid(const Sizes& s) {
     return s.dst_w % 4 == 0 && s.dst_h % 4 == 0;
 }
 
-ovrin_yuv_band* chroma_reset(ovrin_yuv_band& band) {
-    band.uv_start_row = band.uv_row_base = band.src_uv_offset = 0;
-    band.uv_top_left = band.uv_top_right = band.uv_bottom_left = band.uv_bottom_right = 0;
-    return &band;
-}
-ovrin_nv21_band* chroma_reset(ovrin_nv21_band& band) {
-    band.vu_start_row = band.vu_row_base = band.src_vu_offset = 0;
-    band.vu_top_left = band.vu_top_right = band.vu_bottom_left = band.vu_bottom_right = 0;
-    return &band;
-}
-
-void replay_walk(const Sizes& s, ovrin_yuv_band& band) {
-    reference::yuv420_get_pos(s.src_h, s.dst_w, s.dst_h, band);
-}
-void replay_walk(const Sizes& s, ovrin_nv21_band& band) {
-    reference::nv21_get_pos(s.src_w, s.src_h, s.dst_w, s.dst_h, band);
-}
-
-int32_t& chroma_rows(ovrin_yuv_band& band) {
-    return band.uv_rows;
-}
-int32_t& chroma_rows(ovrin_nv21_band& band) {
-    return band.vu_rows;
-}
-int32_t& chroma_start(ovrin_yuv_band& band) {
-    return band.uv_start_row;
-}
-int32_t& chroma_start(ovrin_nv21_band& band) {
-    return band.vu_start_row;
-}
-
-// The record of a band, walked to by the replayed walkers, given the rows that a driver gives it:
-// the last band takes what is left. Pointers are null.
+// The record of band `index` of a picture in planes, with marks where a task should not look.
 template <class Band>
-Band walk_to(const Sizes& s, int32_t band_rows, int32_t stride, int32_t index) {
-    auto band = marked_record<Band>();
-    band.y_start_row = band.y_row_base = band.src_y_offset = 0;
-    band.y_top_left = band.y_top_right = band.y_bottom_left = band.y_bottom_right = 0;
-    chroma_reset(band);
-    band.src_width = s.src_w;
-    band.src_height = s.src_h;
-    band.src_row_bytes = stride;
-    band.dst_width = s.dst_w;
-    band.dst_height = s.dst_h;
-    band.band_rows = band_rows;
-    for (int32_t i = 0; i < index; ++i) replay_walk(s, band);
-    Band next = band;
-    replay_walk(s, next);
-    band.y_rows = next.y_rows;
-    chroma_rows(band) = chroma_rows(next);
-    if (band.y_start_row + band_rows >= s.src_h) {
-        band.y_rows = s.src_h - band.y_start_row;
-        const int32_t rows = (s.src_h + 1) >> 1;
-        if (rows > chroma_start(band)) chroma_rows(band) = rows - chroma_start(band);
-    }
-    return band;
+Band marked_band(const Sizes& s, int32_t band_rows, int32_t stride, int32_t index) {
+    return walk_to(marked_record<Band>(), s, band_rows, stride, index);
 }
 
 // Runs the task; `target` is the buffer that it must add into, `expected` what that must hold.
@@ -189,11 +122,11 @@ void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t ind
     };
     {
         SCOPED_TRACE("three planes");
-        const PlanarPicture src(random, s.src_w, s.src_h, stride, flush);
-        auto band = walk_to<ovrin_yuv_band>(s, band_rows, stride, index);
+        const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, stride, flush);
+        auto band = marked_band<ovrin_yuv_band>(s, band_rows, stride, index);
         band.src = src.view.y;
-        band.src_u = src.view.u;
-        band.src_v = src.view.v;
+        band.src_u = src.view.chroma[0];
+        band.src_v = src.view.chroma[1];
         aim(band);
         std::vector<uint8_t> expected = before;
         reference::resize_y_u_v_tp(band, expected.data());
@@ -207,7 +140,7 @@ void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t ind
     {
         SCOPED_TRACE("I420");
         const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_i420(s.src_w, s.src_h)), flush);
-        auto band = walk_to<ovrin_yuv_band>(s, band_rows, s.src_w, index);
+        auto band = marked_band<ovrin_yuv_band>(s, band_rows, s.src_w, index);
         band.src = src.data();
         band.src_row_bytes = -5;  // the picture is packed
         aim(band);
@@ -219,12 +152,12 @@ void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t ind
     }
     {
         SCOPED_TRACE("Y and VU");
-        const SemiPlanarPicture src(random, s.src_w, s.src_h, stride, flush);
+        const Yuv420Picture src(reference::kNv21, random, s.src_w, s.src_h, stride, flush);
         // The stretch to the end of the plane is walked in packed rows, so that a band after it
         // starts beyond the plane and reads no chroma.
-        auto band = walk_to<ovrin_nv21_band>(s, band_rows, stride, index);
+        auto band = marked_band<ovrin_nv21_band>(s, band_rows, stride, index);
         band.src = src.view.y;
-        band.src_vu = src.view.vu;
+        band.src_vu = src.view.chroma[0];
         aim(band);
         std::vector<uint8_t> expected = before;
         reference::resize_y_nv21_tp(band, expected.data());
@@ -237,7 +170,7 @@ void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t ind
     {
         SCOPED_TRACE("NV21");
         const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_nv21(s.src_w, s.src_h)), flush);
-        auto band = walk_to<ovrin_nv21_band>(s, band_rows, s.src_w, index);
+        auto band = marked_band<ovrin_nv21_band>(s, band_rows, s.src_w, index);
         band.src = src.data();
         band.src_row_bytes = -5;
         aim(band);
@@ -251,7 +184,7 @@ void check_planes(Random& random, const Sizes& s, int32_t band_rows, int32_t ind
 
 template <class Band>
 Band whole_picture(const Sizes& s) {
-    return walk_to<Band>(s, s.src_h, s.src_w, 0);
+    return marked_band<Band>(s, s.src_h, s.src_w, 0);
 }
 
 }  // namespace
@@ -327,11 +260,11 @@ TEST(BandTasks, AllBandsTogetherGiveTheWholePicture) {
         std::vector<uint8_t> i420_out(grid_bytes(s)), nv21_out(grid_bytes(s));
         std::vector<uint32_t> rgba_out(static_cast<size_t>(s.dst_w * s.dst_h));
         for (int32_t index = 0; index * rows < s.src_h; ++index) {
-            auto yuv_band = walk_to<ovrin_yuv_band>(s, rows, s.src_w, index);
+            auto yuv_band = marked_band<ovrin_yuv_band>(s, rows, s.src_w, index);
             yuv_band.src = i420.data();
             yuv_band.dst = i420_out.data();
             _resize_yuv420_tp(&yuv_band);
-            auto nv21_band = walk_to<ovrin_nv21_band>(s, rows, s.src_w, index);
+            auto nv21_band = marked_band<ovrin_nv21_band>(s, rows, s.src_w, index);
             nv21_band.src = nv21.data();
             nv21_band.dst = nv21_out.data();
             _resize_nv21_tp(&nv21_band);
@@ -341,11 +274,13 @@ TEST(BandTasks, AllBandsTogetherGiveTheWholePicture) {
             _resize_rgba8888_tp(&made.band);
         }
         ASSERT_EQ(i420_out,
-                  reference::resize_yuv(reference::i420_source(i420.data(), s.src_w, s.src_h),
-                                        s.dst_w, s.dst_h));
+                  reference::resize_yuv420(
+                      reference::contiguous(reference::kI420, i420.data(), s.src_w, s.src_h),
+                      s.dst_w, s.dst_h));
         ASSERT_EQ(nv21_out,
-                  reference::resize_nv21(reference::nv21_source(nv21.data(), s.src_w, s.src_h),
-                                         s.dst_w, s.dst_h));
+                  reference::resize_yuv420(
+                      reference::contiguous(reference::kNv21, nv21.data(), s.src_w, s.src_h),
+                      s.dst_w, s.dst_h));
         const auto packed =
             reference::quarter_packed(rgba.data(), s.src_w, s.src_h, s.dst_w, s.dst_h, 4);
         ASSERT_TRUE(same_bytes(reinterpret_cast<const uint8_t*>(rgba_out.data()), packed.data(),
@@ -358,12 +293,12 @@ TEST(BandTasks, SamplesGoWhereTheIndicesSay) {
     Random random(114);
     SCOPED_TRACE(random.trace());
     const Sizes s = {30, 20, 16, 12};
-    const PlanarPicture src(random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, s.src_w);
     for (const int32_t index : {0, 1}) {
-        auto band = walk_to<ovrin_yuv_band>(s, 10, s.src_w, index);
+        auto band = marked_band<ovrin_yuv_band>(s, 10, s.src_w, index);
         band.src = src.view.y;
-        band.src_u = src.view.u;
-        band.src_v = src.view.v;
+        band.src_u = src.view.chroma[0];
+        band.src_v = src.view.chroma[1];
         band.uv_rows = 0;
         for (int32_t ovrin_yuv_band::*to :
              {&ovrin_yuv_band::y_top_left, &ovrin_yuv_band::y_top_right,
@@ -447,11 +382,11 @@ TEST(BandTasks, WithoutTheWorkBufferTheyNeedOnlyDoneIsSet) {
         GuardedBuffer<uint8_t> dst(small_bytes(random, 96));
         const std::vector<uint8_t> before = dst.copy();
         const auto i420 = random.bytes(bytes_of_i420(9, 21));
-        const auto planes = reference::i420_source(i420.data(), 9, 21);
+        const auto planes = reference::contiguous(reference::kI420, i420.data(), 9, 21);
         auto yuv = whole_picture<ovrin_yuv_band>(s);
         yuv.src = i420.data();
-        yuv.src_u = planes.u;
-        yuv.src_v = planes.v;
+        yuv.src_u = planes.chroma[0];
+        yuv.src_v = planes.chroma[1];
         yuv.dst = dst.data();
         run_task(_resize_y_u_v_tp, yuv, dst, before);
         run_task(_resize_yuv420_tp, yuv, dst, before);
@@ -470,14 +405,14 @@ TEST(BandTasks, LumaAndChromaRowsAreIndependent) {
     Random random(117);
     SCOPED_TRACE(random.trace());
     const Sizes s = {21, 40, 12, 16};
-    const PlanarPicture src(random, s.src_w, s.src_h, s.src_w);
-    const SemiPlanarPicture pairs(random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture pairs(reference::kNv21, random, s.src_w, s.src_h, s.src_w);
     for (const auto& [y_rows, chroma] : {std::pair{0, 20}, {40, 0}, {13, 20}, {40, 7}}) {
         GuardedBuffer<uint8_t> target(small_bytes(random, grid_bytes(s)));
         auto yuv = whole_picture<ovrin_yuv_band>(s);
         yuv.src = src.view.y;
-        yuv.src_u = src.view.u;
-        yuv.src_v = src.view.v;
+        yuv.src_u = src.view.chroma[0];
+        yuv.src_v = src.view.chroma[1];
         yuv.dst = target.data();
         yuv.y_rows = y_rows;
         yuv.uv_rows = chroma;
@@ -486,7 +421,7 @@ TEST(BandTasks, LumaAndChromaRowsAreIndependent) {
         run_task(_resize_y_u_v_tp, yuv, target, expected);
         auto nv21 = whole_picture<ovrin_nv21_band>(s);
         nv21.src = pairs.view.y;
-        nv21.src_vu = pairs.view.vu;
+        nv21.src_vu = pairs.view.chroma[0];
         nv21.dst = target.data();
         nv21.y_rows = y_rows;
         nv21.vu_rows = chroma;

@@ -15,39 +15,28 @@ using namespace ovrin_test;
 namespace {
 
 // A record before its first band. Only what a walker reads is set; the rest, the points and the
-// record's own sizes included, hold marks.
+// record's own sizes included, hold marks. Offsets move on from any value.
 ovrin_rgba_band first_rgba(int32_t band_rows, int32_t stride) {
     auto band = marked_record<ovrin_rgba_band>();
-    band.start_row = band.row_acc = 0;
-    band.di_11 = band.di_13 = band.di_31 = band.di_33 = 0;
+    reference::start_at_the_top(band);
+    band.src_offset = -7001;
     band.band_rows = band_rows;
     band.src_stride = stride;
     return band;
 }
 
 template <class Band>
-Band first_luma(int32_t band_rows, int32_t src_row_bytes) {
+Band first_of_planes(int32_t band_rows, int32_t src_row_bytes) {
     auto band = marked_record<Band>();
-    band.y_start_row = band.y_row_base = 0;
-    band.y_top_left = band.y_top_right = band.y_bottom_left = band.y_bottom_right = 0;
+    reference::start_at_the_top(band);
+    band.src_y_offset = -7001;
+    band.*reference::kChromaFields<Band>.src_offset = -9001;
     band.band_rows = band_rows;
     band.src_row_bytes = src_row_bytes;
     return band;
 }
-
-ovrin_yuv_band first_yuv(int32_t band_rows, int32_t src_row_bytes) {
-    auto band = first_luma<ovrin_yuv_band>(band_rows, src_row_bytes);
-    band.uv_start_row = band.uv_row_base = 0;
-    band.uv_top_left = band.uv_top_right = band.uv_bottom_left = band.uv_bottom_right = 0;
-    return band;
-}
-
-ovrin_nv21_band first_nv21(int32_t band_rows, int32_t src_row_bytes) {
-    auto band = first_luma<ovrin_nv21_band>(band_rows, src_row_bytes);
-    band.vu_start_row = band.vu_row_base = 0;
-    band.vu_top_left = band.vu_top_right = band.vu_bottom_left = band.vu_bottom_right = 0;
-    return band;
-}
+constexpr auto first_yuv = first_of_planes<ovrin_yuv_band>;
+constexpr auto first_nv21 = first_of_planes<ovrin_nv21_band>;
 
 // Walks the library's record and the replayed one side by side, past the end of the picture.
 template <class Band, class Walk, class Replay>
@@ -186,20 +175,16 @@ TEST(BandWalkers, IndicesAreTakenFromTheRecord) {
         const auto next = [&] { return together ? start : start += random.between(1, 9); };
         auto yuv = first_yuv(w.band_rows, w.stride);
         auto nv21 = first_nv21(w.band_rows, w.stride);
-        for (int32_t ovrin_yuv_band::*index :
-             {&ovrin_yuv_band::y_top_left, &ovrin_yuv_band::y_top_right,
-              &ovrin_yuv_band::y_bottom_left, &ovrin_yuv_band::y_bottom_right,
-              &ovrin_yuv_band::uv_top_left, &ovrin_yuv_band::uv_top_right,
-              &ovrin_yuv_band::uv_bottom_left, &ovrin_yuv_band::uv_bottom_right}) {
-            yuv.*index = next();
-        }
-        for (int32_t ovrin_nv21_band::*index :
-             {&ovrin_nv21_band::y_top_left, &ovrin_nv21_band::y_top_right,
-              &ovrin_nv21_band::y_bottom_left, &ovrin_nv21_band::y_bottom_right,
-              &ovrin_nv21_band::vu_top_left, &ovrin_nv21_band::vu_top_right,
-              &ovrin_nv21_band::vu_bottom_left, &ovrin_nv21_band::vu_bottom_right}) {
-            nv21.*index = next();
-        }
+        const auto move_indices = [&](auto& band, const auto& plane) {
+            for (const auto index :
+                 {plane.top_left, plane.top_right, plane.bottom_left, plane.bottom_right}) {
+                band.*index = next();
+            }
+        };
+        move_indices(yuv, reference::kLumaFields<ovrin_yuv_band>);
+        move_indices(yuv, reference::kChromaFields<ovrin_yuv_band>);
+        move_indices(nv21, reference::kLumaFields<ovrin_nv21_band>);
+        move_indices(nv21, reference::kChromaFields<ovrin_nv21_band>);
         chain_yuv(w.sizes, yuv);
         chain_nv21(w.sizes, nv21);
     }
@@ -300,7 +285,8 @@ TEST(BandWalkers, AChromaBandIsLengthenedDifferently) {
     ovrin_resize_nv21_get_pos(64, 1024, 64, 320, &nv21);
     const auto clean = [](int32_t rows) {
         ovrin_yuv_band band = first_yuv(0, 64);
-        reference::Walk walk = reference::start_chroma(band, 1024);
+        reference::Walk walk =
+            reference::start_walk(band, reference::kChromaFields<ovrin_yuv_band>, 512);
         for (int32_t row = 0; row < rows; ++row) reference::pass_row(walk, {512, 160, 32});
         return walk.clean();
     };

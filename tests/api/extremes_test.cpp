@@ -18,8 +18,8 @@ constexpr int32_t kEmpty[] = {INT32_MIN, INT32_MIN + 1, -2000, -1, 0};
 void letterbox_all_ways(ovrin_resize_target target, int32_t src_h, Random& random) {
     SCOPED_TRACE(describe(target, 8, src_h));
     const GuardedPlane rgba(random, 8 * 4, src_h, 8 * 4);
-    const PlanarPicture planes(random, 8, src_h, 8);
-    const SemiPlanarPicture pairs(random, 8, src_h, 8);
+    const Yuv420Picture planes(reference::kI420, random, 8, src_h, 8);
+    const Yuv420Picture pairs(reference::kNv21, random, 8, src_h, 8);
     target.src_stride = target.src_width = 8;
     target.src_height = src_h;
     GuardedBuffer<uint32_t> words(64);
@@ -36,10 +36,11 @@ void letterbox_all_ways(ovrin_resize_target target, int32_t src_h, Random& rando
     for (uint8_t* canvas : {bytes.data(), bytes_at_start.data()}) {
         target.dst = canvas;
         for (auto* resize : {ovrin_resize_y_u_v_sg, ovrin_resize_y_u_v_tps}) {
-            resize(planes.view.y, planes.view.u, planes.view.v, nullptr, 8, src_h, 0, 0, &target);
+            resize(planes.view.y, planes.view.chroma[0], planes.view.chroma[1], nullptr, 8, src_h,
+                   0, 0, &target);
         }
         for (auto* resize : {ovrin_resize_y_nv_sg, ovrin_resize_y_nv_tps}) {
-            resize(pairs.view.y, pairs.view.vu, nullptr, 8, src_h, 0, 0, &target);
+            resize(pairs.view.y, pairs.view.chroma[0], nullptr, 8, src_h, 0, 0, &target);
         }
     }
     EXPECT_TRUE(words.intact() && bytes.intact());

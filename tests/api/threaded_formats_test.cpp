@@ -6,8 +6,7 @@
 #include <algorithm>
 
 #include "reference/keep_ratio_rgba.h"
-#include "reference/nv21.h"
-#include "reference/yuv.h"
+#include "reference/yuv420.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
 #include "support/letterbox.h"
@@ -96,8 +95,8 @@ void check_keep_ratio_rgba(const Sizes& s, Random& random) {
 void check_yuv420(const Sizes& s, Random& random) {
     const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_i420(s.src_w, s.src_h)));
     Results results(bytes_of_i420(s.dst_w, s.dst_h));
-    results.expected = reference::resize_yuv(reference::i420_source(src.data(), s.src_w, s.src_h),
-                                             s.dst_w, s.dst_h);
+    results.expected = reference::resize_yuv420(
+        reference::contiguous(reference::kI420, src.data(), s.src_w, s.src_h), s.dst_w, s.dst_h);
     ovrin_resize_yuv420_sg(src.data(), results.single.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     ovrin_resize_yuv420_tps(src.data(), results.threaded.data(), s.src_w, s.src_h, s.dst_w,
                             s.dst_h);
@@ -105,13 +104,13 @@ void check_yuv420(const Sizes& s, Random& random) {
 }
 
 void check_y_u_v(const Sizes& s, Random& random) {
-    const PlanarPicture src(random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, s.src_w);
     Results results(bytes_of_i420(s.dst_w, s.dst_h));
-    results.expected = reference::resize_yuv(src.view, s.dst_w, s.dst_h);
-    ovrin_resize_y_u_v_sg(src.view.y, src.view.u, src.view.v, results.single.data(), s.src_w,
-                          s.src_h, s.dst_w, s.dst_h, nullptr);
-    ovrin_resize_y_u_v_tps(src.view.y, src.view.u, src.view.v, results.threaded.data(), s.src_w,
-                           s.src_h, s.dst_w, s.dst_h, nullptr);
+    results.expected = reference::resize_yuv420(src.view, s.dst_w, s.dst_h);
+    ovrin_resize_y_u_v_sg(src.view.y, src.view.chroma[0], src.view.chroma[1], results.single.data(),
+                          s.src_w, s.src_h, s.dst_w, s.dst_h, nullptr);
+    ovrin_resize_y_u_v_tps(src.view.y, src.view.chroma[0], src.view.chroma[1],
+                           results.threaded.data(), s.src_w, s.src_h, s.dst_w, s.dst_h, nullptr);
     ASSERT_TRUE(results.agree());
 }
 
@@ -119,36 +118,36 @@ void check_y_u_v_keep_ratio(const Sizes& s, Random& random) {
     ovrin_resize_target target = around(random, s, 0);
     target.src_stride = random_stride(random, s.src_w);
     SCOPED_TRACE(describe(target, s.src_w, s.src_h));
-    const PlanarPicture src(random, s.src_w, s.src_h, target.src_stride);
+    const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, target.src_stride);
     Results results(bytes_of_i420(target.canvas_width, target.canvas_height));
     results.expected.resize(results.single.size());
-    reference::keep_ratio_yuv_tps(src.view, target, results.expected);
+    reference::keep_ratio_yuv420_tps(src.view, target, results.expected);
     target.dst = results.single.data();
-    ovrin_resize_y_u_v_sg(src.view.y, src.view.u, src.view.v, nullptr, s.src_w, s.src_h, 0, 0,
-                          &target);
+    ovrin_resize_y_u_v_sg(src.view.y, src.view.chroma[0], src.view.chroma[1], nullptr, s.src_w,
+                          s.src_h, 0, 0, &target);
     target.dst = results.threaded.data();
-    ovrin_resize_y_u_v_tps(src.view.y, src.view.u, src.view.v, nullptr, s.src_w, s.src_h, 0, 0,
-                           &target);
+    ovrin_resize_y_u_v_tps(src.view.y, src.view.chroma[0], src.view.chroma[1], nullptr, s.src_w,
+                           s.src_h, 0, 0, &target);
     ASSERT_TRUE(results.agree());
 }
 
 void check_nv21(const Sizes& s, Random& random) {
     const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_nv21(s.src_w, s.src_h)));
     Results results(bytes_of_nv21(s.dst_w, s.dst_h));
-    results.expected = reference::resize_nv21(reference::nv21_source(src.data(), s.src_w, s.src_h),
-                                              s.dst_w, s.dst_h);
+    results.expected = reference::resize_yuv420(
+        reference::contiguous(reference::kNv21, src.data(), s.src_w, s.src_h), s.dst_w, s.dst_h);
     ovrin_resize_nv21_sg(src.data(), results.single.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     ovrin_resize_nv21_tps(src.data(), results.threaded.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
     ASSERT_TRUE(results.agree());
 }
 
 void check_y_nv21(const Sizes& s, Random& random) {
-    const SemiPlanarPicture src(random, s.src_w, s.src_h, s.src_w);
+    const Yuv420Picture src(reference::kNv21, random, s.src_w, s.src_h, s.src_w);
     Results results(bytes_of_nv21(s.dst_w, s.dst_h));
-    results.expected = reference::resize_nv21(src.view, s.dst_w, s.dst_h);
-    ovrin_resize_y_nv_sg(src.view.y, src.view.vu, results.single.data(), s.src_w, s.src_h, s.dst_w,
-                         s.dst_h, nullptr);
-    ovrin_resize_y_nv_tps(src.view.y, src.view.vu, results.threaded.data(), s.src_w, s.src_h,
+    results.expected = reference::resize_yuv420(src.view, s.dst_w, s.dst_h);
+    ovrin_resize_y_nv_sg(src.view.y, src.view.chroma[0], results.single.data(), s.src_w, s.src_h,
+                         s.dst_w, s.dst_h, nullptr);
+    ovrin_resize_y_nv_tps(src.view.y, src.view.chroma[0], results.threaded.data(), s.src_w, s.src_h,
                           s.dst_w, s.dst_h, nullptr);
     ASSERT_TRUE(results.agree());
 }
@@ -159,14 +158,14 @@ void check_y_nv21_keep_ratio(const Sizes& s, Random& random) {
     ovrin_resize_target target = around(random, s, 0);
     target.src_stride = random_stride(random, s.src_w);
     SCOPED_TRACE(describe(target, s.src_w, s.src_h));
-    const SemiPlanarPicture src(random, s.src_w, s.src_h, target.src_stride);
+    const Yuv420Picture src(reference::kNv21, random, s.src_w, s.src_h, target.src_stride);
     Results results(bytes_of_nv21(target.canvas_width, target.canvas_height));
     results.expected.resize(results.single.size());
-    reference::keep_ratio_nv21_tps(src.view, target, results.expected);
+    reference::keep_ratio_yuv420_tps(src.view, target, results.expected);
     target.dst = results.single.data();
-    ovrin_resize_y_nv_sg(src.view.y, src.view.vu, nullptr, s.src_w, s.src_h, 0, 0, &target);
+    ovrin_resize_y_nv_sg(src.view.y, src.view.chroma[0], nullptr, s.src_w, s.src_h, 0, 0, &target);
     target.dst = results.threaded.data();
-    ovrin_resize_y_nv_tps(src.view.y, src.view.vu, nullptr, s.src_w, s.src_h, 0, 0, &target);
+    ovrin_resize_y_nv_tps(src.view.y, src.view.chroma[0], nullptr, s.src_w, s.src_h, 0, 0, &target);
     ASSERT_TRUE(results.agree());
 }
 

@@ -10,8 +10,7 @@
 #include "reference/bilinear.h"
 #include "reference/lanczos.h"
 #include "reference/nearest.h"
-#include "reference/nv21.h"
-#include "reference/yuv.h"
+#include "reference/yuv420.h"
 #include "support/compare.h"
 #include "support/pictures.h"
 #include "support/random.h"
@@ -81,8 +80,9 @@ TEST(ExhaustiveAxes, QuarterPointsOfPlanes) {
         std::vector<uint8_t> dst(bytes_of_i420(s.dst_w, s.dst_h));
         ovrin_resize_yuv420_sg(noise().data(), dst.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
         expect_bytes(dst,
-                     reference::resize_yuv(reference::i420_source(noise().data(), s.src_w, s.src_h),
-                                           s.dst_w, s.dst_h),
+                     reference::resize_yuv420(
+                         reference::contiguous(reference::kI420, noise().data(), s.src_w, s.src_h),
+                         s.dst_w, s.dst_h),
                      s);
     });
 }
@@ -91,11 +91,11 @@ TEST(ExhaustiveAxes, QuarterPointsOfPairs) {
     every_pair([&](const Sizes& s) {
         std::vector<uint8_t> dst(bytes_of_nv21(s.dst_w, s.dst_h));
         ovrin_resize_nv21_sg(noise().data(), dst.data(), s.src_w, s.src_h, s.dst_w, s.dst_h);
-        expect_bytes(
-            dst,
-            reference::resize_nv21(reference::nv21_source(noise().data(), s.src_w, s.src_h),
-                                   s.dst_w, s.dst_h),
-            s);
+        expect_bytes(dst,
+                     reference::resize_yuv420(
+                         reference::contiguous(reference::kNv21, noise().data(), s.src_w, s.src_h),
+                         s.dst_w, s.dst_h),
+                     s);
     });
 }
 

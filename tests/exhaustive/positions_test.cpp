@@ -10,11 +10,10 @@
 
 #include "bilinear/plan.h"
 #include "exhaustive/every.h"
+#include "kernels/quarter_points.h"
 #include "lanczos/weights.h"
-#include "quarter/points.h"
 #include "reference/bilinear.h"
 #include "reference/lanczos.h"
-#include "reference/nv21.h"
 #include "reference/quarter.h"
 
 using namespace ovrin_test;

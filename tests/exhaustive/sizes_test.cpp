@@ -10,8 +10,7 @@
 #include "reference/keep_ratio_rgba.h"
 #include "reference/lanczos.h"
 #include "reference/nearest.h"
-#include "reference/nv21.h"
-#include "reference/yuv.h"
+#include "reference/yuv420.h"
 #include "support/bilinear_call.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
@@ -142,8 +141,9 @@ TEST(ExhaustiveSizes, I420) {
     Random random(904);
     every_size([&](const Sizes& s, Flush flush) {
         const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_i420(s.src_w, s.src_h)), flush);
-        const auto expected = reference::resize_yuv(
-            reference::i420_source(src.data(), s.src_w, s.src_h), s.dst_w, s.dst_h);
+        const auto expected = reference::resize_yuv420(
+            reference::contiguous(reference::kI420, src.data(), s.src_w, s.src_h), s.dst_w,
+            s.dst_h);
         for (auto* resize :
              {ovrin_resize_yuv420, ovrin_resize_yuv420_sg, ovrin_resize_yuv420_tps}) {
             check_drawing(expected, s, flush, [&](uint8_t* dst) {
@@ -156,16 +156,16 @@ TEST(ExhaustiveSizes, I420) {
 TEST(ExhaustiveSizes, ThreePlanes) {
     Random random(905);
     every_size([&](const Sizes& s, Flush flush) {
-        const PlanarPicture src(random, s.src_w, s.src_h, s.src_w, flush);
-        const auto expected = reference::resize_yuv(src.view, s.dst_w, s.dst_h);
+        const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, s.src_w, flush);
+        const auto expected = reference::resize_yuv420(src.view, s.dst_w, s.dst_h);
         check_drawing(expected, s, flush, [&](uint8_t* dst) {
-            ovrin_resize_y_u_v(src.view.y, src.view.u, src.view.v, dst, s.src_w, s.src_h, s.dst_w,
-                               s.dst_h);
+            ovrin_resize_y_u_v(src.view.y, src.view.chroma[0], src.view.chroma[1], dst, s.src_w,
+                               s.src_h, s.dst_w, s.dst_h);
         });
         for (auto* resize : {ovrin_resize_y_u_v_sg, ovrin_resize_y_u_v_tps}) {
             check_drawing(expected, s, flush, [&](uint8_t* dst) {
-                resize(src.view.y, src.view.u, src.view.v, dst, s.src_w, s.src_h, s.dst_w, s.dst_h,
-                       nullptr);
+                resize(src.view.y, src.view.chroma[0], src.view.chroma[1], dst, s.src_w, s.src_h,
+                       s.dst_w, s.dst_h, nullptr);
             });
         }
     });
@@ -175,14 +175,15 @@ TEST(ExhaustiveSizes, ThreePlanesInACanvas) {
     Random random(906);
     every_size([&](const Sizes& s, Flush flush) {
         ovrin_resize_target target = around(s);
-        const PlanarPicture src(random, s.src_w, s.src_h, target.src_stride, flush);
+        const Yuv420Picture src(reference::kI420, random, s.src_w, s.src_h, target.src_stride,
+                                flush);
         std::vector<uint8_t> expected(bytes_of_i420(target.canvas_width, target.canvas_height),
                                       0xEE);
-        reference::keep_ratio_yuv_sg(src.view, target, expected);
+        reference::keep_ratio_yuv420_sg(src.view, target, expected);
         check_drawing(expected, s, flush, [&](uint8_t* dst) {
             target.dst = dst;
-            ovrin_resize_y_u_v_keep_ratio(src.view.y, src.view.u, src.view.v, s.src_w, s.src_h,
-                                          &target);
+            ovrin_resize_y_u_v_keep_ratio(src.view.y, src.view.chroma[0], src.view.chroma[1],
+                                          s.src_w, s.src_h, &target);
         });
     });
 }
@@ -191,8 +192,9 @@ TEST(ExhaustiveSizes, Nv21) {
     Random random(907);
     every_size([&](const Sizes& s, Flush flush) {
         const GuardedBuffer<uint8_t> src(random.bytes(bytes_of_nv21(s.src_w, s.src_h)), flush);
-        const auto expected = reference::resize_nv21(
-            reference::nv21_source(src.data(), s.src_w, s.src_h), s.dst_w, s.dst_h);
+        const auto expected = reference::resize_yuv420(
+            reference::contiguous(reference::kNv21, src.data(), s.src_w, s.src_h), s.dst_w,
+            s.dst_h);
         for (auto* resize : {ovrin_resize_nv21, ovrin_resize_nv21_sg, ovrin_resize_nv21_tps}) {
             check_drawing(expected, s, flush, [&](uint8_t* dst) {
                 resize(src.data(), dst, s.src_w, s.src_h, s.dst_w, s.dst_h);
@@ -204,14 +206,16 @@ TEST(ExhaustiveSizes, Nv21) {
 TEST(ExhaustiveSizes, TwoPlanes) {
     Random random(908);
     every_size([&](const Sizes& s, Flush flush) {
-        const SemiPlanarPicture src(random, s.src_w, s.src_h, s.src_w, flush);
-        const auto expected = reference::resize_nv21(src.view, s.dst_w, s.dst_h);
+        const Yuv420Picture src(reference::kNv21, random, s.src_w, s.src_h, s.src_w, flush);
+        const auto expected = reference::resize_yuv420(src.view, s.dst_w, s.dst_h);
         check_drawing(expected, s, flush, [&](uint8_t* dst) {
-            ovrin_resize_y_nv21(src.view.y, src.view.vu, dst, s.src_w, s.src_h, s.dst_w, s.dst_h);
+            ovrin_resize_y_nv21(src.view.y, src.view.chroma[0], dst, s.src_w, s.src_h, s.dst_w,
+                                s.dst_h);
         });
         for (auto* resize : {ovrin_resize_y_nv_sg, ovrin_resize_y_nv_tps}) {
             check_drawing(expected, s, flush, [&](uint8_t* dst) {
-                resize(src.view.y, src.view.vu, dst, s.src_w, s.src_h, s.dst_w, s.dst_h, nullptr);
+                resize(src.view.y, src.view.chroma[0], dst, s.src_w, s.src_h, s.dst_w, s.dst_h,
+                       nullptr);
             });
         }
     });
@@ -221,13 +225,15 @@ TEST(ExhaustiveSizes, TwoPlanesInACanvas) {
     Random random(909);
     every_size([&](const Sizes& s, Flush flush) {
         ovrin_resize_target target = around(s);
-        const SemiPlanarPicture src(random, s.src_w, s.src_h, target.src_stride, flush);
+        const Yuv420Picture src(reference::kNv21, random, s.src_w, s.src_h, target.src_stride,
+                                flush);
         std::vector<uint8_t> expected(bytes_of_nv21(target.canvas_width, target.canvas_height),
                                       0xEE);
-        reference::keep_ratio_nv21_sg(src.view, target, expected);
+        reference::keep_ratio_yuv420_sg(src.view, target, expected);
         check_drawing(expected, s, flush, [&](uint8_t* dst) {
             target.dst = dst;
-            ovrin_resize_y_nv21_keep_ratio(src.view.y, src.view.vu, s.src_w, s.src_h, &target);
+            ovrin_resize_y_nv21_keep_ratio(src.view.y, src.view.chroma[0], s.src_w, s.src_h,
+                                           &target);
         });
     });
 }

@@ -13,7 +13,7 @@ namespace {
 constexpr int kSkipped = 77;
 
 const ovrin::Kernels* find_set(const char* name) {
-    ovrin::NamedKernels sets[ovrin::kMostSets];
+    ovrin::NamedKernels sets[ovrin::kMaxSets];
     const int32_t count = ovrin::available_kernels(sets);
     for (int32_t i = 0; i < count; ++i) {
         if (strcmp(sets[i].name, name) == 0) return sets[i].kernels;

@@ -31,7 +31,7 @@ ovrin::CpuFeatures __wrap__ZN5ovrin12cpu_featuresEv() {
 namespace {
 
 std::vector<std::string> names_of_sets() {
-    ovrin::NamedKernels sets[ovrin::kMostSets];
+    ovrin::NamedKernels sets[ovrin::kMaxSets];
     const int32_t count = ovrin::available_kernels(sets);
     std::vector<std::string> names;
     for (int32_t i = 0; i < count; ++i) names.emplace_back(sets[i].name);
@@ -43,7 +43,7 @@ std::vector<std::string> names_of_sets() {
 void expect_last_set_is_chosen() {
     EXPECT_EXIT(
         {
-            ovrin::NamedKernels sets[ovrin::kMostSets];
+            ovrin::NamedKernels sets[ovrin::kMaxSets];
             const int32_t count = ovrin::available_kernels(sets);
             exit(&ovrin::kernels() == sets[count - 1].kernels ? 0 : 1);
         },

@@ -4,14 +4,11 @@
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
 
-#include <algorithm>
-#include <memory>
 #include <vector>
 
-#include "kernels/kernels.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
-#include "support/random.h"
+#include "support/vector_sets.h"
 
 using namespace ovrin;
 using namespace ovrin_test;
@@ -20,14 +17,8 @@ namespace {
 
 using Bytes = std::vector<uint8_t>;
 
-class EngineKernels : public ::testing::Test {
+class EngineKernels : public VectorSets {
 protected:
-    void SetUp() override {
-        NamedKernels sets[kMostSets];
-        const int32_t count = available_kernels(sets);
-        vector_sets_.assign(sets + 1, sets + count);
-        if (vector_sets_.empty()) GTEST_SKIP() << "this processor has no vector set";
-    }
     void TearDown() override { force_kernels(*best_); }
 
     // Calls resize(dst) with scalar kernels and with each other set.
@@ -56,7 +47,6 @@ protected:
     }
 
     const Kernels* best_ = &kernels();
-    std::vector<NamedKernels> vector_sets_;
 };
 
 Bytes constant(size_t count, int value) {
@@ -74,19 +64,6 @@ Bytes checkerboard(int32_t w, int32_t h) {
 }
 
 }  // namespace
-
-TEST_F(EngineKernels, TheSetsHaveKernelsOfTheirOwn) {
-    for (const NamedKernels& set : vector_sets_) {
-        EXPECT_NE(set.kernels->lanczos->row, scalar_kernels.lanczos->row) << set.name;
-        for (int i = 0; i < 3; ++i) {
-            const BilinearBlend& blend = set.kernels->bilinear_blend[i];
-            EXPECT_NE(blend.across, scalar_kernels.bilinear_blend[i].across) << set.name;
-            EXPECT_NE(blend.down, scalar_kernels.bilinear_blend[i].down) << set.name;
-            EXPECT_NE(set.kernels->bilinear_copy[i].copy, scalar_kernels.bilinear_copy[i].copy)
-                << set.name;
-        }
-    }
-}
 
 TEST_F(EngineKernels, BilinearOfRandomSizes) {
     Random random(41);
@@ -182,31 +159,6 @@ TEST_F(EngineKernels, BilinearCopiesInAnyOrder) {
     }
 }
 
-// Windows of every width, and ratios beyond them; nothing behind the last sample is there to read.
-TEST_F(EngineKernels, BilinearCopiesOfEveryReduction) {
-    Random random(48);
-    auto columns = std::make_unique<BilinearColumns>();
-    for (const NamedKernels& set : vector_sets_) {
-        for (int32_t quarters = 1; quarters <= 48; ++quarters) {
-            for (const int32_t n : {1, 2, 4}) {
-                columns->count = random.between(60, kBilinearColumns);
-                for (int32_t i = 0; i < columns->count; ++i) columns->index[i] = i * quarters / 4;
-                const int32_t samples = columns->index[columns->count - 1] + 1;
-                const GuardedBuffer<uint8_t> row(random.bytes(static_cast<size_t>(samples * n)));
-                Bytes expected(static_cast<size_t>(columns->count * n));
-                GuardedBuffer<uint8_t> actual(expected.size(), Flush::kEnd, 0xEE);
-                scalar_kernels.bilinear_copy[n >> 1].copy(expected.data(), row.data(), *columns);
-                const BilinearCopy& copy = set.kernels->bilinear_copy[n >> 1];
-                copy.prepare(*columns);
-                copy.copy(actual.data(), row.data(), *columns);
-                ASSERT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()))
-                    << set.name << ", " << n << " bytes, ratio " << quarters << "/4";
-                ASSERT_TRUE(actual.intact());
-            }
-        }
-    }
-}
-
 TEST_F(EngineKernels, LanczosOfRandomSizes) {
     Random random(43);
     SCOPED_TRACE(random.trace());
@@ -249,40 +201,6 @@ TEST_F(EngineKernels, LanczosAroundStripBorders) {
             lanczos_alike(src, src_w, src_h, dst_w, random.pick({5, 9, 30}), n);
         }
     }
-}
-
-// Sums of source rows that are still held must not be taken for those of others.
-TEST_F(EngineKernels, LanczosRowsInAnyOrder) {
-    Random random(49);
-    constexpr int32_t kColumns = 37, kPixels = 90, kRows = 25, kResults = 60;
-    const Bytes src = random.bytes(kPixels * kRows * 4);
-    std::vector<double> columns;
-    for (int32_t i = 0; i < kColumns * 7; ++i) columns.push_back(random.between(-30, 60) / 250.0);
-    std::vector<std::vector<double>> weights(kResults, std::vector<double>(7));
-    std::vector<int32_t> middles;
-    for (std::vector<double>& row : weights) {
-        for (double& weight : row) weight = random.between(-30, 60) / 250.0;
-        middles.push_back(random.between(0, kRows - 1));
-    }
-    LanczosStrip strip;
-    strip.src_components = strip.dst_components = 4;
-    strip.count = kColumns;
-    strip.column_weights = columns.data();
-    for (int32_t x = 0; x < kColumns; ++x) strip.index[x] = x * (kPixels - 7) / (kColumns - 1);
-    expect_alike(kResults * kColumns * 4, [&](uint8_t* dst) {
-        const LanczosKernels& kernel = *kernels().lanczos;
-        kernel.prepare(strip);
-        for (size_t i = 0; i < kResults; ++i) {
-            LanczosRow row;
-            row.dst = dst + i * kColumns * 4;
-            row.row_weights = weights[i].data();
-            for (int32_t k = 0; k < 7; ++k) {
-                row.source_rows[k] = std::min(std::max(middles[i] - 3 + k, 0), kRows - 1);
-                row.taps[k] = src.data() + row.source_rows[k] * kPixels * 4;
-            }
-            kernel.row(strip, row);
-        }
-    });
 }
 
 TEST_F(EngineKernels, LanczosRowsWiderThanASpan) {

@@ -4,12 +4,15 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <iterator>
 #include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
 
-#include "kernels/kernels.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
-#include "support/random.h"
+#include "support/vector_sets.h"
 
 using namespace ovrin;
 using namespace ovrin_test;
@@ -18,17 +21,15 @@ namespace {
 
 struct Row {
     int32_t sample_bytes;
-    int32_t source_samples;
-    int32_t samples;
-    int32_t unit;  // what the ratio counts per sample: 1, or the bytes of an interleaved pair
+    int32_t src_columns;
+    int32_t dst_columns;
 };
 
 // The columns from sample `first` on.
 QuarterColumns columns_of(const Row& row, int32_t first) {
-    const int32_t source = row.source_samples * row.unit;
-    const int32_t target = row.samples * row.unit;
-    QuarterColumns columns = {{quarter_point(source), source, target},
-                              {three_quarter_point(source), source, target}};
+    const int32_t source = row.src_columns;
+    QuarterColumns columns = {{quarter_point(source), source, row.dst_columns},
+                              {three_quarter_point(source), source, row.dst_columns}};
     for (int32_t i = 0; i < first; ++i) columns.next();
     return columns;
 }
@@ -43,13 +44,17 @@ std::unique_ptr<Planned> plan_with(const Kernels& set, const Row& row, int32_t f
                                    int32_t count) {
     auto planned = std::make_unique<Planned>();
     QuarterColumns columns = columns_of(row, first);
-    const QuarterRowShape shape = {row.sample_bytes, row.source_samples,
-                                   row.source_samples * row.unit, row.samples * row.unit};
+    const QuarterRowShape shape = {row.sample_bytes, row.src_columns, row.dst_columns};
     planned->kernels = &set.plan_quarters(planned->plan, shape, columns, count);
     return planned;
 }
 
 enum class Kernel { kStorePair, kAddPair, kAddRow };
+
+const char* name_of(Kernel kernel) {
+    constexpr const char* kNames[] = {"store_pair", "add_pair", "add_row"};
+    return kNames[static_cast<int>(kernel)];
+}
 
 void run(const Planned& planned, Kernel kernel, uint8_t* dst, const uint8_t* top,
          const uint8_t* bottom) {
@@ -63,13 +68,15 @@ void run(const Planned& planned, Kernel kernel, uint8_t* dst, const uint8_t* top
     }
 }
 
-// Compares the strips of a whole row; returns whether the set has kernels of its own for it.
-bool check_row(const NamedKernels& set, const Row& row, Random& random) {
+// Compares the strips of columns `first` to `end` of a row; returns whether the set has kernels of
+// its own for them.
+bool check_columns(const NamedKernels& set, const Row& row, int32_t first, int32_t end,
+                   Random& random) {
     const size_t row_bytes =
-        static_cast<size_t>(row.source_samples) * static_cast<size_t>(row.sample_bytes);
+        static_cast<size_t>(row.src_columns) * static_cast<size_t>(row.sample_bytes);
     bool differs = false;
-    for (int32_t done = 0; done < row.samples;) {
-        const auto tested = plan_with(*set.kernels, row, done, row.samples - done);
+    for (int32_t done = first; done < end;) {
+        const auto tested = plan_with(*set.kernels, row, done, end - done);
         const int32_t strip = tested->plan.samples;
         for (const Kernel kernel : {Kernel::kStorePair, Kernel::kAddPair, Kernel::kAddRow}) {
             const Flush flush = random.pick({Flush::kEnd, Flush::kStart});
@@ -87,9 +94,9 @@ bool check_row(const NamedKernels& set, const Row& row, Random& random) {
                 differs |= scalar->kernels != tested->kernels;
             }
             EXPECT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()))
-                << set.name << " kernel " << static_cast<int>(kernel) << ": " << row.source_samples
-                << " to " << row.samples << " samples of " << row.sample_bytes
-                << " bytes, strip at " << done;
+                << set.name << ", " << name_of(kernel) << ": " << row.src_columns << " to "
+                << row.dst_columns << " samples of " << row.sample_bytes << " bytes, strip at "
+                << done;
             EXPECT_TRUE(actual.intact());
         }
         done += strip;
@@ -97,17 +104,48 @@ bool check_row(const NamedKernels& set, const Row& row, Random& random) {
     return differs;
 }
 
-class VectorQuarterKernels : public ::testing::Test {
-protected:
-    void SetUp() override {
-        NamedKernels sets[kMostSets];
-        const int32_t count = available_kernels(sets);
-        vector_sets_.assign(sets + 1, sets + count);
-        if (vector_sets_.empty()) GTEST_SKIP() << "this processor has no vector set";
-    }
+bool check_row(const NamedKernels& set, const Row& row, Random& random) {
+    return check_columns(set, row, 0, row.dst_columns, random);
+}
 
-    std::vector<NamedKernels> vector_sets_;
+struct Ratio {
+    int32_t src;
+    int32_t dst;
 };
+
+// What each set does with kernels made for the ratio.
+struct SimpleRatio {
+    std::string_view set;
+    int32_t sample_bytes;
+    Ratio ratio;
+};
+
+std::vector<SimpleRatio> simple_ratios(const NamedKernels& set) {
+    std::vector<SimpleRatio> all;
+    for (const int32_t n : {1, 2, 4}) {
+        for (const Ratio ratio : {Ratio{2, 1}, Ratio{3, 1}, Ratio{4, 1}, Ratio{3, 2}}) {
+            all.push_back({"avx2", n, ratio});
+            all.push_back({"neon", n, ratio});
+        }
+        all.push_back({"neon", n, {2, 3}});
+    }
+    std::vector<SimpleRatio> of_set;
+    std::copy_if(all.begin(), all.end(), std::back_inserter(of_set),
+                 [&](const SimpleRatio& simple) { return simple.set == set.name; });
+    return of_set;
+}
+
+Row row_of(const SimpleRatio& simple, int32_t groups) {
+    return {simple.sample_bytes, simple.ratio.src * groups, simple.ratio.dst * groups};
+}
+
+std::string describe(const SimpleRatio& simple) {
+    return std::string(simple.set) + ' ' + std::to_string(simple.ratio.src) + ':' +
+           std::to_string(simple.ratio.dst) + ", samples of " +
+           std::to_string(simple.sample_bytes) + " bytes";
+}
+
+using VectorQuarterKernels = VectorSets;
 
 }  // namespace
 
@@ -119,7 +157,7 @@ TEST_F(VectorQuarterKernels, RandomRowsEqualTheScalarOnes) {
         const int count = rounds(3000);
         for (int i = 0; i < count && !HasFailure(); ++i) {
             const int32_t n = random.between(1, 4);
-            own += check_row(set, {n, random.awkward_size(), random.awkward_size(), 1}, random);
+            own += check_row(set, {n, random.awkward_size(), random.awkward_size()}, random);
         }
         // Otherwise only scalar kernels would have been compared with themselves.
         EXPECT_GT(own, count / 4) << set.name;
@@ -134,7 +172,59 @@ TEST_F(VectorQuarterKernels, EveryRatioUpToTenOfLongRows) {
             for (const int32_t n : {1, 2, 3, 4}) {
                 const int32_t samples = random.between(257, 700);
                 const int32_t source = std::max(1, samples * tenths / 10 + random.between(-3, 3));
-                check_row(set, {n, source, samples, n == 2 ? 2 : 1}, random);
+                check_row(set, {n, source, samples}, random);
+            }
+        }
+    }
+}
+
+// A ratio that is just missed takes the kernels for any ratio; were they to take the simple ones
+// too, the two would be the same.
+TEST_F(VectorQuarterKernels, SimpleRatiosHaveKernelsOfTheirOwn) {
+    for (const NamedKernels& set : vector_sets_) {
+        for (const SimpleRatio& simple : simple_ratios(set)) {
+            SCOPED_TRACE(describe(simple));
+            const auto kernels_of = [](const Kernels& kernels, const Row& row) {
+                return plan_with(kernels, row, 0, row.dst_columns)->kernels;
+            };
+            const Row row = row_of(simple, 100);
+            Row missed = row;
+            ++missed.src_columns;
+            const QuarterKernels* own = kernels_of(*set.kernels, row);
+            EXPECT_NE(own, kernels_of(*set.kernels, missed));
+            EXPECT_NE(own, kernels_of(scalar_kernels, row));
+            EXPECT_EQ(own, kernels_of(*set.kernels, row_of(simple, 131)));
+            EXPECT_EQ(plan_with(*set.kernels, row, 0, row.dst_columns)->plan.samples,
+                      row.dst_columns);
+        }
+    }
+}
+
+TEST_F(VectorQuarterKernels, SimpleRatiosOfAllLengths) {
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(34);
+        SCOPED_TRACE(random.trace());
+        for (const SimpleRatio& simple : simple_ratios(set)) {
+            SCOPED_TRACE(describe(simple));
+            for (int32_t groups = 1; groups <= 200 && !HasFailure(); ++groups) {
+                check_row(set, row_of(simple, groups), random);
+            }
+        }
+    }
+}
+
+// Strips that begin inside a row, and inside a group of columns that repeats, or end before it.
+TEST_F(VectorQuarterKernels, PartsOfRowsWithSimpleRatios) {
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(35);
+        SCOPED_TRACE(random.trace());
+        for (const SimpleRatio& simple : simple_ratios(set)) {
+            SCOPED_TRACE(describe(simple));
+            for (int i = 0; i < rounds(100) && !HasFailure(); ++i) {
+                const Row row = row_of(simple, random.between(1, 200));
+                const int32_t first = random.between(0, row.dst_columns - 1);
+                const int32_t end = random.between(first + 1, row.dst_columns);
+                check_columns(set, row, first, end, random);
             }
         }
     }
@@ -145,7 +235,7 @@ TEST_F(VectorQuarterKernels, RowsOfSeveralStrips) {
         Random random(33);
         for (const int32_t n : {1, 2, 3, 4}) {
             for (const int32_t source : {7000, 21013, 60001}) {
-                EXPECT_TRUE(check_row(set, {n, source, 20011, 1}, random)) << set.name;
+                EXPECT_TRUE(check_row(set, {n, source, 20011}, random)) << set.name;
             }
         }
     }
@@ -154,8 +244,8 @@ TEST_F(VectorQuarterKernels, RowsOfSeveralStrips) {
 TEST_F(VectorQuarterKernels, ExtremeSamples) {
     for (const NamedKernels& set : vector_sets_) {
         for (const int value : {0x00, 0xFF, 0x03, 0xFC}) {
-            const Row row = {1, 301, 200, 1};
-            const auto planned = plan_with(*set.kernels, row, 0, row.samples);
+            const Row row = {1, 301, 200};
+            const auto planned = plan_with(*set.kernels, row, 0, row.dst_columns);
             const std::vector<uint8_t> source(301, static_cast<uint8_t>(value));
             std::vector<uint8_t> dst(200, 1);
             run(*planned, Kernel::kStorePair, dst.data(), source.data(), source.data());

@@ -9,6 +9,7 @@
 #include <initializer_list>
 
 #include "reference/band_walkers.h"
+#include "reference/yuv420.h"
 
 namespace reference {
 
@@ -101,9 +102,11 @@ inline void rgba_task(const ovrin_rgba_band& band, uint32_t* dst, int32_t row_pi
                        skip_before,
                        skip_after,
                        1};
-    scan_rows(start_walk(band, band.src_h), scan, [&](int32_t index, const uint8_t* sample) {
-        for (int c = 0; c < 4; ++c) dst[index] += static_cast<uint32_t>(sample[c] >> 2) << (8 * c);
-    });
+    scan_rows(start_walk(band, kRgbaFields, band.src_h), scan,
+              [&](int32_t index, const uint8_t* sample) {
+                  for (int c = 0; c < 4; ++c)
+                      dst[index] += static_cast<uint32_t>(sample[c] >> 2) << (8 * c);
+              });
 }
 
 inline void resize_rgba8888_tp(const ovrin_rgba_band& band, uint32_t* dst) {
@@ -132,82 +135,70 @@ void luma_task(const Band& band, int32_t row_bytes, uint8_t* target) {
                        0,
                        gap,
                        1};
-    scan_rows(start_luma(band, band.src_height), scan, [&](int32_t index, const uint8_t* sample) {
-        target[index] = static_cast<uint8_t>(target[index] + (*sample >> 2));
-    });
+    scan_rows(start_walk(band, kLumaFields<Band>, band.src_height), scan,
+              [&](int32_t index, const uint8_t* sample) {
+                  target[index] = static_cast<uint8_t>(target[index] + (*sample >> 2));
+              });
 }
 
-inline void yuv_chroma_task(const ovrin_yuv_band& band, const uint8_t* u, const uint8_t* v,
-                            int32_t row_bytes, uint8_t* target) {
-    const int32_t src_cw = (band.src_width + 1) >> 1;
-    const int32_t src_ch = (band.src_height + 1) >> 1;
-    if (band.uv_rows == 0 || src_ch <= band.uv_start_row) return;
+// `planes` are U and V, or VU.
+template <class Band>
+void chroma_task(const Band& band, const ChromaLayout& layout,
+                 std::initializer_list<const uint8_t*> planes, int32_t row_bytes, uint8_t* target) {
+    constexpr auto fields = kChromaFields<Band>;
+    const auto bytes = static_cast<int32_t>(layout.sample_bytes);
+    const int32_t src_w = (band.src_width + 1) >> 1;
+    const int32_t src_h = (band.src_height + 1) >> 1;
+    if (band.*fields.rows == 0 || src_h <= band.*fields.start_row) return;
     const int32_t grid_w = grid_side(band.dst_width);
     const int32_t grid_h = grid_side(band.dst_height);
-    const int32_t cw = (grid_w + 1) >> 1;
-    const int32_t ch = (grid_h + 1) >> 1;
+    const int32_t dst_row = grid_w / 2 * bytes;
+    const int32_t dst_h = grid_h / 2;
     uint8_t* plane = target + grid_w * grid_h;
-    for (const uint8_t* src : {u, v}) {
-        const Scan scan = {src + band.src_uv_offset,
-                           band.uv_rows,
+    for (const uint8_t* src : planes) {
+        const Scan scan = {src + band.*fields.src_offset,
+                           band.*fields.rows,
                            row_bytes,
-                           src_cw,
-                           1,
-                           src_cw,
-                           cw,
-                           src_ch,
-                           ch,
+                           src_w,
+                           bytes,
+                           src_w * bytes,
+                           dst_row,
+                           src_h,
+                           dst_h,
                            0,
                            0,
-                           1};
-        scan_rows(start_chroma(band, band.src_height), scan,
-                  [&](int32_t index, const uint8_t* sample) {
-                      plane[index] = static_cast<uint8_t>(plane[index] + (*sample >> 2));
-                  });
-        plane += cw * ch;
+                           bytes};
+        scan_rows(start_walk(band, fields, src_h), scan, [&](int32_t index, const uint8_t* sample) {
+            for (int b = 0; b < bytes; ++b) {
+                plane[index + b] = static_cast<uint8_t>(plane[index + b] + (sample[b] >> 2));
+            }
+        });
+        plane += dst_row * dst_h;
     }
 }
 
 inline void resize_y_u_v_tp(const ovrin_yuv_band& band, uint8_t* target) {
     luma_task(band, band.src_row_bytes, target);
-    yuv_chroma_task(band, band.src_u, band.src_v, (band.src_row_bytes + 1) >> 1, target);
+    chroma_task(band, kI420, {band.src_u, band.src_v}, (band.src_row_bytes + 1) >> 1, target);
 }
 
 inline void resize_yuv420_tp(const ovrin_yuv_band& band, uint8_t* target) {
-    const int32_t cw = (band.src_width + 1) >> 1;
-    const int32_t ch = (band.src_height + 1) >> 1;
+    const int32_t chroma_w = (band.src_width + 1) >> 1;
+    const int32_t chroma_h = (band.src_height + 1) >> 1;
     const uint8_t* u = band.src + band.src_width * band.src_height;
     luma_task(band, band.src_width, target);
-    yuv_chroma_task(band, u, u + cw * ch, cw, target);
-}
-
-inline void nv21_chroma_task(const ovrin_nv21_band& band, const uint8_t* vu, int32_t row_bytes,
-                             uint8_t* target) {
-    const int32_t src_ch = (band.src_height + 1) >> 1;
-    if (band.vu_rows == 0 || band.vu_start_row >= src_ch) return;
-    const int32_t grid_w = grid_side(band.dst_width);
-    const int32_t grid_h = grid_side(band.dst_height);
-    const int32_t src_row = (band.src_width + 1) & ~1;
-    uint8_t* plane = target + grid_w * grid_h;
-    const Scan scan = {
-        vu + band.src_vu_offset, band.vu_rows, row_bytes,         src_row / 2, 2, src_row,
-        (grid_w + 1) & ~1,       src_ch,       (grid_h + 1) >> 1, 0,           0, 2};
-    scan_rows(start_chroma(band, band.src_height), scan, [&](int32_t index, const uint8_t* sample) {
-        for (int b = 0; b < 2; ++b) {
-            plane[index + b] = static_cast<uint8_t>(plane[index + b] + (sample[b] >> 2));
-        }
-    });
+    chroma_task(band, kI420, {u, u + chroma_w * chroma_h}, chroma_w, target);
 }
 
 inline void resize_nv21_tp(const ovrin_nv21_band& band, uint8_t* target) {
     luma_task(band, band.src_width, target);
-    nv21_chroma_task(band, band.src + band.src_width * band.src_height, (band.src_width + 1) & ~1,
-                     target);
+    chroma_task(band, kNv21, {band.src + band.src_width * band.src_height},
+                (band.src_width + 1) & ~1, target);
 }
 
 inline void resize_y_nv21_tp(const ovrin_nv21_band& band, uint8_t* target) {
     luma_task(band, band.src_row_bytes, target);
-    nv21_chroma_task(band, band.src_vu, (band.src_row_bytes + 1) & ~1, target);
+    chroma_task(band, kNv21, {band.src_vu}, (band.src_row_bytes + 1) & ~1, target);
 }
 
 }  // namespace reference

@@ -6,6 +6,8 @@
 
 #include <cstdint>
 
+#include "reference/band_records.h"
+
 namespace reference {
 
 // The vertical state of one plane: the next pending point of each kind, the scaled coordinate of
@@ -53,87 +55,27 @@ inline void pass_row(Walk& walk, const WalkSizes& sizes) {
 
 // ---- Records to walks and back. Points are not saved before the first row. ----
 
-inline Walk start_walk(const ovrin_rgba_band& band, int32_t src_h) {
-    Walk walk = {band.row_q1, band.row_q3, band.row_acc, band.di_11,
-                 band.di_13,  band.di_31,  band.di_33};
-    if (band.start_row == 0) {
-        walk.top_point = src_h >> 2;
-        walk.bottom_point = (3 * src_h) >> 2;
-    }
-    return walk;
-}
-
-inline void store_walk(ovrin_rgba_band& band, const Walk& walk) {
-    band.row_q1 = walk.top_point;
-    band.row_q3 = walk.bottom_point;
-    band.row_acc = walk.row_base;
-    band.di_11 = walk.top_left;
-    band.di_13 = walk.top_right;
-    band.di_31 = walk.bottom_left;
-    band.di_33 = walk.bottom_right;
-}
-
-// Luma of either record of planes.
 template <class Band>
-Walk start_luma(const Band& band, int32_t src_h) {
-    Walk walk = {band.y_top_point, band.y_bottom_point, band.y_row_base,    band.y_top_left,
-                 band.y_top_right, band.y_bottom_left,  band.y_bottom_right};
-    if (band.y_start_row == 0) {
-        walk.top_point = src_h >> 2;
-        walk.bottom_point = (3 * src_h) >> 2;
+Walk start_walk(const Band& band, const PlaneFields<Band>& plane, int32_t src_rows) {
+    Walk walk = {band.*plane.top_point,   band.*plane.bottom_point, band.*plane.row_base,
+                 band.*plane.top_left,    band.*plane.top_right,    band.*plane.bottom_left,
+                 band.*plane.bottom_right};
+    if (band.*plane.start_row == 0) {
+        walk.top_point = src_rows >> 2;
+        walk.bottom_point = (3 * src_rows) >> 2;
     }
     return walk;
 }
 
 template <class Band>
-void store_luma(Band& band, const Walk& walk) {
-    band.y_top_point = walk.top_point;
-    band.y_bottom_point = walk.bottom_point;
-    band.y_row_base = walk.row_base;
-    band.y_top_left = walk.top_left;
-    band.y_top_right = walk.top_right;
-    band.y_bottom_left = walk.bottom_left;
-    band.y_bottom_right = walk.bottom_right;
-}
-
-inline Walk start_chroma(const ovrin_yuv_band& band, int32_t src_h) {
-    Walk walk = {band.uv_top_point, band.uv_bottom_point, band.uv_row_base,    band.uv_top_left,
-                 band.uv_top_right, band.uv_bottom_left,  band.uv_bottom_right};
-    if (band.uv_start_row == 0) {
-        walk.top_point = (src_h + 1) >> 3;
-        walk.bottom_point = (3 * ((src_h + 1) >> 1)) >> 2;
-    }
-    return walk;
-}
-
-inline void store_chroma(ovrin_yuv_band& band, const Walk& walk) {
-    band.uv_top_point = walk.top_point;
-    band.uv_bottom_point = walk.bottom_point;
-    band.uv_row_base = walk.row_base;
-    band.uv_top_left = walk.top_left;
-    band.uv_top_right = walk.top_right;
-    band.uv_bottom_left = walk.bottom_left;
-    band.uv_bottom_right = walk.bottom_right;
-}
-
-inline Walk start_chroma(const ovrin_nv21_band& band, int32_t src_h) {
-    Walk walk = {band.vu_top_point, band.vu_bottom_point, band.vu_row_base,    band.vu_top_left,
-                 band.vu_top_right, band.vu_bottom_left,  band.vu_bottom_right};
-    if (band.vu_start_row == 0) {
-        walk.top_point = (src_h + 1) >> 3;
-        walk.bottom_point = (3 * ((src_h + 1) >> 1)) >> 2;
-    }
-    return walk;
-}
-
-inline void store_chroma(ovrin_nv21_band& band, const Walk& walk) {
-    band.vu_top_point = walk.top_point;
-    band.vu_bottom_point = walk.bottom_point;
-    band.vu_row_base = walk.row_base;
-    band.vu_top_left = walk.top_left;
-    band.vu_top_right = walk.top_right;
-    band.vu_bottom_left = walk.bottom_left;
-    band.vu_bottom_right = walk.bottom_right;
+void store_walk(Band& band, const PlaneFields<Band>& plane, const Walk& walk) {
+    band.*plane.top_point = walk.top_point;
+    band.*plane.bottom_point = walk.bottom_point;
+    band.*plane.row_base = walk.row_base;
+    band.*plane.top_left = walk.top_left;
+    band.*plane.top_right = walk.top_right;
+    band.*plane.bottom_left = walk.bottom_left;
+    band.*plane.bottom_right = walk.bottom_right;
 }
 
 // ---- The walkers ----
@@ -144,7 +86,7 @@ inline int32_t grid_side(int32_t length) {
 
 inline void rgba_walk(int32_t src_h, int32_t dst_h, int32_t row_length, int32_t src_row_pixels,
                       ovrin_rgba_band& band) {
-    Walk walk = start_walk(band, src_h);
+    Walk walk = start_walk(band, kRgbaFields, src_h);
     int32_t passed = 0;
     while (passed < band.band_rows) {
         pass_row(walk, {src_h, dst_h, row_length});
@@ -153,7 +95,7 @@ inline void rgba_walk(int32_t src_h, int32_t dst_h, int32_t row_length, int32_t 
     band.start_row += passed;
     band.src_offset += passed * src_row_pixels * 4;
     band.rows_to_do = src_h >= band.start_row ? passed : 0;
-    store_walk(band, walk);
+    store_walk(band, kRgbaFields, walk);
 }
 
 inline void rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
@@ -169,7 +111,7 @@ inline void rgba8888_get_pos_keep_ratio(int32_t src_h, int32_t dst_h, int32_t ca
 // Luma is the same for both records of planes.
 template <class Band>
 void walk_luma(int32_t src_h, int32_t dst_w, int32_t dst_h, Band& band) {
-    Walk walk = start_luma(band, src_h);
+    Walk walk = start_walk(band, kLumaFields<Band>, src_h);
     int32_t passed = 0;
     while (passed < band.band_rows) {
         pass_row(walk, {src_h, dst_h, grid_side(dst_w)});
@@ -178,7 +120,7 @@ void walk_luma(int32_t src_h, int32_t dst_w, int32_t dst_h, Band& band) {
     band.src_y_offset += band.src_row_bytes * passed;
     band.y_start_row += passed;
     band.y_rows = src_h >= band.y_start_row ? passed : 0;
-    store_luma(band, walk);
+    store_walk(band, kLumaFields<Band>, walk);
 }
 
 // Chroma rows of a band, clipped to the plane's `rows`.
@@ -195,7 +137,7 @@ inline void yuv420_get_pos(int32_t src_h, int32_t dst_w, int32_t dst_h, ovrin_yu
     const int32_t rows = (src_h + 1) >> 1;
     const int32_t step = (band.src_row_bytes + 1) >> 1;
     const WalkSizes sizes = {rows, (grid_side(dst_h) + 1) >> 1, (grid_side(dst_w) + 1) >> 1};
-    Walk walk = start_chroma(band, src_h);
+    Walk walk = start_walk(band, kChromaFields<ovrin_yuv_band>, rows);
     int32_t passed = 0;
     while (passed < (band.band_rows + 3) >> 2) {
         pass_row(walk, sizes);
@@ -209,7 +151,7 @@ inline void yuv420_get_pos(int32_t src_h, int32_t dst_w, int32_t dst_h, ovrin_yu
     }
     band.uv_start_row += passed;
     band.uv_rows = clipped_rows(rows, band.uv_start_row, passed);
-    store_chroma(band, walk);
+    store_walk(band, kChromaFields<ovrin_yuv_band>, walk);
 }
 
 // Lengthens a chroma band that leaves a destination row half done to the end of the plane; the
@@ -220,7 +162,7 @@ inline void nv21_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t ds
 
     const int32_t rows = (src_h + 1) >> 1;
     const WalkSizes sizes = {rows, (grid_side(dst_h) + 1) >> 1, (grid_side(dst_w) + 1) & ~1};
-    Walk walk = start_chroma(band, src_h);
+    Walk walk = start_walk(band, kChromaFields<ovrin_nv21_band>, rows);
     int32_t passed = 0;
     while (passed < (band.band_rows + 3) >> 2) {
         pass_row(walk, sizes);
@@ -236,7 +178,7 @@ inline void nv21_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w, int32_t ds
     }
     band.vu_start_row += passed;
     band.vu_rows = clipped_rows(rows, band.vu_start_row, passed);
-    store_chroma(band, walk);
+    store_walk(band, kChromaFields<ovrin_nv21_band>, walk);
 }
 
 }  // namespace reference

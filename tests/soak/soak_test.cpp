@@ -12,8 +12,7 @@
 #include <iostream>
 #include <vector>
 
-#include "reference/nv21.h"
-#include "reference/yuv.h"
+#include "reference/yuv420.h"
 #include "support/compare.h"
 #include "support/letterbox.h"
 #include "support/random.h"

@@ -8,6 +8,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "reference/band_records.h"
+
 namespace ovrin_test {
 
 template <class Band>
@@ -32,69 +34,39 @@ inline const std::vector<Field<ovrin_rgba_band>>& fields_of(const ovrin_rgba_ban
     return fields;
 }
 
-inline const std::vector<Field<ovrin_yuv_band>>& fields_of(const ovrin_yuv_band&) {
-    using B = ovrin_yuv_band;
-    static const std::vector<Field<B>> fields = {{"y_start_row", &B::y_start_row},
-                                                 {"y_top_point", &B::y_top_point},
-                                                 {"y_bottom_point", &B::y_bottom_point},
-                                                 {"y_row_base", &B::y_row_base},
-                                                 {"y_top_left", &B::y_top_left},
-                                                 {"y_top_right", &B::y_top_right},
-                                                 {"y_bottom_left", &B::y_bottom_left},
-                                                 {"y_bottom_right", &B::y_bottom_right},
-                                                 {"uv_start_row", &B::uv_start_row},
-                                                 {"uv_top_point", &B::uv_top_point},
-                                                 {"uv_bottom_point", &B::uv_bottom_point},
-                                                 {"uv_row_base", &B::uv_row_base},
-                                                 {"uv_top_left", &B::uv_top_left},
-                                                 {"uv_top_right", &B::uv_top_right},
-                                                 {"uv_bottom_left", &B::uv_bottom_left},
-                                                 {"uv_bottom_right", &B::uv_bottom_right},
-                                                 {"src_width", &B::src_width},
-                                                 {"src_height", &B::src_height},
-                                                 {"src_row_bytes", &B::src_row_bytes},
-                                                 {"src_rows", &B::src_rows},
-                                                 {"dst_width", &B::dst_width},
-                                                 {"dst_height", &B::dst_height},
-                                                 {"band_rows", &B::band_rows},
-                                                 {"src_y_offset", &B::src_y_offset},
-                                                 {"src_uv_offset", &B::src_uv_offset},
-                                                 {"y_rows", &B::y_rows},
-                                                 {"uv_rows", &B::uv_rows},
-                                                 {"done", &B::done}};
-    return fields;
-}
-
-inline const std::vector<Field<ovrin_nv21_band>>& fields_of(const ovrin_nv21_band&) {
-    using B = ovrin_nv21_band;
-    static const std::vector<Field<B>> fields = {{"y_start_row", &B::y_start_row},
-                                                 {"y_top_point", &B::y_top_point},
-                                                 {"y_bottom_point", &B::y_bottom_point},
-                                                 {"y_row_base", &B::y_row_base},
-                                                 {"y_top_left", &B::y_top_left},
-                                                 {"y_top_right", &B::y_top_right},
-                                                 {"y_bottom_left", &B::y_bottom_left},
-                                                 {"y_bottom_right", &B::y_bottom_right},
-                                                 {"vu_start_row", &B::vu_start_row},
-                                                 {"vu_top_point", &B::vu_top_point},
-                                                 {"vu_bottom_point", &B::vu_bottom_point},
-                                                 {"vu_row_base", &B::vu_row_base},
-                                                 {"vu_top_left", &B::vu_top_left},
-                                                 {"vu_top_right", &B::vu_top_right},
-                                                 {"vu_bottom_left", &B::vu_bottom_left},
-                                                 {"vu_bottom_right", &B::vu_bottom_right},
-                                                 {"src_width", &B::src_width},
-                                                 {"src_height", &B::src_height},
-                                                 {"src_row_bytes", &B::src_row_bytes},
-                                                 {"src_rows", &B::src_rows},
-                                                 {"dst_width", &B::dst_width},
-                                                 {"dst_height", &B::dst_height},
-                                                 {"band_rows", &B::band_rows},
-                                                 {"src_y_offset", &B::src_y_offset},
-                                                 {"src_vu_offset", &B::src_vu_offset},
-                                                 {"y_rows", &B::y_rows},
-                                                 {"vu_rows", &B::vu_rows},
-                                                 {"done", &B::done}};
+// Either record of planes.
+template <class Band>
+const std::vector<Field<Band>>& fields_of(const Band&) {
+    constexpr auto luma = reference::kLumaFields<Band>;
+    constexpr auto chroma = reference::kChromaFields<Band>;
+    static const std::vector<Field<Band>> fields = {{"luma's start row", luma.start_row},
+                                                    {"luma's top point", luma.top_point},
+                                                    {"luma's bottom point", luma.bottom_point},
+                                                    {"luma's row base", luma.row_base},
+                                                    {"luma's top left", luma.top_left},
+                                                    {"luma's top right", luma.top_right},
+                                                    {"luma's bottom left", luma.bottom_left},
+                                                    {"luma's bottom right", luma.bottom_right},
+                                                    {"luma's source offset", luma.src_offset},
+                                                    {"luma's rows", luma.rows},
+                                                    {"chroma's start row", chroma.start_row},
+                                                    {"chroma's top point", chroma.top_point},
+                                                    {"chroma's bottom point", chroma.bottom_point},
+                                                    {"chroma's row base", chroma.row_base},
+                                                    {"chroma's top left", chroma.top_left},
+                                                    {"chroma's top right", chroma.top_right},
+                                                    {"chroma's bottom left", chroma.bottom_left},
+                                                    {"chroma's bottom right", chroma.bottom_right},
+                                                    {"chroma's source offset", chroma.src_offset},
+                                                    {"chroma's rows", chroma.rows},
+                                                    {"src_width", &Band::src_width},
+                                                    {"src_height", &Band::src_height},
+                                                    {"src_row_bytes", &Band::src_row_bytes},
+                                                    {"src_rows", &Band::src_rows},
+                                                    {"dst_width", &Band::dst_width},
+                                                    {"dst_height", &Band::dst_height},
+                                                    {"band_rows", &Band::band_rows},
+                                                    {"done", &Band::done}};
     return fields;
 }
 

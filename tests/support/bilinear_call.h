@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "reference/bilinear.h"
+#include "support/bilinear_buffers.h"
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
 #include "support/random.h"
@@ -19,21 +20,6 @@ namespace ovrin_test {
 using BilinearResize = decltype(ov_bilinear_sg);
 using BilinearDefinition = void(const reference::BilinearGeometry&, int32_t, int32_t, int32_t,
                                 int32_t, reference::BilinearSource&, std::vector<uint8_t>&);
-
-struct BilinearCall {
-    int32_t src_w;  // arguments
-    int32_t src_h;
-    int32_t dst_w;
-    int32_t dst_h;
-    bool with_target;
-    reference::BilinearGeometry g;  // what the target says, or what holds without one
-};
-
-inline BilinearCall call_without_target(int32_t format, int32_t src_w, int32_t src_h, int32_t dst_w,
-                                        int32_t dst_h) {
-    return {src_w, src_h, dst_w,
-            dst_h, false, reference::packed_geometry(src_w, src_h, dst_w, dst_h, format)};
-}
 
 inline ::testing::Message describe(const BilinearCall& call) {
     ::testing::Message text;
@@ -47,74 +33,23 @@ inline ::testing::Message describe(const BilinearCall& call) {
     return text;
 }
 
-// Source buffers for a call, each as long as the definition reads and not a byte longer.
-class BilinearBuffers {
-public:
-    BilinearBuffers(const BilinearCall& call, const reference::BilinearSource& read, Random& random,
-                    Flush flush)
-        : call_(call),
-          luma_(content(random, call.with_target
-                                    ? read.luma.end
-                                    : reference::contiguous_end(read, call.src_w, call.src_h)),
-                flush),
-          u_(content(random, read.u.end), flush),
-          v_(content(random, read.v.end), flush),
-          vu_(content(random, read.vu.end), flush) {}
-
-    const uint8_t* src() const { return luma_.data(); }
-
-    reference::BilinearSource source() const {
-        if (!call_.with_target) {
-            return reference::contiguous_source(luma_.data(), call_.src_w, call_.src_h);
-        }
-        reference::BilinearSource result;
-        result.luma.bytes = luma_.data();
-        result.u.bytes = u_.data();
-        result.v.bytes = v_.data();
-        result.vu.bytes = vu_.data();
-        return result;
+// Either any bytes or only the two extremes, which make the sums wrap most.
+inline std::vector<uint8_t> any_or_extreme_bytes(Random& random, int64_t size) {
+    std::vector<uint8_t> bytes = random.bytes(static_cast<size_t>(size));
+    if (random.between(0, 1) == 0) {
+        for (uint8_t& byte : bytes) byte = byte & 1 ? 255 : 0;
     }
+    return bytes;
+}
 
-    // Fields that the engine has no use for hold values that would not go unnoticed.
-    ovrin_resize_target target() const {
-        ovrin_resize_target t;
-        memset(&t, 0x5A, sizeof t);
-        t.src_vu_plane = vu_.data();
-        t.src_u_plane = u_.data();
-        t.src_v_plane = v_.data();
-        t.src_width = call_.g.src_width;
-        t.src_height = call_.g.src_height;
-        t.src_stride = call_.g.src_stride;
-        t.src_buffer_height = call_.g.src_height;
-        t.format = call_.g.format;
-        t.dst = nullptr;
-        t.canvas_width = call_.g.canvas_width;
-        t.canvas_height = call_.g.canvas_height;
-        t.dst_x = call_.g.dst_x;
-        t.dst_y = call_.g.dst_y;
-        return t;
-    }
+using BilinearGuardedBuffers = BilinearBuffers<GuardedBuffer<uint8_t>>;
 
-private:
-    // Either any bytes or only the two extremes, which make the sums wrap most.
-    static std::vector<uint8_t> content(Random& random, int64_t size) {
-        std::vector<uint8_t> bytes = random.bytes(static_cast<size_t>(size));
-        if (random.between(0, 1) == 0) {
-            for (uint8_t& byte : bytes) byte = byte & 1 ? 255 : 0;
-        }
-        return bytes;
-    }
-
-    BilinearCall call_;
-    GuardedBuffer<uint8_t> luma_;
-    GuardedBuffer<uint8_t> u_;
-    GuardedBuffer<uint8_t> v_;
-    GuardedBuffer<uint8_t> vu_;
-};
-
-inline size_t canvas_bytes(const reference::BilinearGeometry& g) {
-    return static_cast<size_t>(reference::luma_bytes(g.canvas_width, g.canvas_height, g.format) +
-                               reference::chroma_bytes(g.canvas_width, g.canvas_height, g.format));
+inline BilinearGuardedBuffers bilinear_buffers(const BilinearCall& call,
+                                               const reference::BilinearSource& read,
+                                               Random& random, Flush flush) {
+    return {call, read, [&](int64_t size) {
+                return GuardedBuffer<uint8_t>(any_or_extreme_bytes(random, size), flush);
+            }};
 }
 
 inline void check_bilinear(BilinearResize* resize, BilinearDefinition* definition,
@@ -125,7 +60,7 @@ inline void check_bilinear(BilinearResize* resize, BilinearDefinition* definitio
     reference::BilinearSource read;
     definition(call.g, call.src_w, call.src_h, call.dst_w, call.dst_h, read, expected);
 
-    const BilinearBuffers buffers(call, read, random, flush);
+    const BilinearGuardedBuffers buffers = bilinear_buffers(call, read, random, flush);
     reference::BilinearSource source = buffers.source();
     std::fill(expected.begin(), expected.end(), fill);
     definition(call.g, call.src_w, call.src_h, call.dst_w, call.dst_h, source, expected);

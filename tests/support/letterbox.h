@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-// Target records for letterboxing.
+// Random target records for letterboxing, and comparing them.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -10,23 +10,9 @@
 #include <string>
 
 #include "support/random.h"
+#include "support/target_record.h"
 
 namespace ovrin_test {
-
-// A picture of dst_w x dst_h at (x, y) on a canvas. All other fields hold garbage, so that using
-// one shows.
-inline ovrin_resize_target letterbox(int32_t canvas_w, int32_t canvas_h, int32_t dst_w,
-                                     int32_t dst_h, int32_t x, int32_t y) {
-    ovrin_resize_target target;
-    memset(static_cast<void*>(&target), 0x5A, sizeof target);
-    target.canvas_width = canvas_w;
-    target.canvas_height = canvas_h;
-    target.dst_width = dst_w;
-    target.dst_height = dst_h;
-    target.dst_x = x;
-    target.dst_y = y;
-    return target;
-}
 
 // Pictures inside the canvas, across its edges and beyond them.
 inline ovrin_resize_target random_letterbox(Random& random) {
