@@ -200,26 +200,6 @@ else
     wait
 fi
 
-# An interrupted job leaves nothing behind.
-mkdir interrupted
-mkfifo never_ending
-for signal in INT TERM HUP; do
-    # Background jobs of a script ignore SIGINT unless told otherwise; env undoes that.
-    env --default-signal=INT "$tool" never_ending interrupted/out.y4m -s 16x8 2>stderr &
-    job=$!
-    exec 9>never_ending
-    y4m 1 >&9
-    for _ in $(seq 100); do
-        [ -n "$(ls -A interrupted)" ] && break
-        sleep 0.05
-    done
-    [ -n "$(ls -A interrupted)" ] || complain "no temporary file to interrupt"
-    kill -"$signal" "$job"
-    wait "$job" 2>/dev/null && complain "success after SIG$signal"
-    exec 9>&-
-    [ -z "$(ls -A interrupted)" ] || complain "files left after SIG$signal: $(ls -A interrupted)"
-done
-
 "$tool" in.y4m many.y4m -s 16x8 -v 2>stderr || complain "exit code $? of -v"
 grep -Eqx 'i420 32x16 to 16x8: 3 frames resized in [0-9]+\.[0-9]+ ms each' stderr ||
     complain "-v says: $(cat stderr)"
