@@ -126,7 +126,7 @@ int main(int argc, char** argv) {
         Picture sample;
         tool::open_source(argv[1], std::nullopt)->next(&sample);
         tool::OutputFile file(argv[2]);
-        tool::encode_png(draw_sheet(sample), file.stream());
+        tool::encode_png(draw_sheet(sample), {}, file.stream());
         file.commit();
     } catch (const std::exception& error) {
         std::cerr << "contact_sheet: " << error.what() << "\n";

@@ -159,6 +159,7 @@ void check_engine(Engine engine, PixelFormat format, const Placement& placement)
 
 void resize(Engine engine, const Picture& source, const Placement& placement, Picture* result) {
     result->has_alpha = source.has_alpha;
+    result->is_gray = source.is_gray;
     switch (engine) {
         case Engine::kQuarter:
             if (placement.on_canvas) return resize_on_canvas(source, placement, result);

@@ -33,6 +33,7 @@ struct Picture {
     Size size = {};
     std::vector<uint32_t> words;  // words because the library writes RGBA as words
     bool has_alpha = false;       // of RGBA; false: A means nothing and image files leave it out
+    bool is_gray = false;         // of RGBA: R, G and B are equal everywhere
 };
 
 }  // namespace tool

@@ -17,12 +17,12 @@ constexpr size_t kPeekBytes = 16;
 // An image file: one picture.
 class Still : public Source {
 public:
-    using Decode = Picture(const uint8_t*, size_t);
+    using Decode = Picture(const uint8_t*, size_t, Metadata*);
 
     Still(Input input, Container container, Decode* decode)
         : Source(std::move(input), {container, PixelFormat::kRgba}) {
         const std::vector<uint8_t> file = input_.read_all();
-        picture_ = decode(file.data(), file.size());
+        picture_ = decode(file.data(), file.size(), &metadata_);
         size_ = picture_->size;
     }
 

@@ -1,0 +1,110 @@
+# SPDX-License-Identifier: Apache-2.0
+# shellcheck shell=bash
+# Sourced by cases_test.sh: pictures made by programs other than ours, and what the tables ask of them.
+
+profiles=/usr/share/color/icc  # of Debian's icc-profiles-free
+
+# photoN.jpg: one scene, stored in each of EXIF's eight ways to lie; the scene itself is upright.png.
+make_photographs() {
+    local n
+    local -a stored=('' '' '-flop' '-rotate 180' '-flip' '-transpose' '-rotate 270' '-transverse'
+        '-rotate 90')
+    convert -size 400x300 gradient:red-blue -seed 1 -swirl 90 -fill white -draw 'circle 90,90 130,90' \
+        -fill black -draw 'rectangle 250,200 390,290' upright.png
+    convert upright.png -resize 160x120 thumbnail.jpg
+    for n in 1 2 3 4 5 6 7 8; do
+        # shellcheck disable=SC2086 # words
+        convert upright.png ${stored[n]} -quality 95 "photo$n.jpg"
+        exiftool -q -overwrite_original -n "-Orientation=$n" -Make=Maker -ISO=200 \
+            "-ThumbnailImage<=thumbnail.jpg" -ExifImageWidth=400 "photo$n.jpg"
+        convert "photo$n.jpg" "photo$n.png"
+        exiftool -q -overwrite_original -n "-Orientation=$n" "photo$n.png" 2>exiftool.log
+    done
+    for n in 0 9 60000; do
+        cp photo1.jpg "photo_of_$n.jpg"
+        exiftool -q -overwrite_original -n "-Orientation=$n" "photo_of_$n.jpg"
+    done
+    # EXIF that is damaged: its first directory lies outside.
+    LC_ALL=C sed 's/Exif\x00\x00MM\x00\*\x00\x00\x00\x08/Exif\x00\x00MM\x00*\x7f\xff\x00\x08/' photo6.jpg \
+        >damaged_exif.jpg
+}
+
+# Pictures that say what their colours mean, in every way there is.
+make_coloured() {
+    local type
+    convert -size 60x40 gradient:'#203040'-'#c0b0a0' -strip PNG24:plain.png
+    convert plain.png plain.jpg
+    convert plain.png -colorspace Gray -strip gray.png
+    convert gray.png gray.jpg
+    convert gray.png -alpha set -channel A -evaluate set 50% gray_alpha.png
+    for type in png jpg; do
+        exiftool -q "-ICC_Profile<=$profiles/compatibleWithAdobeRGB1998.icc" -o "wide.$type" "plain.$type"
+        exiftool -q "-ICC_Profile<=$profiles/Gray.icc" -o "gray_profile.$type" "gray.$type"
+    done
+    # Longer than one marker of a JPEG.
+    exiftool -q "-ICC_Profile<=$profiles/ITULab.icc" -o long_profile.jpg plain.jpg
+    # A profile for colours in a file of greys.
+    exiftool -q "-ICC_Profile<=$profiles/sRGB.icc" -o gray_in_colours.jpg gray.jpg
+    exiftool -q -n -SRGBRendering=1 -o srgb.png plain.png
+    exiftool -q -n -ColorSpace=1 -o exif_srgb.jpg plain.jpg
+    exiftool -q -n -ColorSpace=65535 -o exif_uncalibrated.jpg plain.jpg
+    exiftool -q -Gamma=1 -o linear.png plain.png
+    convert plain.png -density 300 -units PixelsPerInch 300dpi.png
+    convert plain.png -density 300 -units PixelsPerInch 300dpi.jpg
+    convert plain.png -density 100x50 -units PixelsPerCentimeter 100dpcm.jpg
+    exiftool -q -n -Orientation=6 -o 100dpcm6.jpg 100dpcm.jpg
+    convert plain.png -density 3x2 -units Undefined pixels_of_3x2.jpg
+    convert plain.png -depth 16 deep.png
+    convert plain.png -colors 8 PNG8:palette.png
+    convert gray.png -depth 1 -threshold 50% bits.png
+    convert plain.png -interlace PNG interlaced.png
+    convert plain.png -interlace JPEG progressive.jpg
+}
+
+make_fixtures() {
+    make_photographs
+    make_coloured
+}
+
+# tag NAME FILE: what exiftool says; nothing where there is none.
+tag() {
+    exiftool -s3 -n "-$1" "$2"
+}
+
+# like FILE REFERENCE: whether FILE shows what REFERENCE, scaled to its size, shows.
+like() {
+    local psnr
+    convert "$1" -strip PNG32:seen.png
+    convert "$2" -strip -resize "$(identify -format '%wx%h!' seen.png)" -depth 8 PNG32:expected.png
+    psnr=$(compare -metric PSNR seen.png expected.png null: 2>&1)
+    awk -v psnr="$psnr" 'BEGIN { print (psnr == "inf" || psnr >= 25) ? "yes" : "no: " psnr " dB" }'
+}
+
+# pixel FILE X,Y: its channels, 0 to 255, alpha where the file has it.
+pixel() {
+    convert "$1" -depth 8 -format "%[pixel:p{$2}]" info: |
+        sed -E 's/^s?rgba?\((.*)\)$/\1/; s/^graya?\((.*)\)$/\1/; s/^black$/0,0,0/; s/^white$/255,255,255/'
+}
+
+# profile FILE: the hash of its colour profile, which is that of the file itself; nothing without one.
+profile() {
+    exiftool -b -ICC_Profile "$1" >seen.icc
+    [ ! -s seen.icc ] || md5sum <seen.icc | cut -c 1-8
+}
+
+profile_of() {
+    md5sum <"$profiles/$1.icc" | cut -c 1-8
+}
+
+# chunks FILE: those of a PNG that say something about colours.
+chunks() {
+    pngcheck -v "$1" | grep -oE 'chunk (sRGB|iCCP|gAMA|cHRM)' | cut -d ' ' -f 2 | paste -sd ' '
+}
+
+# channels FILE: of the file itself, not of what a reader makes of it.
+channels() {
+    case $1 in
+        *.png) pngcheck -v "$1" | grep -oE '(grayscale|RGB)(\+alpha)?' | head -n 1 ;;
+        *.jpg) exiftool -s3 -n -ColorComponents "$1" ;;
+    esac
+}

@@ -1,0 +1,99 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "job.h"
+
+#include <chrono>
+#include <iomanip>
+#include <iostream>
+#include <memory>
+
+#include "error.h"
+#include "file_kind.h"
+#include "metadata.h"
+#include "output_file.h"
+#include "progress.h"
+#include "resizer.h"
+#include "sink.h"
+#include "source.h"
+
+namespace tool {
+
+namespace {
+
+class Stopwatch {
+public:
+    template <class Action>
+    void time(Action action) {
+        const auto start = std::chrono::steady_clock::now();
+        action();
+        elapsed_ += std::chrono::steady_clock::now() - start;
+    }
+
+    double milliseconds() const { return elapsed_.count(); }
+
+private:
+    std::chrono::duration<double, std::milli> elapsed_ = {};
+};
+
+void report(const Source& source, const Placement& placement, int64_t frames, double milliseconds) {
+    std::cerr << name_of(source.kind().format) << " " << to_string(source.size()) << " to "
+              << to_string(placement.picture);
+    if (placement.on_canvas) std::cerr << " on " << to_string(placement.result);
+    std::cerr << ": " << std::fixed << std::setprecision(3);
+    if (frames == 1) {
+        std::cerr << "resized in " << milliseconds << " ms\n";
+    } else {
+        std::cerr << frames << " frames resized in " << milliseconds / static_cast<double>(frames)
+                  << " ms each\n";
+    }
+}
+
+std::optional<Y4mHeader> resized_header(const Source& source, const Placement& placement) {
+    if (!source.y4m_header()) return std::nullopt;
+    return resized_y4m_header(*source.y4m_header(), placement.picture, placement.result,
+                              placement.keeps_aspect);
+}
+
+SinkSettings settings_of(const Options& options, const Source& source, const Placement& placement) {
+    SinkSettings settings = {resized_header(source, placement), {}, options.quality};
+    if (!options.strip) {
+        settings.metadata = resized_metadata(source.metadata(), placement.result, options.rotate);
+    }
+    return settings;
+}
+
+}  // namespace
+
+void run(const Options& options) {
+    std::optional<RawLayout> raw;
+    if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
+    const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
+    const PixelFormat format = source->kind().format;
+    const FileKind out_kind = concerning(options.out, [&] {
+        return options.out == "-" ? source->kind() : kind_of_name(options.out);
+    });
+    check_conversion(source->kind(), out_kind);
+    const Orientation orientation =
+        options.rotate ? orientation_of(source->metadata()) : Orientation::kUpright;
+    const Placement placement = place(options.wish, turned(source->size(), orientation), format);
+    const Resizer resizer(options.engine, placement, format, orientation);
+
+    OutputFile file(options.out);
+    Sink sink(out_kind, settings_of(options, *source, placement), file.stream());
+    Picture frame;
+    Picture result;
+    Stopwatch resizing;
+    int64_t frames = 0;
+    {
+        Progress progress;
+        while (concerning(options.in, [&] { return source->next(&frame); })) {
+            resizing.time([&] { resizer(&frame, &result); });
+            concerning(options.out, [&] { sink.write(result); });
+            progress.update(++frames, source->part_read());
+        }
+    }
+    if (frames == 0) throw Error(options.in + ": holds no frame");
+    file.commit();
+    if (options.verbose) report(*source, placement, frames, resizing.milliseconds());
+}
+
+}  // namespace tool

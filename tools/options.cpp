@@ -1,0 +1,162 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "options.h"
+
+#include <initializer_list>
+#include <memory>
+#include <utility>
+#include <vector>
+
+#include "error.h"
+
+namespace tool {
+
+namespace {
+
+// CLI11's help in the look of other command-line tools: "-s, --size WxH", and defaults in words.
+class HelpFormatter : public CLI::Formatter {
+public:
+    HelpFormatter() {
+        column_width(26);
+        label("Positionals", "Arguments");
+    }
+
+    std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
+        return "Usage: ovrinresize IN OUT --size WxH [OPTION]...\n";
+    }
+
+    std::string make_option_name(const CLI::Option* option, bool is_positional) const override {
+        std::string name = Formatter::make_option_name(option, is_positional);
+        const size_t comma = name.find(',');
+        if (comma != std::string::npos) name.insert(comma + 1, " ");
+        return name;
+    }
+
+    std::string make_option_opts(const CLI::Option* option) const override {
+        return option->get_type_name().empty() ? "" : " " + option->get_type_name();
+    }
+};
+
+[[noreturn]] void reject(const std::string& names, const std::string& why) {
+    throw CLI::ValidationError(names.substr(names.find("--")), why);
+}
+
+void add_size(CLI::App* app, const std::string& names, std::optional<Size>* size,
+              const std::string& help) {
+    const auto parse = [size, names](const std::string& text) {
+        try {
+            *size = parse_size(text);
+        } catch (const Error& error) {
+            reject(names, error.what());
+        }
+    };
+    app->add_option_function<std::string>(names, parse, help)->type_name("WxH");
+}
+
+// An option whose value is one of a few words. Target: a Value, or an optional one.
+template <class Target, class Value>
+void add_choice(CLI::App* app, const std::string& names, const std::string& type_name,
+                Target* target, std::initializer_list<std::pair<const char*, Value>> choices,
+                const std::string& help) {
+    const std::vector<std::pair<const char*, Value>> known(choices);
+    const auto parse = [target, names, known](const std::string& text) {
+        std::string words;
+        for (const auto& [word, value] : known) {
+            if (text == word) {
+                *target = value;
+                return;
+            }
+            words += std::string(" ") + word;
+        }
+        reject(names, "'" + text + "' is none of:" + words);
+    };
+    app->add_option_function<std::string>(names, parse, help)->type_name(type_name);
+}
+
+void add_switch_off(CLI::App* app, const std::string& name, bool* value, const std::string& help) {
+    app->add_flag_callback(
+        name, [value] { *value = false; }, help);
+}
+
+void declare_files(CLI::App* app, Options* options) {
+    app->add_option(
+           "IN", options->in,
+           "PNG, JPEG, binary PPM, Y4M or, with --format, raw frames;\n- is standard input")
+        ->required()
+        ->type_name("");
+    app->add_option("OUT", options->out,
+                    "Its name ends in .png, .jpg, .jpeg, .ppm, .y4m, or for raw frames\n"
+                    "in .nv21, .i420, .yuv, .rgba, .rgb; - is standard output, with\n"
+                    "the type of IN")
+        ->required()
+        ->type_name("");
+    add_choice<std::optional<PixelFormat>, PixelFormat>(
+        app, "--format", "FORMAT", &options->raw_format,
+        {{"nv21", PixelFormat::kNv21},
+         {"i420", PixelFormat::kI420},
+         {"rgba", PixelFormat::kRgba},
+         {"rgb", PixelFormat::kRgb}},
+        "IN holds raw frames: nv21, i420, rgba or rgb");
+    add_size(app, "--input-size", &options->raw_size, "Size of the raw frames");
+    app->get_option("--format")->needs("--input-size");
+    app->get_option("--input-size")->needs("--format");
+}
+
+void declare_resizing(CLI::App* app, Options* options) {
+    add_size(app, "-s,--size", &options->wish.size, "Size of the scaled picture, like 640x480");
+    add_size(app, "-c,--canvas", &options->wish.canvas,
+             "Put it in the middle of a black canvas of this size, which it\n"
+             "fills unless there is a --size");
+    add_choice<std::optional<Fit>, Fit>(
+        app, "-f,--fit", "MODE", &options->wish.fit,
+        {{"exact", Fit::kExact}, {"contain", Fit::kContain}},
+        "exact: stretch to the size (the default without --canvas);\n"
+        "contain: the largest picture that fits into the size and keeps\n"
+        "its proportions (the default with --canvas)");
+    add_choice<Engine, Engine>(app, "-e,--engine", "NAME", &options->engine,
+                               {{"quarter", Engine::kQuarter},
+                                {"bilinear", Engine::kBilinear},
+                                {"lanczos", Engine::kLanczos},
+                                {"nearest", Engine::kNearest}},
+                               "Resampler: quarter (the default), bilinear, lanczos or nearest");
+}
+
+void declare(CLI::App* app, Options* options) {
+    app->formatter(std::make_shared<HelpFormatter>());
+    declare_resizing(app, options);
+    declare_files(app, options);
+    app->add_option("-q,--quality", options->quality, "JPEG quality, 1 to 100; 90 by default")
+        ->type_name("N")
+        ->check(CLI::Range(1, 100).description(""));
+    add_switch_off(app, "--no-rotate", &options->rotate,
+                   "Leave pixels and the orientation that a camera recorded as they are;\n"
+                   "otherwise the result is upright");
+    app->add_flag("--strip", options->strip,
+                  "Drop colour profile, EXIF and all other metadata, which OUT keeps\n"
+                  "where its type can hold them");
+    app->add_flag("-v,--verbose", options->verbose,
+                  "Say on standard error what was done and how long the resizing took");
+    app->set_help_flag("-h,--help", "Print this help and exit");
+    app->set_version_flag("-V,--version", "ovrinresize " OVRINRESIZE_VERSION,
+                          "Print the version and exit");
+    app->footer(
+        "The content of IN decides what it is, not its name. PNG keeps an alpha channel; JPEG and\n"
+        "PPM drop it and keep the colours as they are. See ovrinresize(1) for the details.\n"
+        "\n"
+        "Examples:\n"
+        "  ovrinresize photo.jpg small.jpg --size 1024x768\n"
+        "  ovrinresize photo.jpg screen.png --canvas 1920x1080\n"
+        "  ovrinresize camera.nv21 small.nv21 --format nv21 --input-size 4000x3000 -s 1000x750\n"
+        "  ffmpeg -i film.mp4 -f yuv4mpegpipe - | ovrinresize - - -s 640x360 | ffplay -");
+}
+
+}  // namespace
+
+void parse(int argc, char** argv, CLI::App* app, Options* options) {
+    declare(app, options);
+    app->parse(argc, argv);
+    if (!options->wish.size && !options->wish.canvas) {
+        throw CLI::RequiredError("--size or --canvas");
+    }
+}
+
+}  // namespace tool

@@ -1,0 +1,31 @@
+// SPDX-License-Identifier: Apache-2.0
+// The command line.
+#pragma once
+
+#include <CLI/CLI.hpp>
+#include <optional>
+#include <string>
+
+#include "engine.h"
+#include "picture.h"
+#include "placement.h"
+
+namespace tool {
+
+struct Options {
+    std::string in;
+    std::string out;
+    Wish wish;
+    Engine engine = Engine::kQuarter;
+    int quality = 90;
+    std::optional<PixelFormat> raw_format;
+    std::optional<Size> raw_size;
+    bool rotate = true;
+    bool strip = false;
+    bool verbose = false;
+};
+
+// Reads the command line into *options. Throws what CLI11 throws: errors, and requests for help.
+void parse(int argc, char** argv, CLI::App* app, Options* options);
+
+}  // namespace tool
