@@ -101,8 +101,7 @@ Picture draw_sheet(const Picture& sample) {
         const char* const suffixes[] = {", to a third", ", 4.5 times as large"};
         for (const Picture* source : {&large, &small}) {
             Picture tile({kTile, kTile});
-            tool::resize(resampler.engine, *source, {false, true, tile.size, tile.size, 0, 0},
-                         &tile);
+            tool::resize(resampler.engine, *source, &tile);
             write(&sheet, (std::string(resampler.label) + suffixes[source == &small]).c_str(),
                   {x + 2.0, y - 9.0}, 14);
             paste(&sheet, tile, x, y);

@@ -61,15 +61,6 @@ void place_yuv(const Picture& source, const Placement& placement, Picture* canva
     ovrin_resize_y_u_v_keep_ratio(luma, chroma, v, width, height, &target);
 }
 
-void resize_on_canvas(const Picture& source, const Placement& placement, Picture* canvas) {
-    if (has_chroma_planes(source.format)) return place_yuv(source, placement, canvas);
-    if (source.format == PixelFormat::kRgba) return place_rgba(source, placement, canvas);
-    // The library places no RGB; RGBA gives the same bytes.
-    Picture rgba(placement.result);
-    place_rgba(converted(source, PixelFormat::kRgba), placement, &rgba);
-    *canvas = converted(rgba, PixelFormat::kRgb);
-}
-
 void resize_nearest(const Picture& source, Picture* result) {
     ovrin_resize_nearest_rgba8888(source.words.data(), result->words.data(), source.size.width,
                                   source.size.height, result->size.width, result->size.height);
@@ -131,38 +122,19 @@ void resize_lanczos(const Picture& source, Picture* result) {
                          result->size.width, result->size.height, 4);
 }
 
-const char* name_of(Engine engine) {
-    switch (engine) {
-        case Engine::kQuarter:
-            return "quarter";
-        case Engine::kBilinear:
-            return "bilinear";
-        case Engine::kLanczos:
-            return "lanczos";
-        case Engine::kNearest:
-            return "nearest";
-    }
-    return "";
-}
-
 }  // namespace
 
-void check_engine(Engine engine, PixelFormat format, const Placement& placement) {
-    if (engine == Engine::kQuarter) return;
+void check_engine(Engine engine, PixelFormat format) {
     if (engine == Engine::kNearest && format != PixelFormat::kRgba) {
         throw Error(std::string("the nearest engine handles rgba, not ") + name_of(format));
     }
-    if (placement.on_canvas) {
-        throw Error(std::string("the ") + name_of(engine) + " engine knows no canvas");
-    }
 }
 
-void resize(Engine engine, const Picture& source, const Placement& placement, Picture* result) {
+void resize(Engine engine, const Picture& source, Picture* result) {
     result->has_alpha = source.has_alpha;
     result->is_gray = source.is_gray;
     switch (engine) {
         case Engine::kQuarter:
-            if (placement.on_canvas) return resize_on_canvas(source, placement, result);
             return resize_whole(source, result);
         case Engine::kBilinear:
             if (source.format == PixelFormat::kRgb) return resize_rgb_bilinear(source, result);
@@ -172,6 +144,21 @@ void resize(Engine engine, const Picture& source, const Placement& placement, Pi
         case Engine::kNearest:
             return resize_nearest(source, result);
     }
+}
+
+void resize_onto_canvas(const Picture& source, const Placement& placement, Picture* canvas) {
+    canvas->has_alpha = source.has_alpha;
+    canvas->is_gray = source.is_gray;
+    if (has_chroma_planes(source.format)) return place_yuv(source, placement, canvas);
+    if (source.format == PixelFormat::kRgba) return place_rgba(source, placement, canvas);
+    // The library places no RGB; RGBA gives the same bytes.
+    Picture rgba(placement.result);
+    place_rgba(converted(source, PixelFormat::kRgba), placement, &rgba);
+    *canvas = converted(rgba, PixelFormat::kRgb);
+}
+
+int white_of(Engine engine) {
+    return engine == Engine::kQuarter ? 252 : 255;
 }
 
 }  // namespace tool

@@ -11,11 +11,16 @@ namespace tool {
 
 enum class Engine { kQuarter, kBilinear, kLanczos, kNearest };
 
-// Throws Error when the engine cannot do that with pictures of this format.
-void check_engine(Engine engine, PixelFormat format, const Placement& placement);
+// Throws Error when the engine cannot resize pictures of this format.
+void check_engine(Engine engine, PixelFormat format);
 
-// Resizes into *result, which has the source's format and the placement's size. The engine has
-// passed check_engine().
-void resize(Engine engine, const Picture& source, const Placement& placement, Picture* result);
+// Resizes into *result, which has the source's format. The engine has passed check_engine().
+void resize(Engine engine, const Picture& source, Picture* result);
+
+// The quarter engine, straight onto a black, transparent canvas.
+void resize_onto_canvas(const Picture& source, const Placement& placement, Picture* canvas);
+
+// What the engine makes of white and of full alpha, 255.
+int white_of(Engine engine);
 
 }  // namespace tool

@@ -53,6 +53,11 @@ std::optional<Y4mHeader> resized_header(const Source& source, const Placement& p
                               placement.keeps_aspect);
 }
 
+std::optional<Color> background_of(const Options& options, FileKind out) {
+    if (options.background || holds_alpha(out)) return options.background;
+    return kWhite;
+}
+
 SinkSettings settings_of(const Options& options, const Source& source, const Placement& placement) {
     SinkSettings settings = {resized_header(source, placement), {}, options.quality};
     if (!options.strip) {
@@ -75,7 +80,14 @@ void run(const Options& options) {
     const Orientation orientation =
         options.rotate ? orientation_of(source->metadata()) : Orientation::kUpright;
     const Placement placement = place(options.wish, turned(source->size(), orientation), format);
-    const Resizer resizer(options.engine, placement, format, orientation);
+    check_engine(options.engine, format);
+    const Resizing how = {options.engine,
+                          placement,
+                          orientation,
+                          background_of(options, out_kind),
+                          options.background,
+                          options.premultiply,
+                          is_image_file(source->kind())};
 
     OutputFile file(options.out);
     Sink sink(out_kind, settings_of(options, *source, placement), file.stream());
@@ -86,7 +98,7 @@ void run(const Options& options) {
     {
         Progress progress;
         while (concerning(options.in, [&] { return source->next(&frame); })) {
-            resizing.time([&] { resizer(&frame, &result); });
+            resizing.time([&] { resize(how, &frame, &result); });
             concerning(options.out, [&] { sink.write(result); });
             progress.update(++frames, source->part_read());
         }

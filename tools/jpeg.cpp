@@ -169,12 +169,12 @@ void set_density(jpeg_compress_struct* codec, const Density& density) {
     codec->Y_density = static_cast<UINT16>(y);
 }
 
-void write_metadata(jpeg_compress_struct* codec, const Metadata& metadata) {
+void write_metadata(jpeg_compress_struct* codec, const Picture& picture, const Metadata& metadata) {
     if (!metadata.exif.empty() && metadata.exif.size() <= kMaxMarkerContent) {
         jpeg_write_marker(codec, kExifMarker, metadata.exif.data(),
                           static_cast<unsigned>(metadata.exif.size()));
     }
-    if (!metadata.icc.empty()) {
+    if (has_fitting_profile(picture, metadata)) {
         jpeg_write_icc_profile(codec, metadata.icc.data(),
                                static_cast<unsigned>(metadata.icc.size()));
     }
@@ -210,7 +210,7 @@ bool write_picture(Encoder* encoder, const Encoding& encoding, FILE* out) {
     jpeg_set_quality(codec, encoding.quality, TRUE);
     if (encoding.metadata.density) set_density(codec, *encoding.metadata.density);
     jpeg_start_compress(codec, TRUE);
-    write_metadata(codec, encoding.metadata);
+    write_metadata(codec, encoding.picture, encoding.metadata);
     while (codec->next_scanline < codec->image_height) {
         JSAMPROW row = row_of(encoding, codec->next_scanline);
         jpeg_write_scanlines(codec, &row, 1);

@@ -8,6 +8,16 @@
 
 namespace tool {
 
+namespace {
+
+bool is_gray_profile(const Bytes& icc) {
+    constexpr size_t kColorSpaceOffset = 16;
+    return icc.size() >= kColorSpaceOffset + 4 &&
+           memcmp(icc.data() + kColorSpaceOffset, "GRAY", 4) == 0;
+}
+
+}  // namespace
+
 Metadata resized_metadata(const Metadata& source, Size size, bool is_turned) {
     Metadata metadata = source;
     if (!source.exif.empty()) metadata.exif = resized_exif(source.exif, size, is_turned);
@@ -22,14 +32,12 @@ Orientation orientation_of(const Metadata& metadata) {
     return value >= 1 && value <= 8 ? static_cast<Orientation>(value) : Orientation::kUpright;
 }
 
-bool is_gray_profile(const Bytes& icc) {
-    constexpr size_t kColorSpaceOffset = 16;
-    return icc.size() >= kColorSpaceOffset + 4 &&
-           memcmp(icc.data() + kColorSpaceOffset, "GRAY", 4) == 0;
-}
-
 bool is_gray_file(const Picture& picture, const Metadata& metadata) {
     return picture.is_gray && (metadata.icc.empty() || is_gray_profile(metadata.icc));
+}
+
+bool has_fitting_profile(const Picture& picture, const Metadata& metadata) {
+    return !metadata.icc.empty() && (picture.is_gray || !is_gray_profile(metadata.icc));
 }
 
 }  // namespace tool

@@ -42,10 +42,10 @@ Metadata resized_metadata(const Metadata& source, Size size, bool is_turned);
 // Of the picture as it is stored; kUpright where nothing or nonsense is said.
 Orientation orientation_of(const Metadata& metadata);
 
-// Whether a profile is one for grey pictures.
-bool is_gray_profile(const Bytes& icc);
-
 // Whether a picture is to be written as a grey one. Profiles for colours fit no grey file.
 bool is_gray_file(const Picture& picture, const Metadata& metadata);
+
+// Whether there is a profile that fits the picture: one for greys does not fit colours.
+bool has_fitting_profile(const Picture& picture, const Metadata& metadata);
 
 }  // namespace tool

@@ -28,6 +28,9 @@ public:
         std::string name = Formatter::make_option_name(option, is_positional);
         const size_t comma = name.find(',');
         if (comma != std::string::npos) name.insert(comma + 1, " ");
+        // What CLI11 adds to the name of a switch that is turned off.
+        const size_t brace = name.find('{');
+        if (brace != std::string::npos) name.erase(brace);
         return name;
     }
 
@@ -50,6 +53,18 @@ void add_size(CLI::App* app, const std::string& names, std::optional<Size>* size
         }
     };
     app->add_option_function<std::string>(names, parse, help)->type_name("WxH");
+}
+
+void add_color(CLI::App* app, const std::string& name, std::optional<Color>* color,
+               const std::string& help) {
+    const auto parse = [color, name](const std::string& text) {
+        try {
+            *color = parse_color(text);
+        } catch (const Error& error) {
+            reject(name, error.what());
+        }
+    };
+    app->add_option_function<std::string>(name, parse, help)->type_name("COLOUR");
 }
 
 // An option whose value is one of a few words. Target: a Value, or an optional one.
@@ -127,6 +142,13 @@ void declare(CLI::App* app, Options* options) {
     app->add_option("-q,--quality", options->quality, "JPEG quality, 1 to 100; 90 by default")
         ->type_name("N")
         ->check(CLI::Range(1, 100).description(""));
+    add_color(app, "--background", &options->background,
+              "Colour behind what is transparent, and of the canvas: #rrggbb, #rgb\n"
+              "or a name. Without it PNG stays transparent, JPEG and others get\n"
+              "white, and the canvas is black");
+    app->add_flag("--premultiply,!--no-premultiply", options->premultiply,
+                  "Whether colours count as much as they are opaque, so that those of\n"
+                  "transparent pixels do not show; they do unless told otherwise");
     add_switch_off(app, "--no-rotate", &options->rotate,
                    "Leave pixels and the orientation that a camera recorded as they are;\n"
                    "otherwise the result is upright");
@@ -139,8 +161,8 @@ void declare(CLI::App* app, Options* options) {
     app->set_version_flag("-V,--version", "ovrinresize " OVRINRESIZE_VERSION,
                           "Print the version and exit");
     app->footer(
-        "The content of IN decides what it is, not its name. PNG keeps an alpha channel; JPEG and\n"
-        "PPM drop it and keep the colours as they are. See ovrinresize(1) for the details.\n"
+        "The content of IN decides what it is, not its name. An older OUT is replaced.\n"
+        "See ovrinresize(1) for the details.\n"
         "\n"
         "Examples:\n"
         "  ovrinresize photo.jpg small.jpg --size 1024x768\n"

@@ -6,6 +6,7 @@
 #include <optional>
 #include <string>
 
+#include "color.h"
 #include "engine.h"
 #include "picture.h"
 #include "placement.h"
@@ -20,6 +21,8 @@ struct Options {
     int quality = 90;
     std::optional<PixelFormat> raw_format;
     std::optional<Size> raw_size;
+    std::optional<Color> background;
+    bool premultiply = true;
     bool rotate = true;
     bool strip = false;
     bool verbose = false;

@@ -182,9 +182,9 @@ Metadata read_metadata(const Decoder& decoder) {
 
 // ---- Writing ----
 
-void write_colors(const Encoder& encoder, const Metadata& metadata) {
+void write_colors(const Encoder& encoder, const Picture& picture, const Metadata& metadata) {
     png_structp const png = encoder.png;
-    if (!metadata.icc.empty()) {
+    if (has_fitting_profile(picture, metadata)) {
         png_set_iCCP(png, encoder.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE,
                      metadata.icc.data(), static_cast<png_uint_32>(metadata.icc.size()));
     } else if (metadata.srgb_intent) {
@@ -199,8 +199,8 @@ void write_colors(const Encoder& encoder, const Metadata& metadata) {
     }
 }
 
-void write_metadata(const Encoder& encoder, const Metadata& metadata) {
-    write_colors(encoder, metadata);
+void write_metadata(const Encoder& encoder, const Picture& picture, const Metadata& metadata) {
+    write_colors(encoder, picture, metadata);
     if (metadata.density) {
         const auto rounded = [](double value) { return static_cast<png_uint_32>(value + 0.5); };
         png_set_pHYs(encoder.png, encoder.info, rounded(metadata.density->x),
@@ -242,7 +242,7 @@ bool write_picture(Encoder* encoder, const Picture& picture, const Metadata& met
     const auto height = static_cast<png_uint_32>(picture.size.height);
     png_set_IHDR(png, encoder->info, width, height, 8, colors, PNG_INTERLACE_NONE,
                  PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
-    write_metadata(*encoder, metadata);
+    write_metadata(*encoder, picture, metadata);
     png_write_info(png, encoder->info);
     for (png_uint_32 y = 0; y < height; ++y) {
         pack_row(picture.bytes() + size_t{y} * width * 4, width, colors, row);

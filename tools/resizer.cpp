@@ -1,35 +1,54 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "resizer.h"
 
+#include "alpha.h"
+#include "canvas.h"
+
 namespace tool {
 
-Resizer::Resizer(Engine engine, const Placement& placement, PixelFormat format,
-                 Orientation orientation)
-    : engine_(engine), placement_(placement), orientation_(orientation) {
-    check_engine(engine, format, placement);
+namespace {
+
+void resize_and_place(const Resizing& resizing, const Placement& placement, const Picture& frame,
+                      Picture* result) {
+    const bool draws_canvas =
+        placement.on_canvas && (resizing.engine != Engine::kQuarter || resizing.canvas);
+    if (draws_canvas) {
+        Picture picture(placement.picture, frame.format);
+        resize(resizing.engine, frame, &picture);
+        *result = on_canvas(picture, placement, resizing.canvas);
+        return;
+    }
+    if (result->words.empty()) *result = Picture(placement.result, frame.format);
+    if (placement.on_canvas) return resize_onto_canvas(frame, placement, result);
+    resize(resizing.engine, frame, result);
 }
 
-void Resizer::operator()(Picture* frame, Picture* result) const {
-    if (orientation_ != Orientation::kUpright) return turn_and_resize(frame, result);
-    resize_into(*frame, placement_, result);
-}
-
-// Turns the smaller of the two, and drops what it no longer needs: memory for two of them is
-// enough.
-void Resizer::turn_and_resize(Picture* frame, Picture* result) const {
-    if (frame->size.pixels() < placement_.result.pixels()) {
-        *frame = turned(*frame, orientation_);
-        return resize_into(*frame, placement_, result);
+// Turns the smaller of the two, and drops what is no longer needed: memory for two is enough.
+void resize_and_turn(const Resizing& resizing, Picture* frame, Picture* result) {
+    if (frame->size.pixels() < resizing.placement.result.pixels()) {
+        *frame = turned(*frame, resizing.orientation);
+        return resize_and_place(resizing, resizing.placement, *frame, result);
     }
     Picture stored;
-    resize_into(*frame, stored_placement(placement_, orientation_), &stored);
+    resize_and_place(resizing, stored_placement(resizing.placement, resizing.orientation), *frame,
+                     &stored);
     *frame = Picture();
-    *result = turned(stored, orientation_);
+    *result = turned(stored, resizing.orientation);
 }
 
-void Resizer::resize_into(const Picture& frame, const Placement& placement, Picture* result) const {
-    if (result->words.empty()) *result = Picture(placement.result, frame.format);
-    resize(engine_, frame, placement, result);
+}  // namespace
+
+void resize(const Resizing& resizing, Picture* frame, Picture* result) {
+    if (frame->has_alpha && resizing.background) flatten(frame, *resizing.background);
+    const bool weighs_colors = frame->has_alpha && resizing.premultiply;
+    if (weighs_colors) premultiply(frame);
+    if (resizing.orientation == Orientation::kUpright) {
+        resize_and_place(resizing, resizing.placement, *frame, result);
+    } else {
+        resize_and_turn(resizing, frame, result);
+    }
+    if (weighs_colors) unpremultiply(result, white_of(resizing.engine));
+    if (!result->has_alpha && resizing.fills_alpha) make_opaque(result);
 }
 
 }  // namespace tool

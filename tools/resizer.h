@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <optional>
+
+#include "color.h"
 #include "engine.h"
 #include "orientation.h"
 #include "picture.h"
@@ -9,21 +12,17 @@
 namespace tool {
 
 // What happens to the pixels of every frame of a job.
-class Resizer {
-public:
-    // placement: of the upright picture. Throws Error when the engine cannot do that.
-    Resizer(Engine engine, const Placement& placement, PixelFormat format, Orientation orientation);
-
-    // May use up *frame. *result is empty or holds the one before.
-    void operator()(Picture* frame, Picture* result) const;
-
-private:
-    void resize_into(const Picture& frame, const Placement& placement, Picture* result) const;
-    void turn_and_resize(Picture* frame, Picture* result) const;
-
-    Engine engine_;
-    Placement placement_;
-    Orientation orientation_;
+struct Resizing {
+    Engine engine;
+    Placement placement;  // of the upright picture
+    Orientation orientation = Orientation::kUpright;
+    std::optional<Color> background;  // behind what is transparent
+    std::optional<Color> canvas;      // of the canvas; otherwise black, and transparent
+    bool premultiply = true;          // colours count as much as they are opaque
+    bool fills_alpha = false;         // alpha of a picture without any is 255
 };
+
+// Resizes one frame, which may be used up. *result is empty or holds the frame before.
+void resize(const Resizing& resizing, Picture* frame, Picture* result);
 
 }  // namespace tool

@@ -11,16 +11,8 @@
 
 namespace tool {
 
-namespace {
-
-bool is_image_file(Container container) {
-    return container != Container::kRaw && container != Container::kY4m;
-}
-
-}  // namespace
-
 void Sink::write(const Picture& frame) {
-    if (!is_first_ && is_image_file(kind_.container)) {
+    if (!is_first_ && is_image_file(kind_)) {
         throw Error("an image file holds one picture, but there are more");
     }
     if (frame.format == kind_.format) {

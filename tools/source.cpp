@@ -3,6 +3,7 @@
 
 #include <utility>
 
+#include "alpha.h"
 #include "codecs.h"
 #include "error.h"
 
@@ -23,6 +24,7 @@ public:
         : Source(std::move(input), {container, PixelFormat::kRgba}) {
         const std::vector<uint8_t> file = input_.read_all();
         picture_ = decode(file.data(), file.size(), &metadata_);
+        picture_->has_alpha = picture_->has_alpha && !is_opaque(*picture_);
         size_ = picture_->size;
     }
 

@@ -171,8 +171,8 @@ for flag in --help -h; do
     [ ! -s stderr ] || complain "$flag writes to standard error"
     awk 'length > 100 { exit 1 }' help || complain "$flag has lines over 100 columns"
 done
-for option in --size --canvas --fit --engine --format --input-size --quality --no-rotate --strip --verbose --help --version; do
-    grep -q -e " $option " help || complain "no $option in --help"
+for option in --size --canvas --fit --engine --format --input-size --quality --background --premultiply --no-rotate --strip --verbose --help --version; do
+    grep -q -e " ${option}[ ,]" help || complain "no $option in --help"
 done
 for flag in --version -V; do
     "$tool" "$flag" | grep -Eq '^ovrinresize [0-9]+\.[0-9]+\.[0-9]+$' || complain "$flag"

@@ -38,21 +38,21 @@ make_coloured() {
     convert gray.png gray.jpg
     convert gray.png -alpha set -channel A -evaluate set 50% gray_alpha.png
     for type in png jpg; do
-        exiftool -q "-ICC_Profile<=$profiles/compatibleWithAdobeRGB1998.icc" -o "wide.$type" "plain.$type"
-        exiftool -q "-ICC_Profile<=$profiles/Gray.icc" -o "gray_profile.$type" "gray.$type"
+        exiftool -q -q "-ICC_Profile<=$profiles/compatibleWithAdobeRGB1998.icc" -o "wide.$type" "plain.$type"
+        exiftool -q -q "-ICC_Profile<=$profiles/Gray.icc" -o "gray_profile.$type" "gray.$type"
     done
     # Longer than one marker of a JPEG.
-    exiftool -q "-ICC_Profile<=$profiles/ITULab.icc" -o long_profile.jpg plain.jpg
+    exiftool -q -q "-ICC_Profile<=$profiles/ITULab.icc" -o long_profile.jpg plain.jpg
     # A profile for colours in a file of greys.
-    exiftool -q "-ICC_Profile<=$profiles/sRGB.icc" -o gray_in_colours.jpg gray.jpg
-    exiftool -q -n -SRGBRendering=1 -o srgb.png plain.png
-    exiftool -q -n -ColorSpace=1 -o exif_srgb.jpg plain.jpg
-    exiftool -q -n -ColorSpace=65535 -o exif_uncalibrated.jpg plain.jpg
+    exiftool -q -q "-ICC_Profile<=$profiles/sRGB.icc" -o gray_in_colours.jpg gray.jpg
+    exiftool -q -q -n -SRGBRendering=1 -o srgb.png plain.png
+    exiftool -q -q -n -ColorSpace=1 -o exif_srgb.jpg plain.jpg
+    exiftool -q -q -n -ColorSpace=65535 -o exif_uncalibrated.jpg plain.jpg
     exiftool -q -Gamma=1 -o linear.png plain.png
     convert plain.png -density 300 -units PixelsPerInch 300dpi.png
     convert plain.png -density 300 -units PixelsPerInch 300dpi.jpg
     convert plain.png -density 100x50 -units PixelsPerCentimeter 100dpcm.jpg
-    exiftool -q -n -Orientation=6 -o 100dpcm6.jpg 100dpcm.jpg
+    exiftool -q -q -n -Orientation=6 -o 100dpcm6.jpg 100dpcm.jpg
     convert plain.png -density 3x2 -units Undefined pixels_of_3x2.jpg
     convert plain.png -depth 16 deep.png
     convert plain.png -colors 8 PNG8:palette.png
@@ -61,9 +61,21 @@ make_coloured() {
     convert plain.png -interlace JPEG progressive.jpg
 }
 
+# Pictures of 40 x 20 pixels with alpha; the colours of transparent pixels should never be seen.
+make_transparent() {
+    convert plain.png -alpha on PNG32:opaque.png
+    convert -size 20x20 xc:'rgba(200,0,0,1)' xc:'rgba(0,255,0,0)' +append PNG32:halo.png
+    convert -size 20x20 xc:'gray(200)' xc:'graya(90,0)' +append -colorspace Gray gray_halo.png
+    convert -size 40x20 xc:'rgba(100,50,200,0.5)' PNG32:half.png
+    convert -size 40x20 xc:'rgba(100,50,200,0)' PNG32:nothing.png
+    convert halo.png -channel A -threshold 50% +channel -colors 4 PNG8:palette_halo.png
+    exiftool -q -q "-ICC_Profile<=$profiles/Gray.icc" -o gray_halo_profile.png gray_halo.png
+}
+
 make_fixtures() {
     make_photographs
     make_coloured
+    make_transparent
 }
 
 # tag NAME FILE: what exiftool says; nothing where there is none.
@@ -107,4 +119,23 @@ channels() {
         *.png) pngcheck -v "$1" | grep -oE '(grayscale|RGB)(\+alpha)?' | head -n 1 ;;
         *.jpg) exiftool -s3 -n -ColorComponents "$1" ;;
     esac
+}
+
+# alpha FILE X,Y: 0 to 255.
+alpha() {
+    convert "$1" -alpha extract -depth 8 -format "%[fx:round(255*p{$2})]" info:
+}
+
+# greenest FILE: the largest green sample of pixels that are not all but transparent.
+greenest() {
+    convert "$1" -depth 8 RGBA:- | od -An -v -tu1 -w4 | awk '$4 > 4 && $2 > most { most = $2 } END { print most + 0 }'
+}
+
+# close_to R,G,B SEEN: whether no channel is more than 6 off.
+close_to() {
+    awk -v a="$1" -v b="$2" 'BEGIN {
+        n = split(a, p, ","); split(b, q, ",")
+        for (i = 1; i <= n; ++i) if (p[i] - q[i] > 6 || q[i] - p[i] > 6) bad = 1
+        print bad ? "no: " b : "yes"
+    }'
 }

@@ -156,9 +156,6 @@ fails 1 'only Y4M can be written as Y4M' one.png no.y4m -s 9x9
 # ---- Engines and canvas ----
 
 fails 1 'nearest engine handles rgba, not i420' in.y4m no.y4m -s 9x9 --engine nearest
-fails 1 'nearest engine knows no canvas' one.png no.png -c 9x9 --engine nearest
-fails 1 'bilinear engine knows no canvas' one.png no.png -c 9x9 --engine bilinear
-fails 1 'lanczos engine knows no canvas' in.y4m no.y4m -c 19x30 --engine lanczos
 fails 1 'a picture of 20x8 does not fit on a canvas of 19x30' in.y4m no.y4m -s 20x8 -c 19x30 -f exact
 works one.png near.png --size 4x4 --engine nearest
 has_size near.png 4x4
