@@ -93,15 +93,15 @@ Picture draw_sheet(const Picture& sample) {
     Picture sheet({kColumns * (kTile + kGap) + kGap, 2 * (kTile + kLabel) + kGap});
     std::fill(sheet.words.begin(), sheet.words.end(), 0xFFFFFFFF);
     // Text, line pairs and landscape; and the edge of a letter with its surroundings.
-    const Picture large = cropped(sample, 300, 110, {3 * kTile, 3 * kTile});
-    const Picture small = cropped(sample, 676, 822, {80, 80});
+    Picture large = cropped(sample, 300, 110, {3 * kTile, 3 * kTile});
+    Picture small = cropped(sample, 676, 822, {80, 80});
     int32_t x = kGap;
     for (const Resampler& resampler : kResamplers) {
         int32_t y = kLabel;
         const char* const suffixes[] = {", to a third", ", 4.5 times as large"};
-        for (const Picture* source : {&large, &small}) {
+        for (Picture* source : {&large, &small}) {
             Picture tile({kTile, kTile});
-            tool::resize(resampler.engine, *source, &tile);
+            tool::resize(resampler.engine, source, &tile);
             write(&sheet, (std::string(resampler.label) + suffixes[source == &small]).c_str(),
                   {x + 2.0, y - 9.0}, 14);
             paste(&sheet, tile, x, y);

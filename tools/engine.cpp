@@ -7,6 +7,7 @@
 
 #include "convert.h"
 #include "error.h"
+#include "thumbnail.h"
 
 namespace tool {
 
@@ -77,21 +78,26 @@ int32_t bilinear_format(PixelFormat format) {
     }
 }
 
-// On the calling thread at any height: in bands the engine would not interpolate. Not for RGB.
-void resize_bilinear(const Picture& source, Picture* result) {
+using Bilinear = void(const uint8_t*, uint8_t*, int32_t, int32_t, int32_t, int32_t, int32_t,
+                      const ovrin_resize_target*);
+
+// Not for RGB.
+void resize_bilinear(Bilinear* bilinear, Picture* source, Picture* result) {
     // The engine may read a row and a sample past the end, which then count; they repeat the end.
-    const size_t words = source.words.size();
-    std::vector<uint32_t> padded(source.words);
-    padded.resize(words + static_cast<size_t>(source.size.width) + 1, padded.back());
-    ov_bilinear_sg(reinterpret_cast<const uint8_t*>(padded.data()), result->bytes(),
-                   source.size.width, source.size.height, result->size.width, result->size.height,
-                   bilinear_format(source.format), nullptr);
+    std::vector<uint32_t>& words = source->words;
+    const size_t count = words.size();
+    words.resize(count + static_cast<size_t>(source->size.width) + 1, words.back());
+    bilinear(source->bytes(), result->bytes(), source->size.width, source->size.height,
+             result->size.width, result->size.height, bilinear_format(source->format), nullptr);
+    words.resize(count);
 }
 
 // The engine knows no RGB; RGBA gives the same bytes.
-void resize_rgb_bilinear(const Picture& source, Picture* result) {
+void resize_any_bilinear(Bilinear* bilinear, Picture* source, Picture* result) {
+    if (source->format != PixelFormat::kRgb) return resize_bilinear(bilinear, source, result);
     Picture rgba(result->size);
-    resize_bilinear(converted(source, PixelFormat::kRgba), &rgba);
+    Picture rgba_source = converted(*source, PixelFormat::kRgba);
+    resize_bilinear(bilinear, &rgba_source, &rgba);
     *result = converted(rgba, PixelFormat::kRgb);
 }
 
@@ -130,19 +136,23 @@ void check_engine(Engine engine, PixelFormat format) {
     }
 }
 
-void resize(Engine engine, const Picture& source, Picture* result) {
-    result->has_alpha = source.has_alpha;
-    result->is_gray = source.is_gray;
+void resize(Engine engine, Picture* source, Picture* result) {
+    result->has_alpha = source->has_alpha;
+    result->is_gray = source->is_gray;
     switch (engine) {
         case Engine::kQuarter:
-            return resize_whole(source, result);
+            return resize_whole(*source, result);
+        case Engine::kThumbnail:
+            return resize_thumbnail(source, result);
         case Engine::kBilinear:
-            if (source.format == PixelFormat::kRgb) return resize_rgb_bilinear(source, result);
-            return resize_bilinear(source, result);
+            // On the calling thread at any height: in bands the engine would not interpolate.
+            return resize_any_bilinear(ov_bilinear_sg, source, result);
+        case Engine::kBilinearProgressive:
+            return resize_any_bilinear(ov_bilinear_ex, source, result);
         case Engine::kLanczos:
-            return resize_lanczos(source, result);
+            return resize_lanczos(*source, result);
         case Engine::kNearest:
-            return resize_nearest(source, result);
+            return resize_nearest(*source, result);
     }
 }
 

@@ -53,6 +53,15 @@ std::optional<Y4mHeader> resized_header(const Source& source, const Placement& p
                               placement.keeps_aspect);
 }
 
+// Of still pictures that shrink a lot every pixel should count; frames come in numbers, and
+// quickly.
+Engine engine_for(const Options& options, const Source& source, Size upright, Size picture) {
+    if (options.engine) return *options.engine;
+    const bool shrinks_a_lot =
+        upright.width / 2 >= picture.width && upright.height / 2 >= picture.height;
+    return is_image_file(source.kind()) && shrinks_a_lot ? Engine::kThumbnail : Engine::kQuarter;
+}
+
 std::optional<Color> background_of(const Options& options, FileKind out) {
     if (options.background || holds_alpha(out)) return options.background;
     return kWhite;
@@ -79,9 +88,11 @@ void run(const Options& options) {
     check_conversion(source->kind(), out_kind);
     const Orientation orientation =
         options.rotate ? orientation_of(source->metadata()) : Orientation::kUpright;
-    const Placement placement = place(options.wish, turned(source->size(), orientation), format);
-    check_engine(options.engine, format);
-    const Resizing how = {options.engine,
+    const Size upright = turned(source->size(), orientation);
+    const Placement placement = place(options.wish, upright, format);
+    const Engine engine = engine_for(options, *source, upright, placement.picture);
+    check_engine(engine, format);
+    const Resizing how = {engine,
                           placement,
                           orientation,
                           background_of(options, out_kind),

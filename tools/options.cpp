@@ -127,12 +127,17 @@ void declare_resizing(CLI::App* app, Options* options) {
         "exact: stretch to the size (the default without --canvas);\n"
         "contain: the largest picture that fits into the size and keeps\n"
         "its proportions (the default with --canvas)");
-    add_choice<Engine, Engine>(app, "-e,--engine", "NAME", &options->engine,
-                               {{"quarter", Engine::kQuarter},
-                                {"bilinear", Engine::kBilinear},
-                                {"lanczos", Engine::kLanczos},
-                                {"nearest", Engine::kNearest}},
-                               "Resampler: quarter (the default), bilinear, lanczos or nearest");
+    add_choice<std::optional<Engine>, Engine>(
+        app, "-e,--engine", "NAME", &options->engine,
+        {{"quarter", Engine::kQuarter},
+         {"thumbnail", Engine::kThumbnail},
+         {"bilinear", Engine::kBilinear},
+         {"bilinear-progressive", Engine::kBilinearProgressive},
+         {"lanczos", Engine::kLanczos},
+         {"nearest", Engine::kNearest}},
+        "Resampler: quarter, thumbnail, bilinear, bilinear-progressive,\n"
+        "lanczos or nearest. Without it thumbnail for pictures that shrink\n"
+        "to half or less in both directions, and quarter for all others");
 }
 
 void declare(CLI::App* app, Options* options) {

@@ -17,7 +17,7 @@ struct Options {
     std::string in;
     std::string out;
     Wish wish;
-    Engine engine = Engine::kQuarter;
+    std::optional<Engine> engine;  // without one, what suits the job
     int quality = 90;
     std::optional<PixelFormat> raw_format;
     std::optional<Size> raw_size;

@@ -8,18 +8,18 @@ namespace tool {
 
 namespace {
 
-void resize_and_place(const Resizing& resizing, const Placement& placement, const Picture& frame,
+void resize_and_place(const Resizing& resizing, const Placement& placement, Picture* frame,
                       Picture* result) {
     const bool draws_canvas =
         placement.on_canvas && (resizing.engine != Engine::kQuarter || resizing.canvas);
     if (draws_canvas) {
-        Picture picture(placement.picture, frame.format);
+        Picture picture(placement.picture, frame->format);
         resize(resizing.engine, frame, &picture);
         *result = on_canvas(picture, placement, resizing.canvas);
         return;
     }
-    if (result->words.empty()) *result = Picture(placement.result, frame.format);
-    if (placement.on_canvas) return resize_onto_canvas(frame, placement, result);
+    if (result->words.empty()) *result = Picture(placement.result, frame->format);
+    if (placement.on_canvas) return resize_onto_canvas(*frame, placement, result);
     resize(resizing.engine, frame, result);
 }
 
@@ -27,10 +27,10 @@ void resize_and_place(const Resizing& resizing, const Placement& placement, cons
 void resize_and_turn(const Resizing& resizing, Picture* frame, Picture* result) {
     if (frame->size.pixels() < resizing.placement.result.pixels()) {
         *frame = turned(*frame, resizing.orientation);
-        return resize_and_place(resizing, resizing.placement, *frame, result);
+        return resize_and_place(resizing, resizing.placement, frame, result);
     }
     Picture stored;
-    resize_and_place(resizing, stored_placement(resizing.placement, resizing.orientation), *frame,
+    resize_and_place(resizing, stored_placement(resizing.placement, resizing.orientation), frame,
                      &stored);
     *frame = Picture();
     *result = turned(stored, resizing.orientation);
@@ -43,7 +43,7 @@ void resize(const Resizing& resizing, Picture* frame, Picture* result) {
     const bool weighs_colors = frame->has_alpha && resizing.premultiply;
     if (weighs_colors) premultiply(frame);
     if (resizing.orientation == Orientation::kUpright) {
-        resize_and_place(resizing, resizing.placement, *frame, result);
+        resize_and_place(resizing, resizing.placement, frame, result);
     } else {
         resize_and_turn(resizing, frame, result);
     }

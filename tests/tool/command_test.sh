@@ -37,7 +37,7 @@ works in.ppm low.jpg -s 48x40 --quality 5
 
 # Four samples a quarter and three quarters of the way, each divided by 4 and rounded down.
 printf 'P6 4 2 255 \xff\x03\x00\xff\x04\x01\x08\x10\x20\x80\x81\x82\xff\x07\x02\xff\x08\x03\x0b\x13\x23\x40\x41\x42' >tiny.ppm
-works tiny.ppm tiny_out.ppm -s 2x1
+works tiny.ppm tiny_out.ppm -s 2x1 -e quarter
 [ "$(hex tiny_out.ppm)" = "$(printf 'P6\n2 1\n255\n' | od -An -tx1 | tr -d ' \n')fc0400343840" ] ||
     complain "2x1 result is $(hex tiny_out.ppm)"
 

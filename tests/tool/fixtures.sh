@@ -2,6 +2,7 @@
 # shellcheck shell=bash
 # Sourced by cases_test.sh: pictures made by programs other than ours, and what the tables ask of them.
 
+: "${tool:?path of ovrinresize}"
 profiles=/usr/share/color/icc  # of Debian's icc-profiles-free
 
 # photoN.jpg: one scene, stored in each of EXIF's eight ways to lie; the scene itself is upright.png.
@@ -72,10 +73,20 @@ make_transparent() {
     exiftool -q -q "-ICC_Profile<=$profiles/Gray.icc" -o gray_halo_profile.png gray_halo.png
 }
 
+# Fine lines, text and a landscape, 1600 x 1200 pixels: the project's own sample picture.
+make_sample() {
+    "$(dirname "$tool")/make_sample" sample.png
+    convert sample.png -alpha set -channel A -evaluate set 60% +channel PNG32:sample_alpha.png
+    convert sample.png -quality 95 sample.jpg
+    convert -size 64x64 xc:white white.png
+    convert sample.png -crop 800x800+400+200 +repage -depth 8 RGB:sample.rgb
+}
+
 make_fixtures() {
     make_photographs
     make_coloured
     make_transparent
+    make_sample
 }
 
 # tag NAME FILE: what exiftool says; nothing where there is none.
@@ -138,4 +149,20 @@ close_to() {
         for (i = 1; i <= n; ++i) if (p[i] - q[i] > 6 || q[i] - p[i] > 6) bad = 1
         print bad ? "no: " b : "yes"
     }'
+}
+
+# psnr FILE REFERENCE: in whole dB; of REFERENCE the mean of the pixels that each of FILE's covers. The
+# ratio of their sizes is a whole number.
+psnr() {
+    convert "$2" -strip -filter box -resize "$(identify -format '%wx%h!' "$1")" -depth 8 PNG32:expected.png
+    convert "$1" -strip PNG32:seen.png
+    compare -metric PSNR seen.png expected.png null: 2>&1 | awk '{ print ($1 == "inf") ? 99 : int($1) }'
+}
+
+at_least() {
+    [ "$2" -ge "$1" ] && echo yes || echo "no: $2"
+}
+
+at_most() {
+    [ "$2" -le "$1" ] && echo yes || echo "no: $2"
 }

@@ -5,6 +5,8 @@
 # Usage: interruption_test.sh PATH_OF_OVRINRESIZE PATH_OF_no_nameless_files.so
 source "$(dirname "${BASH_SOURCE[0]}")/support.sh"
 no_nameless_files=$2
+# A child that a signal ends before it has become the tool would act on the trap too.
+trap - EXIT
 
 rounds=$((100 / ${OVRIN_TEST_DIVISOR:-1}))
 RANDOM=${OVRIN_TEST_SEED:-1}
@@ -78,4 +80,5 @@ for signal in TERM INT HUP QUIT; do
     rm -f folder/out.ppm
 done
 
+rm -rf "$folder"
 finish
