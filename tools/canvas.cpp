@@ -60,17 +60,32 @@ void fill(Picture* picture, const Picture& pixel) {
     }
 }
 
+// Where the samples of one row or column go: those from `first` on, `count` of them, to `to` on.
+struct Span {
+    size_t first, count, to;
+};
+
+// offset: of the picture on the canvas, in samples.
+Span visible(size_t samples, size_t canvas_samples, ptrdiff_t offset) {
+    const size_t first = offset < 0 ? static_cast<size_t>(-offset) : 0;
+    const size_t to = offset < 0 ? 0 : static_cast<size_t>(offset);
+    return {first, std::min(samples - first, canvas_samples - to), to};
+}
+
 void paste(const Picture& picture, Picture* canvas, int32_t x, int32_t y) {
     const std::vector<Plane> from = planes_of(picture.format, picture.size);
     const std::vector<Plane> to = planes_of(canvas->format, canvas->size);
     for (size_t i = 0; i < from.size(); ++i) {
-        const size_t left = static_cast<size_t>(x) / from[i].pixels;
-        const size_t top = static_cast<size_t>(y) / from[i].pixels;
-        const size_t row_bytes = from[i].width * from[i].sample_bytes;
-        for (size_t row = 0; row < from[i].height; ++row) {
-            memcpy(canvas->bytes() + to[i].offset +
-                       ((top + row) * to[i].width + left) * to[i].sample_bytes,
-                   picture.bytes() + from[i].offset + row * row_bytes, row_bytes);
+        const auto pixels = static_cast<int32_t>(from[i].pixels);
+        const Span columns = visible(from[i].width, to[i].width, x / pixels);
+        const Span rows = visible(from[i].height, to[i].height, y / pixels);
+        const auto at = [](const Plane& plane, size_t column, size_t row) {
+            return plane.offset + (row * plane.width + column) * plane.sample_bytes;
+        };
+        for (size_t row = 0; row < rows.count; ++row) {
+            memcpy(canvas->bytes() + at(to[i], columns.to, rows.to + row),
+                   picture.bytes() + at(from[i], columns.first, rows.first + row),
+                   columns.count * from[i].sample_bytes);
         }
     }
 }

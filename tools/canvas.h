@@ -9,7 +9,8 @@
 
 namespace tool {
 
-// A canvas of one colour, without any black and transparent, with a picture on it. In any format.
+// A canvas of one colour, without any black and transparent, with a picture on it, or as much of it
+// as shows. In any format.
 Picture on_canvas(const Picture& picture, const Placement& placement,
                   const std::optional<Color>& color);
 

@@ -57,9 +57,13 @@ std::optional<Y4mHeader> resized_header(const Source& source, const Placement& p
 // quickly.
 Engine engine_for(const Options& options, const Source& source, Size upright, Size picture) {
     if (options.engine) return *options.engine;
+    if (!is_image_file(source.kind())) return Engine::kQuarter;
+    // Lanczos copies.
+    const bool is_copy = upright.width == picture.width && upright.height == picture.height;
+    if (is_copy) return Engine::kLanczos;
     const bool shrinks_a_lot =
         upright.width / 2 >= picture.width && upright.height / 2 >= picture.height;
-    return is_image_file(source.kind()) && shrinks_a_lot ? Engine::kThumbnail : Engine::kQuarter;
+    return shrinks_a_lot ? Engine::kThumbnail : Engine::kQuarter;
 }
 
 std::optional<Color> background_of(const Options& options, FileKind out) {

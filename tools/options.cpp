@@ -21,7 +21,7 @@ public:
     }
 
     std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
-        return "Usage: ovrinresize IN OUT --size WxH [OPTION]...\n";
+        return "Usage: ovrinresize IN OUT --size SIZE [OPTION]...\n";
     }
 
     std::string make_option_name(const CLI::Option* option, bool is_positional) const override {
@@ -43,28 +43,24 @@ public:
     throw CLI::ValidationError(names.substr(names.find("--")), why);
 }
 
-void add_size(CLI::App* app, const std::string& names, std::optional<Size>* size,
-              const std::string& help) {
-    const auto parse = [size, names](const std::string& text) {
+// An option whose value `read` makes of a word, or throws Error.
+template <class Value, class Read>
+void add_value(CLI::App* app, const std::string& names, const std::string& type_name,
+               std::optional<Value>* value, Read read, const std::string& help) {
+    const auto parse = [value, names, read](const std::string& text) {
         try {
-            *size = parse_size(text);
+            *value = read(text);
         } catch (const Error& error) {
             reject(names, error.what());
         }
     };
-    app->add_option_function<std::string>(names, parse, help)->type_name("WxH");
+    app->add_option_function<std::string>(names, parse, help)->type_name(type_name);
 }
 
-void add_color(CLI::App* app, const std::string& name, std::optional<Color>* color,
-               const std::string& help) {
-    const auto parse = [color, name](const std::string& text) {
-        try {
-            *color = parse_color(text);
-        } catch (const Error& error) {
-            reject(name, error.what());
-        }
-    };
-    app->add_option_function<std::string>(name, parse, help)->type_name("COLOUR");
+Size read_size(const std::string& text) {
+    const std::optional<Size> size = parse_size(text);
+    if (!size) throw Error("'" + text + "' is not a size; write it like 640x480");
+    return *size;
 }
 
 // An option whose value is one of a few words. Target: a Value, or an optional one.
@@ -111,22 +107,38 @@ void declare_files(CLI::App* app, Options* options) {
          {"rgba", PixelFormat::kRgba},
          {"rgb", PixelFormat::kRgb}},
         "IN holds raw frames: nv21, i420, rgba or rgb");
-    add_size(app, "--input-size", &options->raw_size, "Size of the raw frames");
+    add_value(app, "--input-size", "WxH", &options->raw_size, read_size, "Size of the raw frames");
     app->get_option("--format")->needs("--input-size");
     app->get_option("--input-size")->needs("--format");
 }
 
 void declare_resizing(CLI::App* app, Options* options) {
-    add_size(app, "-s,--size", &options->wish.size, "Size of the scaled picture, like 640x480");
-    add_size(app, "-c,--canvas", &options->wish.canvas,
-             "Put it in the middle of a black canvas of this size, which it\n"
-             "fills unless there is a --size");
+    add_value(app, "-s,--size", "SIZE", &options->wish.size, parse_geometry,
+              "640x480 fits inside and keeps the proportions; so do 640x, x480 and\n"
+              "640 (a width). 640x480! is exact, 640x480^ covers and is cropped.\n"
+              "50% is of both sides, 100000@ of pixels in all. With > behind it a\n"
+              "picture only shrinks, with < it only grows");
+    add_value(app, "-c,--canvas", "WxH", &options->wish.canvas, read_size,
+              "Put it in the middle of a canvas of this size, which it fills\n"
+              "unless there is a --size");
     add_choice<std::optional<Fit>, Fit>(
         app, "-f,--fit", "MODE", &options->wish.fit,
-        {{"exact", Fit::kExact}, {"contain", Fit::kContain}},
-        "exact: stretch to the size (the default without --canvas);\n"
-        "contain: the largest picture that fits into the size and keeps\n"
-        "its proportions (the default with --canvas)");
+        {{"contain", Fit::kContain}, {"exact", Fit::kExact}, {"cover", Fit::kCover}},
+        "Words for what the signs behind a size say: contain (the default),\n"
+        "exact (!) or cover (^)");
+    add_choice<Gravity, Gravity>(
+        app, "-g,--gravity", "PLACE", &options->wish.gravity,
+        {{"center", {1, 1}},
+         {"north", {1, 0}},
+         {"northeast", {2, 0}},
+         {"east", {2, 1}},
+         {"southeast", {2, 2}},
+         {"south", {1, 2}},
+         {"southwest", {0, 2}},
+         {"west", {0, 1}},
+         {"northwest", {0, 0}}},
+        "Which end of the canvas the picture lies at, or which part of it is\n"
+        "left when it is cropped: north, southeast and so on");
     add_choice<std::optional<Engine>, Engine>(
         app, "-e,--engine", "NAME", &options->engine,
         {{"quarter", Engine::kQuarter},
@@ -147,7 +159,7 @@ void declare(CLI::App* app, Options* options) {
     app->add_option("-q,--quality", options->quality, "JPEG quality, 1 to 100; 90 by default")
         ->type_name("N")
         ->check(CLI::Range(1, 100).description(""));
-    add_color(app, "--background", &options->background,
+    add_value(app, "--background", "COLOUR", &options->background, parse_color,
               "Colour behind what is transparent, and of the canvas: #rrggbb, #rgb\n"
               "or a name. Without it PNG stays transparent, JPEG and others get\n"
               "white, and the canvas is black");

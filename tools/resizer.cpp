@@ -10,8 +10,10 @@ namespace {
 
 void resize_and_place(const Resizing& resizing, const Placement& placement, Picture* frame,
                       Picture* result) {
-    const bool draws_canvas =
-        placement.on_canvas && (resizing.engine != Engine::kQuarter || resizing.canvas);
+    // The library draws black ones, with one engine, and crops nothing.
+    const bool is_cropped = placement.x < 0 || placement.y < 0;
+    const bool draws_canvas = placement.on_canvas && (resizing.engine != Engine::kQuarter ||
+                                                      resizing.canvas || is_cropped);
     if (draws_canvas) {
         Picture picture(placement.picture, frame->format);
         resize(resizing.engine, frame, &picture);

@@ -24,16 +24,15 @@ const char* parse_side(const char* begin, const char* end, int64_t* side) {
 
 }  // namespace
 
-Size parse_size(const std::string& text) {
+std::optional<Size> parse_size(const std::string& text) {
     const char* const end = text.data() + text.size();
     int64_t width = 0;
     int64_t height = 0;
     const char* at = parse_side(text.data(), end, &width);
-    if (at != nullptr && at != end && (*at == 'x' || *at == 'X')) {
-        at = parse_side(at + 1, end, &height);
-        if (at == end) return checked_size(width, height);
-    }
-    throw Error("'" + text + "' is not a size; write it like 640x480");
+    if (at == nullptr || at == end || (*at != 'x' && *at != 'X')) return std::nullopt;
+    at = parse_side(at + 1, end, &height);
+    if (at != end) return std::nullopt;
+    return checked_size(width, height);
 }
 
 Size checked_size(int64_t width, int64_t height) {

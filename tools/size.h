@@ -3,6 +3,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <string>
 
 namespace tool {
@@ -15,8 +16,9 @@ struct Size {
     size_t pixels() const { return static_cast<size_t>(width) * static_cast<size_t>(height); }
 };
 
-// Reads "WxH". Throws Error unless it is a size that the tool handles.
-Size parse_size(const std::string& text);
+// Reads "WxH"; nothing where the text is not of that form. Throws Error when the tool cannot handle
+// such a size.
+std::optional<Size> parse_size(const std::string& text);
 
 // Throws Error unless a picture of this size can be handled. Sides come from files, so they may be
 // anything at all.

@@ -54,13 +54,13 @@ cmp -s again.i420 back.yuv || complain "NV21 and I420 do not convert into each o
 
 works one.i420 one.png "${raw[@]}" --size 16x8
 has_size one.png 16x8
-works one.png one.nv21 --size 400x300
+works one.png one.nv21 --size 400x300!
 [ "$(stat -c %s one.nv21)" = $((400 * 300 * 3 / 2)) ] || complain "size of one.nv21"
-works one.png one.rgb --size 5x3
+works one.png one.rgb --size 5x3!
 [ "$(stat -c %s one.rgb)" = 45 ] || complain "size of one.rgb"
 
 head -c 45 /dev/urandom >odd.rgb
-works odd.rgb odd.rgba --format rgb --input-size 5x3 -s 3x3
+works odd.rgb odd.rgba --format rgb --input-size 5x3 -s 3x3!
 [ "$(stat -c %s odd.rgba)" = 36 ] || complain "size of odd.rgba"
 
 for cut in 1 $((frame_bytes - 1)); do
@@ -97,7 +97,7 @@ works in.y4m from_y4m.nv21 --size 16x8
 
 "$tool" - - --size 16x8 <in.y4m >piped.y4m || complain "exit code $? of Y4M in a pipe"
 cmp -s out.y4m piped.y4m || complain "Y4M in a pipe differs"
-"$tool" - - --size 64x64 <in.y4m | "$tool" - - --size 16x8 | "$tool" - last.y4m --canvas 16x16 ||
+"$tool" - - --size 64x64! <in.y4m | "$tool" - - --size 16x8 | "$tool" - last.y4m --canvas 16x16 ||
     complain "exit code $? of a chain of three"
 head -n 1 last.y4m | grep -q '^YUV4MPEG2 W16 H16 ' || complain "end of a chain: $(head -n 1 last.y4m)"
 
@@ -111,9 +111,9 @@ done
 
 # Squeezing a picture changes the shape of its pixels, except where its proportions are kept.
 y4m 1 A16:15 >shape.y4m
-works shape.y4m shape_out.y4m --size 16x16
+works shape.y4m shape_out.y4m --size 16x16!
 head -n 1 shape_out.y4m | grep -q ' A32:15' || complain "pixel shape: $(head -n 1 shape_out.y4m)"
-works shape.y4m shape_out.y4m --size 17x17 --fit contain
+works shape.y4m shape_out.y4m --size 17x17
 head -n 1 shape_out.y4m | grep -q ' A16:15' || complain "pixel shape: $(head -n 1 shape_out.y4m)"
 
 for tags in C422 C444 Cmono C420p10 C411 C444alpha; do
@@ -157,7 +157,7 @@ fails 1 'only Y4M can be written as Y4M' one.png no.y4m -s 9x9
 
 fails 1 'nearest engine handles rgba, not i420' in.y4m no.y4m -s 9x9 --engine nearest
 fails 1 'a picture of 20x8 does not fit on a canvas of 19x30' in.y4m no.y4m -s 20x8 -c 19x30 -f exact
-works one.png near.png --size 4x4 --engine nearest
+works one.png near.png --size 4x4! --engine nearest
 has_size near.png 4x4
 
 # ---- Long inputs ----
