@@ -130,6 +130,24 @@ void resize_lanczos(const Picture& source, Picture* result) {
 
 }  // namespace
 
+const char* name_of(Engine engine) {
+    switch (engine) {
+        case Engine::kQuarter:
+            return "quarter";
+        case Engine::kThumbnail:
+            return "thumbnail";
+        case Engine::kBilinear:
+            return "bilinear";
+        case Engine::kBilinearProgressive:
+            return "bilinear-progressive";
+        case Engine::kLanczos:
+            return "lanczos";
+        case Engine::kNearest:
+            return "nearest";
+    }
+    return "";
+}
+
 void check_engine(Engine engine, PixelFormat format) {
     if (engine == Engine::kNearest && format != PixelFormat::kRgba) {
         throw Error(std::string("the nearest engine handles rgba, not ") + name_of(format));

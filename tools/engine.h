@@ -11,6 +11,8 @@ namespace tool {
 
 enum class Engine { kQuarter, kThumbnail, kBilinear, kBilinearProgressive, kLanczos, kNearest };
 
+const char* name_of(Engine engine);
+
 // Throws Error when the engine cannot resize pictures of this format.
 void check_engine(Engine engine, PixelFormat format);
 

@@ -2,7 +2,6 @@
 #include "job.h"
 
 #include <chrono>
-#include <iomanip>
 #include <iostream>
 #include <memory>
 
@@ -11,6 +10,7 @@
 #include "metadata.h"
 #include "output_file.h"
 #include "progress.h"
+#include "report.h"
 #include "resizer.h"
 #include "sink.h"
 #include "source.h"
@@ -33,19 +33,6 @@ public:
 private:
     std::chrono::duration<double, std::milli> elapsed_ = {};
 };
-
-void report(const Source& source, const Placement& placement, int64_t frames, double milliseconds) {
-    std::cerr << name_of(source.kind().format) << " " << to_string(source.size()) << " to "
-              << to_string(placement.picture);
-    if (placement.on_canvas) std::cerr << " on " << to_string(placement.result);
-    std::cerr << ": " << std::fixed << std::setprecision(3);
-    if (frames == 1) {
-        std::cerr << "resized in " << milliseconds << " ms\n";
-    } else {
-        std::cerr << frames << " frames resized in " << milliseconds / static_cast<double>(frames)
-                  << " ms each\n";
-    }
-}
 
 std::optional<Y4mHeader> resized_header(const Source& source, const Placement& placement) {
     if (!source.y4m_header()) return std::nullopt;
@@ -82,6 +69,7 @@ SinkSettings settings_of(const Options& options, const Source& source, const Pla
 }  // namespace
 
 void run(const Options& options) {
+    set_most_pixels(options.most_pixels);
     std::optional<RawLayout> raw;
     if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
     const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
@@ -111,16 +99,19 @@ void run(const Options& options) {
     Stopwatch resizing;
     int64_t frames = 0;
     {
-        Progress progress;
+        Progress progress(!options.quiet);
         while (concerning(options.in, [&] { return source->next(&frame); })) {
-            resizing.time([&] { resize(how, &frame, &result); });
+            concerning(options.in, [&] { resizing.time([&] { resize(how, &frame, &result); }); });
             concerning(options.out, [&] { sink.write(result); });
             progress.update(++frames, source->part_read());
         }
     }
     if (frames == 0) throw Error(options.in + ": holds no frame");
     file.commit();
-    if (options.verbose) report(*source, placement, frames, resizing.milliseconds());
+    const Report report = {options.in, options.out, format, upright,
+                           placement,  engine,      frames, resizing.milliseconds()};
+    if (options.verbose) std::cerr << in_words(report);
+    if (options.json) std::cout << as_json(report);
 }
 
 }  // namespace tool

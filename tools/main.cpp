@@ -2,6 +2,7 @@
 // The ovrinresize command: reads pictures, resizes them with the library, writes them.
 #include <cstdio>
 #include <exception>
+#include <iostream>
 #include <new>
 
 #include "job.h"
@@ -25,18 +26,25 @@ ExitCode fail(ExitCode code, const char* message) {
     return code;
 }
 
+// Whether standard output has taken all that was printed.
+ExitCode checked_output() {
+    if (std::cout.flush()) return kDone;
+    return fail(kFailed, "standard output cannot be written");
+}
+
 int command(int argc, char** argv) {
     CLI::App app("Resize pictures and video frames.", "ovrinresize");
     Options options;
     try {
         parse(argc, argv, &app, &options);
     } catch (const CLI::Success& success) {
-        return app.exit(success);
+        app.exit(success);
+        return checked_output();
     } catch (const CLI::Error& error) {
         return fail(kWrongUsage, error.what());
     }
     run(options);
-    return kDone;
+    return checked_output();
 }
 
 }  // namespace

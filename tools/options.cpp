@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "error.h"
+#include "version.h"
 
 namespace tool {
 
@@ -174,9 +175,18 @@ void declare(CLI::App* app, Options* options) {
                   "where its type can hold them");
     app->add_flag("-v,--verbose", options->verbose,
                   "Say on standard error what was done and how long the resizing took");
+    app->add_flag("--json", options->json,
+                  "Say on standard output what was done, as one line of JSON");
+    app->add_flag("--quiet", options->quiet, "Say nothing but what went wrong");
+    app->get_option("--quiet")->excludes("--verbose");
+    app->add_option("--max-pixels", options->most_pixels,
+                    "Refuse larger pictures, before memory is taken for them;\n"
+                    "268435456, which is the most, by default")
+        ->type_name("N")
+        ->check(CLI::Range(int64_t{1}, kMostPixels).description(""));
     app->set_help_flag("-h,--help", "Print this help and exit");
-    app->set_version_flag("-V,--version", "ovrinresize " OVRINRESIZE_VERSION,
-                          "Print the version and exit");
+    app->set_version_flag("-V,--version", version_text(),
+                          "Print the versions and the kernels in use, and exit");
     app->footer(
         "The content of IN decides what it is, not its name. An older OUT is replaced.\n"
         "See ovrinresize(1) for the details.\n"
@@ -195,6 +205,9 @@ void parse(int argc, char** argv, CLI::App* app, Options* options) {
     app->parse(argc, argv);
     if (!options->wish.size && !options->wish.canvas) {
         throw CLI::RequiredError("--size or --canvas");
+    }
+    if (options->json && options->out == "-") {
+        throw CLI::ValidationError("--json", "standard output is taken by OUT");
     }
 }
 

@@ -25,7 +25,10 @@ struct Options {
     bool premultiply = true;
     bool rotate = true;
     bool strip = false;
+    int64_t most_pixels = kMostPixels;
+    bool quiet = false;
     bool verbose = false;
+    bool json = false;
 };
 
 // Reads the command line into *options. Throws what CLI11 throws: errors, and requests for help.

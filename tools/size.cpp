@@ -10,8 +10,7 @@ namespace tool {
 namespace {
 
 constexpr int64_t kMaxSide = 65535;
-// 1 GiB of RGBA. Byte counts fit 31 bits, which is all that the library promises to handle.
-constexpr int64_t kMaxPixels = int64_t{1} << 28;
+int64_t most_pixels = kMostPixels;
 
 // Reads a number and returns the place behind it; null where there is none. A number with more
 // digits than an int64_t holds is as good as the largest one: too big.
@@ -40,10 +39,14 @@ Size checked_size(int64_t width, int64_t height) {
     if (width > kMaxSide || height > kMaxSide) {
         throw Error("too large: a side is at most " + std::to_string(kMaxSide) + " pixels");
     }
-    if (width * height > kMaxPixels) {
-        throw Error("too large: a picture has at most " + std::to_string(kMaxPixels) + " pixels");
+    if (width * height > most_pixels) {
+        throw Error("too large: a picture has at most " + std::to_string(most_pixels) + " pixels");
     }
     return {static_cast<int32_t>(width), static_cast<int32_t>(height)};
+}
+
+void set_most_pixels(int64_t pixels) {
+    most_pixels = pixels;
 }
 
 std::string to_string(const Size& size) {

@@ -24,6 +24,12 @@ std::optional<Size> parse_size(const std::string& text);
 // anything at all.
 Size checked_size(int64_t width, int64_t height);
 
+// 1 GiB of RGBA. Byte counts fit 31 bits, which is all that the library promises to handle.
+constexpr int64_t kMostPixels = int64_t{1} << 28;
+
+// Lets checked_size() refuse more pixels than that; before any threads start.
+void set_most_pixels(int64_t pixels);
+
 std::string to_string(const Size& size);
 
 }  // namespace tool

@@ -43,7 +43,7 @@ class Raw : public Source {
 public:
     Raw(Input input, const RawLayout& layout)
         : Source(std::move(input), {Container::kRaw, layout.format}) {
-        size_ = layout.size;
+        size_ = checked_size(layout.size.width, layout.size.height);
     }
 
     bool next(Picture* frame) override { return read_frame(frame); }

@@ -131,10 +131,10 @@ grep -q '^ovrinresize: -: ' stderr || complain "full standard output gives: $(ca
 # ---- What was done ----
 
 "$tool" in.ppm out.png -s 24x20 --verbose 2>stderr || complain "exit code $? of --verbose"
-grep -Eqx 'rgba 48x40 to 24x20: resized in [0-9]+\.[0-9]+ ms' stderr ||
+grep -Eqx 'rgba 48x40 to 24x20: resized by thumbnail in [0-9]+\.[0-9]+ ms' stderr ||
     complain "--verbose says: $(cat stderr)"
 "$tool" in.ppm out.png -c 96x40 -v 2>stderr || complain "exit code $? of -v"
-grep -Eqx 'rgba 48x40 to 48x40 on 96x40: resized in [0-9]+\.[0-9]+ ms' stderr ||
+grep -Eqx 'rgba 48x40 to 48x40 on 96x40: resized by lanczos in [0-9]+\.[0-9]+ ms' stderr ||
     complain "-v says: $(cat stderr)"
 
 # ---- What stands under the name of the result ----
@@ -171,10 +171,16 @@ for flag in --help -h; do
     [ ! -s stderr ] || complain "$flag writes to standard error"
     awk 'length > 100 { exit 1 }' help || complain "$flag has lines over 100 columns"
 done
-for option in --size --canvas --fit --gravity --engine --format --input-size --quality --background --premultiply --no-rotate --strip --verbose --help --version; do
+for option in --size --canvas --fit --gravity --engine --format --input-size --quality --background --premultiply --no-rotate --strip --max-pixels --quiet --json --verbose --help --version; do
     grep -q -e " ${option}[ ,]" help || complain "no $option in --help"
 done
+for flag in --help --version; do
+    "$tool" "$flag" >/dev/full 2>stderr && complain "success of $flag with a full standard output"
+    grep -q '^ovrinresize: standard output cannot be written' stderr || complain "$flag: $(cat stderr)"
+done
+"$tool" in.ppm out.png -s 3x3 --json >/dev/full 2>stderr && complain "success of --json, unprinted"
 for flag in --version -V; do
+    "$tool" "$flag" | grep -Eq '^libovrinresize [0-9.]+, kernels: (scalar|avx2|avx512|neon)$' || complain "$flag"
     "$tool" "$flag" | grep -Eq '^ovrinresize [0-9]+\.[0-9]+\.[0-9]+$' || complain "$flag"
 done
 

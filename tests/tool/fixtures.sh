@@ -166,3 +166,24 @@ at_least() {
 at_most() {
     [ "$2" -le "$1" ] && echo yes || echo "no: $2"
 }
+
+# json IN OUT -s SIZE ... KEY...: what the tool says of itself, by a reader of JSON that is not ours. Keys
+# are the arguments that do not start with - behind the last option's value.
+json() {
+    local arguments=("${@:1:4}") keys
+    shift 4
+    while [[ ${1:-} == -* ]]; do
+        arguments+=("$1" "$2")
+        shift 2
+    done
+    keys=$*
+    "$tool" "${arguments[@]}" --json | python3 -c '
+import json, re, sys
+report = json.loads(sys.stdin.read())
+def value(key):
+    names = re.findall(r"\w+", key)
+    found = report
+    for name in names: found = found[name]
+    return str(found)
+print(*map(value, sys.argv[1].split()))' "$keys"
+}

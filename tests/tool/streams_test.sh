@@ -168,6 +168,11 @@ if [ -z "${INSTRUMENTED:-}" ]; then
         ulimit -v 65536
         head -c 60000000 /dev/zero | "$tool" - - --format rgba --input-size 500x300 -s 50x30 >long.rgba
     ) || complain "exit code $? of a long stream in little memory"
+    (
+        ulimit -v 400000
+        fails 1 'in.i420: not enough memory' in.i420 no.rgba --format rgba --input-size 15000x15000 -s 9x9
+        exit "$failures"
+    ) || failures=$((failures + 1))
     [ "$(stat -c %s long.rgba)" = 600000 ] || complain "size of long.rgba"
 fi
 
@@ -198,7 +203,7 @@ else
 fi
 
 "$tool" in.y4m many.y4m -s 16x8 -v 2>stderr || complain "exit code $? of -v"
-grep -Eqx 'i420 32x16 to 16x8: 3 frames resized in [0-9]+\.[0-9]+ ms each' stderr ||
+grep -Eqx 'i420 32x16 to 16x8: 3 frames resized by quarter in [0-9]+\.[0-9]+ ms each' stderr ||
     complain "-v says: $(cat stderr)"
 
 finish
