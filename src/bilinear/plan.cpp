@@ -83,13 +83,13 @@ BilinearGeometry geometry_of_arguments(const BilinearCall& call) {
 
 BilinearLayout bilinear_layout(int32_t format) {
     switch (format) {
-        case 7:
-        case 8:
+        case OVRIN_FORMAT_PIXELS:
+        case OVRIN_FORMAT_PIXELS_2:
             return BilinearLayout::kPixels;
-        case 2:
+        case OVRIN_FORMAT_PLANAR:
             return BilinearLayout::kPlanar;
-        case 18:
-        case 19:
+        case OVRIN_FORMAT_SEMI_PLANAR:
+        case OVRIN_FORMAT_SEMI_PLANAR_2:
             return BilinearLayout::kSemiPlanar;
         default:
             return BilinearLayout::kUnknown;
