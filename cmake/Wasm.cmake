@@ -8,7 +8,9 @@ file(MAKE_DIRECTORY ${PROJECT_BINARY_DIR}/include)
 file(CREATE_LINK /usr/include/simde ${PROJECT_BINARY_DIR}/include/simde SYMBOLIC)
 target_include_directories(ovrinresize_objects SYSTEM PUBLIC
   ${native_dir} ${PROJECT_BINARY_DIR}/include)
-target_sources(ovrinresize_objects PRIVATE ${native_dir}/usleep.cpp)
+target_sources(ovrinresize_objects PRIVATE ${native_dir}/usleep.cpp ${native_dir}/no_pool.cpp)
+set_source_files_properties(src/pool/threadpool.cpp PROPERTIES COMPILE_DEFINITIONS
+  ovrin_threadpool_init=replaced_threadpool_init)
 set_target_properties(ovrinresize_objects PROPERTIES POSITION_INDEPENDENT_CODE OFF)
 # Offsets are computed in 64 bits; those of pictures in memory fit the 32 bits of addresses.
 target_compile_options(ovrinresize_warnings INTERFACE -Wno-shorten-64-to-32)

@@ -190,8 +190,7 @@ ovrin_threadpool* ovrin_threadpool_init(int32_t n) {
     ovrin_threadpool* pool = ovrin::make_pool(n);
     if (pool == nullptr) return nullptr;
     if (!ovrin::start_workers(pool, n)) {
-        // Without workers there is nobody to wait for.
-        ovrin_threadpool_free(pool, pool->thread_count == 0 ? 1 : 0);
+        ovrin_threadpool_free(pool, 0);
         return nullptr;
     }
     return pool;
