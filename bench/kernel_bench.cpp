@@ -76,7 +76,7 @@ Planned plan_quarter(const Kernels& set, int32_t bytes, const Ratio& ratio,
     run->dst.resize(static_cast<size_t>(kQuarterSamples * bytes));
     ovrin::QuarterColumns columns = {{ovrin::quarter_point(source), source, kQuarterSamples},
                                      {ovrin::three_quarter_point(source), source, kQuarterSamples}};
-    const ovrin::QuarterRowShape shape = {bytes, source, source, kQuarterSamples};
+    const ovrin::QuarterRowShape shape = {bytes, source, kQuarterSamples};
     ovrin::QuarterKernel* kernel =
         set.plan_quarters(run->plan, shape, columns, kQuarterSamples).*which;
     return {identity(kernel), [run, kernel](int rows) {

@@ -11,13 +11,16 @@
 #include "machine.h"
 #include "report.h"
 #include "stack.h"
+#include "threads.h"
 
 using namespace bench;
 
 namespace {
 
 constexpr char kUsage[] =
-    "Measures the library beside its peers and prints one table.\n"
+    "Measures the library beside its peers and prints one table; without a filter, another of "
+    "what\n"
+    "threads cost.\n"
     "\n"
     "  --filter TEXT   only cases whose family or name holds TEXT\n"
     "  --isa SET       our kernels: scalar, avx2 or avx512 (default: the library's choice)\n"
@@ -27,7 +30,8 @@ constexpr char kUsage[] =
     "  --json FILE     write all numbers\n"
     "  --chart FILE    write what bench/chart.gp draws\n"
     "  --stack         measure instead how much stack our calls take\n"
-    "  --kernels       measure instead each kernel of each set alone\n";
+    "  --kernels       measure instead each kernel of each set alone\n"
+    "  --threads       measure only what threads cost\n";
 
 struct Options {
     std::string filter;
@@ -37,6 +41,7 @@ struct Options {
     Effort effort = {Caches::kWarm, 31, 5e-4, 8};
     bool stack = false;
     bool kernels = false;
+    bool threads = false;
 };
 
 [[noreturn]] void give_up(const std::string& why) {
@@ -54,17 +59,13 @@ int positive_number(const char* text) {
 }
 
 Options parse(int argc, char** argv) {
-    static const option kOptions[] = {{"filter", required_argument, nullptr, 'f'},
-                                      {"isa", required_argument, nullptr, 'i'},
-                                      {"rounds", required_argument, nullptr, 'r'},
-                                      {"cold", no_argument, nullptr, 'C'},
-                                      {"quick", no_argument, nullptr, 'q'},
-                                      {"json", required_argument, nullptr, 'j'},
-                                      {"chart", required_argument, nullptr, 'c'},
-                                      {"stack", no_argument, nullptr, 's'},
-                                      {"kernels", no_argument, nullptr, 'k'},
-                                      {"help", no_argument, nullptr, 'h'},
-                                      {nullptr, 0, nullptr, 0}};
+    static const option kOptions[] = {
+        {"filter", required_argument, nullptr, 'f'}, {"isa", required_argument, nullptr, 'i'},
+        {"rounds", required_argument, nullptr, 'r'}, {"cold", no_argument, nullptr, 'C'},
+        {"quick", no_argument, nullptr, 'q'},        {"json", required_argument, nullptr, 'j'},
+        {"chart", required_argument, nullptr, 'c'},  {"stack", no_argument, nullptr, 's'},
+        {"kernels", no_argument, nullptr, 'k'},      {"threads", no_argument, nullptr, 't'},
+        {"help", no_argument, nullptr, 'h'},         {nullptr, 0, nullptr, 0}};
     Options options;
     for (int c; (c = getopt_long(argc, argv, "", kOptions, nullptr)) != -1;) {
         switch (c) {
@@ -96,6 +97,9 @@ Options parse(int argc, char** argv) {
                 break;
             case 'k':
                 options.kernels = true;
+                break;
+            case 't':
+                options.threads = true;
                 break;
             case 'h':
                 std::cout << kUsage;
@@ -164,7 +168,15 @@ void run_bench(const Options& options) {
         print_stack_use(std::cout, cases);
         return;
     }
+    if (options.threads) {
+        print_thread_costs(std::cout, options.effort);
+        return;
+    }
     const std::vector<Result> results = run(cases, options.effort);
+    if (options.filter.empty()) {
+        std::cout << '\n';
+        print_thread_costs(std::cout, options.effort);
+    }
     if (!options.json.empty()) {
         std::ofstream file = create(options.json);
         write_json(file, machine, results);

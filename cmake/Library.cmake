@@ -8,15 +8,14 @@ else()
 endif()
 
 add_library(ovrinresize_objects OBJECT
+  src/bands/pool.cpp
+  src/bands/sleep.cpp
   src/bilinear/plan.cpp
   src/bilinear/progressive.cpp
   src/bilinear/rows.cpp
   src/bilinear/single.cpp
   src/bilinear/threaded.cpp
   src/canvas/margin.cpp
-  src/dispatch/band_schedule.cpp
-  src/dispatch/helping_run.cpp
-  src/dispatch/sleep.cpp
   src/dispatch/wrappers.cpp
   src/kernels/bilinear_scalar.cpp
   src/kernels/cpu.cpp
@@ -34,6 +33,7 @@ add_library(ovrinresize_objects OBJECT
   src/pool/threadpool.cpp
   src/quarter/sampler.cpp
   src/quarter/scan.cpp
+  src/quarter/threaded.cpp
   src/rgba/nearest.cpp
   src/rgba/rgb888.cpp
   src/rgba/rgba8888.cpp
@@ -44,6 +44,7 @@ add_library(ovrinresize_objects OBJECT
   src/yuv420/bands.cpp
   src/yuv420/place.cpp
   src/yuv420/resize.cpp
+  src/yuv420/threaded.cpp
   src/yuv420/work_buffer.cpp)
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
   target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp

@@ -83,9 +83,9 @@ typedef struct ovrin_resize_target {
  * Resizes src (src_w x src_h pixels) into dst (dst_w x dst_h words). Byte n of a source pixel lands
  * in bits 8n to 8n+7 of the destination word, so in memory both have the same channel order.
  *
- * From 1024 source rows on, pictures that take longer than threads take to start are resized in
- * bands, on four worker threads that end before the call returns and on the calling thread; all
- * others on the calling thread alone. Both give the same bytes.
+ * From 1024 source rows on, the picture is resized in bands, on four worker threads that end before
+ * the call returns and on the calling thread; below that, on the calling thread alone. Nothing but
+ * the source height decides. Both give the same bytes.
  *
  * With a source size of 0 or less the destination is filled with 0; with a destination size of 0
  * or less nothing is written.
@@ -99,8 +99,8 @@ OVRIN_API void ovrin_resize_rgba8888_sg(const uint8_t* src, uint32_t* dst, int32
 
 /*
  * As ovrin_resize_rgba8888, in bands on worker threads whatever the height. Runs on the calling
- * thread instead when the picture makes fewer than two bands, when its byte offsets do not fit the
- * band record, or when memory or threads are missing.
+ * thread alone when the picture makes fewer than two bands, or when there is no memory for the
+ * threads; a thread that cannot be started is left out.
  */
 OVRIN_API void ovrin_resize_rgba8888_tps(const uint8_t* src, uint32_t* dst, int32_t src_w,
                                          int32_t src_h, int32_t dst_w, int32_t dst_h);
@@ -166,18 +166,25 @@ OVRIN_API void _resize_rgba8888_tp(void* band);
  * not drawn.
  *
  * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
- * dst_y), or dst_height is 0. Threads as ovrin_resize_rgba8888, by src_h.
+ * dst_y), or dst_height is 0. From 1024 source rows on as ovrin_resize_rgba_keep_ratio_tps, below
+ * that as ovrin_resize_rgba_keep_ratio_sg: they differ for a src_stride of 0 or less, and for a
+ * rectangle that begins at canvas row canvas_height.
  */
 OVRIN_API void ovrin_resize_rgba8888_keep_ratio(const uint8_t* src, int32_t src_w, int32_t src_h,
                                                 ovrin_resize_target* target);
 
-/* On the calling thread. A src_stride of 0 samples the first row for every destination row. */
+/*
+ * On the calling thread. A src_stride of 0 samples the first row for every destination row. A
+ * rectangle of which the cut leaves nothing gives an empty canvas.
+ */
 OVRIN_API void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t src_h,
                                                ovrin_resize_target* target);
 
 /*
  * In bands. Returns at once when target is null. A src_stride of 0 or less counts as the source
- * width here. Falls back to the calling thread as ovrin_resize_rgba8888_tps does.
+ * width here. A rectangle that begins at canvas row canvas_height leaves the canvas untouched. Does
+ * as ovrin_resize_rgba_keep_ratio_sg with what is left of the picture when that makes fewer than
+ * two bands, or when memory or a thread is missing.
  */
 OVRIN_API void ovrin_resize_rgba_keep_ratio_tps(const uint8_t* src, int32_t src_w, int32_t src_h,
                                                 ovrin_resize_target* target);
@@ -228,8 +235,9 @@ OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst,
  * Both are resized as RGBA8888 is, byte by byte. Chroma is sampled for the destination size rounded
  * up to multiples of 4 in each direction, and then cut to its own size: where the destination's
  * width or height is not a multiple of 4, the chroma that is kept covers a little less of the
- * source than the luma. Such sizes need a work buffer of 2 * width * height bytes, both rounded up;
- * without memory for it nothing is written. A destination size of 0 or less writes nothing; a
+ * source than the luma. On the calling thread, such sizes need a work buffer of 2 * width * height
+ * bytes, both rounded up; without memory for it nothing is written. A destination size of 0 or less
+ * writes nothing; a
  * source size of 0 or less fills the destination with 0, chroma included.
  *
  * The keep-ratio forms paint the target's canvas black (luma 0, chroma 128) and place the picture,
@@ -240,7 +248,7 @@ OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst,
  * samples, rounded up. The target is never written. Nothing is touched if canvas_width < dst_x,
  * canvas_height < dst_y or dst_height is 0.
  *
- * Wrappers and drivers divide the work as for RGBA8888.
+ * Which of them use threads, and what they do without, is as for RGBA8888.
  */
 
 /* I420 to I420, contiguous buffers. */

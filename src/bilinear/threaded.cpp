@@ -1,11 +1,9 @@
 // SPDX-License-Identifier: Apache-2.0
 // The bilinear engine in bands of destination rows. Bands copy samples where the single-threaded
 // way blends them.
-#include <stdlib.h>
-
+#include "bands/records.h"
+#include "bands/split.h"
 #include "bilinear/rows.h"
-#include "dispatch/band_size.h"
-#include "dispatch/helping_run.h"
 
 namespace ovrin {
 
@@ -57,43 +55,27 @@ void fill_bands(ovrin_bilinear_band* bands, int32_t count, int32_t height,
     bands[count - 1].edge_rows = edge_rows;
 }
 
-enum class Outcome { kDone, kUseSingleThread };
-
-// Takes the pool over.
-Outcome resize_on(ovrin_threadpool* pool, const BilinearCall& call,
-                  const BilinearGeometry& geometry, int32_t count, int32_t height) {
-    BilinearTables tables(call.dst_w, call.dst_h);
-    if (!tables.ready()) {
-        ovrin_threadpool_free(pool, 1);
-        return Outcome::kDone;
-    }
-    auto* bands = static_cast<ovrin_bilinear_band*>(
-        calloc(static_cast<size_t>(count), sizeof(ovrin_bilinear_band)));
-    if (bands == nullptr) {
-        ovrin_threadpool_free(pool, 1);
-        return Outcome::kUseSingleThread;
-    }
-    tables.fill(geometry);
-    const BilinearExtent extent = extent_of(geometry, tables);
-    fill_bands(bands, count, height, template_band(call, geometry, tables, extent),
-               extent.edge_rows);
-    clear_canvas(geometry, extent);
-    run_bands_with_caller(pool, _ov_bilinear_tp, bands, count, sizeof *bands);
-    free(bands);
-    return Outcome::kDone;
-}
-
-Outcome resize_in_bands(const BilinearCall& call) {
+// False when the picture is left to the calling thread.
+bool resize_in_bands(const BilinearCall& call) {
     const int32_t height = band_height(call.src_h, call.dst_h);
     const int32_t count = band_count(call.dst_h, height);
-    if (count < 2 || call.dst_h < kThreadedRows) return Outcome::kUseSingleThread;
+    if (count < 2 || call.dst_h < kThreadedRows) return false;
     const BilinearGeometry geometry = geometry_of(call);
-    if (!is_supported(geometry)) return Outcome::kDone;
     // A band record holds the source's row length in 32 bits.
-    if (src_row_bytes(geometry) > INT32_MAX) return Outcome::kUseSingleThread;
-    ovrin_threadpool* pool = ovrin_threadpool_init(kBandThreads);
-    if (pool == nullptr) return Outcome::kUseSingleThread;
-    return resize_on(pool, call, geometry, count, height);
+    if (!is_supported(geometry) || src_row_bytes(geometry) > INT32_MAX) return false;
+    BandPool pool;
+    if (!pool.ready()) return false;
+    BilinearTables tables(call.dst_w, call.dst_h);
+    if (!tables.ready()) return true;
+    const BandRecords<ovrin_bilinear_band> bands(count);
+    if (bands.data() == nullptr) return false;
+    tables.fill(geometry);
+    const BilinearExtent extent = extent_of(geometry, tables);
+    fill_bands(bands.data(), count, height, template_band(call, geometry, tables, extent),
+               extent.edge_rows);
+    clear_canvas(geometry, extent);
+    run_records(pool, _ov_bilinear_tp, bands);
+    return true;
 }
 
 }  // namespace
@@ -115,7 +97,7 @@ void ov_bilinear(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                  int32_t dst_h, int32_t format, const ovrin_resize_target* target) {
     if (src_w == 0 || src_h == 0 || dst_w < 1 || dst_h < 1) return;
     const BilinearCall call = {src, dst, src_w, src_h, dst_w, dst_h, format, target};
-    if (resize_in_bands(call) == Outcome::kUseSingleThread) {
+    if (!resize_in_bands(call)) {
         ov_bilinear_sg(src, dst, src_w, src_h, dst_w, dst_h, format, target);
     }
 }

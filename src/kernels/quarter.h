@@ -10,21 +10,21 @@ namespace ovrin {
 
 // The rows that a plan is for.
 struct QuarterRowShape {
-    int32_t sample_bytes;    // 1 to 4
-    int32_t source_samples;  // in a source row; taps are below this
-    int32_t source_extent;   // source_extent / target_extent is the ratio of the two rows
-    int32_t target_extent;
+    int32_t sample_bytes;  // 1 to 4
+    int32_t src_columns;   // samples in a source row; taps are below this
+    int32_t dst_columns;   // samples in a destination row
 };
 
 constexpr int32_t kPlanBytes = 32 * 1024;
 constexpr int32_t kPlanTaps = kPlanBytes / static_cast<int32_t>(sizeof(Tap));
 
-// Where a strip of a target row takes its samples: made once per call and strip, in fixed storage
-// on the stack, and used for every row of the strip. Kernels encode the taps in their own ways.
+// Where a strip of a destination row takes its samples: made once per call and strip, in fixed
+// storage on the stack, and used for every row of the strip. Kernels encode the taps in their own
+// ways.
 struct QuarterPlan {
     int32_t sample_bytes;
     int32_t samples;         // in the strip
-    int32_t vector_samples;  // vector kernels: in a target vector
+    int32_t vector_samples;  // vector kernels: in a destination vector
     int64_t row_bytes;
     union {
         alignas(64) Tap taps[kPlanTaps];
@@ -32,8 +32,8 @@ struct QuarterPlan {
     };
 };
 
-// The source rows of a target row, and those that will be asked for next, to be fetched meanwhile.
-// The next rows may be any.
+// The source rows of a destination row, and those that the next call will ask for, which kernels
+// may prefetch. They never read the next rows, whose pointers need not be valid.
 struct QuarterRows {
     const uint8_t* top;
     const uint8_t* bottom;
@@ -51,8 +51,8 @@ struct QuarterRows {
 //   quarters(row, i, c) = (row[N*left + c] >> 2) + (row[N*right + c] >> 2), the taps of sample i
 //
 // Four quarters reach at most 252, so no byte carries into the next. Additions wrap per byte.
-// Reads only bytes of the source_samples of each row; writes only bytes of the strip. No alignment
-// is needed; dst overlaps no source.
+// Reads only bytes of the src_columns samples of each row; writes only bytes of the strip. No
+// alignment is needed; dst overlaps no source.
 using QuarterKernel = void(uint8_t* dst, const QuarterRows& rows, const QuarterPlan& plan);
 struct QuarterKernels {
     QuarterKernel* store_pair;

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-// Quarter-point rows with AVX2. Byte shuffles stay inside 16-byte lanes, so each lane is a target
-// vector with windows of its own; two lanes go at a time.
+// Quarter-point rows with AVX2. Byte shuffles stay inside 16-byte lanes, so each lane is a
+// destination vector with windows of its own; two lanes go at a time.
 #include <immintrin.h>
 
 #include "kernels/inline.h"
@@ -13,7 +13,7 @@ namespace {
 
 constexpr int32_t kLane = 16;
 constexpr int32_t kVector = 32;
-constexpr int32_t kMostWindows = 8;
+constexpr int32_t kMaxWindows = 8;
 
 // Storage of a plan, for every two lanes.
 struct LanesEntry {
@@ -111,13 +111,9 @@ void put_lane(uint8_t* dst, __m128i samples) {
     _mm_storeu_si128(lane, samples);
 }
 
-// The last lanes of a strip go through a copy, so that nothing behind their bytes is touched.
 template <bool kAdd>
 void put_part(uint8_t* dst, __m128i samples, int32_t bytes) {
-    alignas(kLane) uint8_t copy[kLane];
-    if (kAdd) memcpy(copy, dst, static_cast<size_t>(bytes));
-    put_lane<kAdd>(copy, samples);
-    memcpy(dst, copy, static_cast<size_t>(bytes));
+    through_copy<kLane, kAdd>(dst, bytes, [&](uint8_t* copy) { put_lane<kAdd>(copy, samples); });
 }
 
 __m256i first_bytes_of_lanes(int32_t count) {
@@ -126,8 +122,8 @@ __m256i first_bytes_of_lanes(int32_t count) {
         _mm_cmplt_epi8(index, _mm_set1_epi8(static_cast<char>(count))));
 }
 
-// Whole lanes are stored as long as they end inside the strip: what lies behind the samples of one
-// is stored by the next.
+// Whole lanes are stored as long as they end inside the strip: what follows the samples of one is
+// stored by the next.
 template <int kWindows, bool kPair, bool kAdd>
 void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
     const QuarterRows rows = source;
@@ -159,7 +155,7 @@ constexpr QuarterKernels quarter_kernels() {
             run_windows<kWindows, false, true>};
 }
 
-constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
+constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
     quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>(),
     quarter_kernels<5>(), quarter_kernels<6>(), quarter_kernels<7>(), quarter_kernels<8>()};
 
@@ -167,11 +163,11 @@ constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
 
 const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
-    const WindowShape lane = window_shape(shape, kLane, kMostWindows);
+    const WindowShape lane = window_shape(shape, kLane, kMaxWindows);
     if (lane.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
     plan.sample_bytes = shape.sample_bytes;
     plan.vector_samples = 2 * lane.samples;
-    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
+    plan.row_bytes = int64_t{shape.src_columns} * shape.sample_bytes;
     plan_vectors<LanesEntry>(
         plan, shape, columns, samples, lane.windows * kLane, mask_bytes(lane.windows),
         [&](uint8_t* masks, LanesEntry& entry, const Tap* taps, int32_t count) {

@@ -2,6 +2,7 @@
 // Quarter-point rows with AVX-512, on processors whose byte permutations cross lanes (VBMI): one
 // permutation picks from two windows.
 #include <immintrin.h>
+#include <stddef.h>
 
 #include "kernels/inline.h"
 #include "kernels/quarter_windows_inl.h"
@@ -12,7 +13,7 @@ namespace ovrin {
 namespace {
 
 constexpr int32_t kVector = 64;
-constexpr int32_t kMostWindows = 4;
+constexpr int32_t kMaxWindows = 4;
 
 __m512i quarter(__m512i samples) {
     return _mm512_and_si512(_mm512_srli_epi16(samples, 2), _mm512_set1_epi8(0x3F));
@@ -68,8 +69,8 @@ __mmask64 first_bytes(int32_t count) {
     return ~uint64_t{0} >> (kVector - count);
 }
 
-// Whole vectors are stored as long as they end inside the strip: what lies behind the samples of
-// one is stored by the next.
+// Whole vectors are stored as long as they end inside the strip: what follows the samples of one
+// is stored by the next.
 template <int kWindows, bool kPair, bool kAdd>
 void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
     const QuarterRows rows = source;
@@ -99,14 +100,14 @@ constexpr QuarterKernels quarter_kernels() {
             run_windows<kWindows, false, true>};
 }
 
-constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
+constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
     quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>()};
 
 }  // namespace
 
 const QuarterKernels& plan_quarters_avx512(QuarterPlan& plan, const QuarterRowShape& shape,
                                            QuarterColumns& columns, int32_t samples) {
-    const WindowShape vector = window_shape(shape, kVector, kMostWindows);
+    const WindowShape vector = window_shape(shape, kVector, kMaxWindows);
     // Rows too short for these windows may have room for shorter ones.
     if (vector.windows == 0) return plan_quarters_avx2(plan, shape, columns, samples);
     plan_offsets<kVector>(plan, shape, vector, columns, samples);

@@ -14,7 +14,7 @@ namespace {
 
 constexpr int32_t kVector = 16;
 constexpr int32_t kTableWindows = 4;  // windows of one lookup
-constexpr int32_t kMostWindows = 8;
+constexpr int32_t kMaxWindows = 8;
 
 // The rows' quarters of one window.
 template <bool kPair>
@@ -81,13 +81,9 @@ void put(uint8_t* dst, uint8x16_t samples) {
     vst1q_u8(dst, kAdd ? vaddq_u8(samples, vld1q_u8(dst)) : samples);
 }
 
-// Through a copy, so that nothing behind the bytes is touched.
 template <bool kAdd>
 void put_part(uint8_t* dst, uint8x16_t samples, int32_t bytes) {
-    uint8_t copy[kVector];
-    if (kAdd) memcpy(copy, dst, static_cast<size_t>(bytes));
-    put<kAdd>(copy, samples);
-    memcpy(dst, copy, static_cast<size_t>(bytes));
+    through_copy<kVector, kAdd>(dst, bytes, [&](uint8_t* copy) { put<kAdd>(copy, samples); });
 }
 
 uint8x16_t first_bytes(int32_t count) {
@@ -96,10 +92,10 @@ uint8x16_t first_bytes(int32_t count) {
 }
 
 // Registers hold two vectors with the tables of this many windows.
-constexpr int32_t kMostWindowsOfTwo = 5;
+constexpr int32_t kMaxWindowsOfTwo = 5;
 
-// Whole vectors are stored as long as they end inside the strip: what lies behind the samples of
-// one is stored by the next. Two at a time, before either is stored: in-order processors would
+// Whole vectors are stored as long as they end inside the strip: what follows the samples of one
+// is stored by the next. Two at a time, before either is stored: in-order processors would
 // otherwise wait for the end of one before they begin the other.
 template <int kWindows, bool kPair, bool kAdd>
 void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
@@ -112,7 +108,7 @@ void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& pla
         const uint8x16_t samples = gather<kWindows, kPair>(rows, plan, at);
         return kAdd ? vandq_u8(samples, kept) : samples;
     };
-    if constexpr (kWindows <= kMostWindowsOfTwo) {
+    if constexpr (kWindows <= kMaxWindowsOfTwo) {
         for (; rest >= step + kVector; rest -= 2 * step, dst += 2 * step, entry += 2) {
             const uint8x16_t first = vector(entry[0]);
             const uint8x16_t second = vector(entry[1]);
@@ -132,7 +128,7 @@ constexpr QuarterKernels quarter_kernels() {
             run_windows<kWindows, false, true>};
 }
 
-constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
+constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
     quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>(),
     quarter_kernels<5>(), quarter_kernels<6>(), quarter_kernels<7>(), quarter_kernels<8>()};
 
@@ -140,7 +136,7 @@ constexpr QuarterKernels kQuarterKernels[kMostWindows] = {
 
 const QuarterKernels& plan_quarters_neon(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
-    const WindowShape vector = window_shape(shape, kVector, kMostWindows);
+    const WindowShape vector = window_shape(shape, kVector, kMaxWindows);
     if (vector.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
     plan_offsets<kVector>(plan, shape, vector, columns, samples);
     return kQuarterKernels[vector.windows - 1];

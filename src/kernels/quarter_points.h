@@ -5,55 +5,55 @@
 
 namespace ovrin {
 
-// The quarter or three-quarter points of successive targets along one axis, and the source cells
-// (rows or columns) that hold them.
+// The quarter or three-quarter points of successive destination cells (rows or columns) along one
+// axis, and the source cells that hold them.
 //
-// With S source cells scaled to D targets, the axis is measured in units of which a source cell
-// holds D and a target S. Target k's point lies at first + k * S, so in source cell
-// (first + k * S) / D. Stepping keeps quotient and remainder, so that walking an axis divides only
-// once and nothing overflows.
+// With S source cells scaled to D destination cells, the axis is measured in units of which a
+// source cell holds D and a destination cell S. The point of destination cell k lies at first + k *
+// S, so in source cell (first + k * S) / D. Stepping keeps quotient and remainder: walking an axis
+// divides only once, and nothing overflows.
 class QuarterPoints {
 public:
-    // Cells are counted from the one that starts at position 0. A point that lies before it is
-    // behind the walk: it, and all points after it, are never met.
-    QuarterPoints(int64_t first, int32_t source, int32_t target) {
-        if (first < 0 || source < 1 || target < 1) return;
-        cell_ = first / target;
-        rest_ = static_cast<int32_t>(first % target);
-        step_cells_ = source / target;
-        step_rest_ = source % target;
-        target_ = target;
+    // Source cells are counted from the one that starts at position 0. When the first point lies
+    // before that, the walk never meets a point.
+    QuarterPoints(int64_t first, int32_t source, int32_t destination) {
+        if (first < 0 || source < 1 || destination < 1) return;
+        cell_ = first / destination;
+        remainder_ = static_cast<int32_t>(first % destination);
+        step_cells_ = source / destination;
+        step_remainder_ = source % destination;
+        destination_ = destination;
     }
 
-    // The source cell that holds the current target's point.
+    // The source cell that holds the current point.
     int64_t cell() const { return cell_; }
 
     void next() {
         cell_ += step_cells_;
-        const int64_t rest = int64_t{rest_} + step_rest_;
-        const bool carry = rest >= target_;
+        const int64_t remainder = int64_t{remainder_} + step_remainder_;
+        const bool carry = remainder >= destination_;
         cell_ += carry ? 1 : 0;
-        rest_ = static_cast<int32_t>(carry ? rest - target_ : rest);
+        remainder_ = static_cast<int32_t>(carry ? remainder - destination_ : remainder);
     }
 
-    // To a later target whose point lies a whole number of cells further on.
+    // To a later point that lies a whole number of source cells further on.
     void skip_cells(int64_t cells) { cell_ += cells; }
 
 private:
     int64_t cell_ = INT64_MAX;
-    int32_t rest_ = 0;
+    int32_t remainder_ = 0;
     int32_t step_cells_ = 0;
-    int32_t step_rest_ = 0;
-    int32_t target_ = 1;
+    int32_t step_remainder_ = 0;
+    int32_t destination_ = 1;
 };
 
-// The source samples of one target sample within a row, as sample indices.
+// The source samples of one destination sample within a row, as sample indices.
 struct Tap {
-    int32_t left;   // at the target's quarter point
+    int32_t left;   // at the destination sample's quarter point
     int32_t right;  // at its three-quarter point; never less than left
 };
 
-// The columns of a row from some target sample on.
+// The columns of a row from some destination sample on.
 struct QuarterColumns {
     QuarterPoints left;
     QuarterPoints right;
@@ -71,7 +71,7 @@ struct QuarterColumns {
     }
 };
 
-// Where the first target's two points lie on an axis of `source` cells.
+// Where the first destination cell's two points lie on an axis of `source` cells.
 inline int32_t quarter_point(int32_t source) {
     return source >> 2;
 }

@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
-// How the vector sets plan a strip. A target vector holds a whole number of samples; its bytes are
-// gathered from a few whole source vectors, the windows, by byte shuffles. A window starts where
-// the target vector's first tap lies, or earlier at the end of a row: no window reaches past the
-// row, so kernels load whole vectors and have no border case.
+// How the vector sets plan a strip. A destination vector holds a whole number of samples; its bytes
+// are gathered from a few whole source vectors, the windows, by byte shuffles. A window starts
+// where the destination vector's first tap lies, or earlier at the end of a row: no window reaches
+// past the row, so kernels load whole vectors and have no border case.
 #pragma once
 
 #include <string.h>
@@ -13,42 +13,42 @@ namespace ovrin {
 
 namespace {
 
-// How a row is cut: the samples of a target vector and the windows that it takes. No windows: a
-// plan of this kind does not fit the row.
+// How a row is cut: the samples of a destination vector and the windows that it takes. No windows:
+// a plan of this kind does not fit the row.
 struct WindowShape {
     int32_t samples;
     int32_t windows;
 };
 
-// Windows of `window_bytes` that `samples` target samples need; 0 when they are too many, or longer
-// together than the source row.
+// Windows of `window_bytes` that `samples` destination samples need; 0 when they are more than
+// `max_windows`, or longer together than the source row.
 int32_t windows_needed(const QuarterRowShape& shape, int32_t samples, int32_t window_bytes,
-                       int32_t most) {
-    const int64_t s = shape.source_extent;
+                       int32_t max_windows) {
+    const int64_t s = shape.src_columns;
     const int64_t points = (samples - 1) * s + ((3 * s) >> 2) - (s >> 2);
     // Points `points` apart lie at most this many cells apart, wherever the first one lies.
-    const int64_t cells = (points + shape.target_extent - 1) / shape.target_extent;
+    const int64_t cells = (points + shape.dst_columns - 1) / shape.dst_columns;
     const int64_t windows = ((cells + 1) * shape.sample_bytes + window_bytes - 1) / window_bytes;
-    const int64_t row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
-    const bool fits = windows <= most && windows * window_bytes <= row_bytes;
+    const int64_t row_bytes = int64_t{shape.src_columns} * shape.sample_bytes;
+    const bool fits = windows <= max_windows && windows * window_bytes <= row_bytes;
     return fits && row_bytes <= INT32_MAX ? static_cast<int32_t>(windows) : 0;
 }
 
 // As many samples in a vector as the windows allow: half and a quarter of a vector still beat
 // samples one by one. Of many samples only a multiple of four: simple ratios then repeat from
 // vector to vector.
-WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes, int32_t most) {
+WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes, int32_t max_windows) {
     int32_t samples = vector_bytes / shape.sample_bytes;
     if (samples > 16) samples -= samples % 4;
     for (int32_t halvings = 0; halvings < 4 && samples > 1; ++halvings, samples /= 2) {
-        const int32_t windows = windows_needed(shape, samples, vector_bytes, most);
+        const int32_t windows = windows_needed(shape, samples, vector_bytes, max_windows);
         if (windows > 0) return {samples, windows};
     }
     return {0, 0};
 }
 
-// The taps of a target vector, as bytes from the start of its windows, which span at most 256 bytes
-// together. Bytes behind the vector's last sample are any.
+// The taps of a destination vector, as bytes from the start of its windows, which span at most 256
+// bytes together. What follows the vector's last sample has no meaning.
 struct WindowTaps {
     alignas(64) uint8_t left[64 + sizeof(uint32_t)];
     alignas(64) uint8_t right[64 + sizeof(uint32_t)];
@@ -75,11 +75,21 @@ void locate_taps(WindowTaps& window, const Tap* taps, int32_t count, const Quart
     }
 }
 
+// Lets `put` write a vector whose first bytes belong to dst: into a copy, so that nothing past them
+// is touched.
+template <int32_t kVector, bool kAdd, class Put>
+void through_copy(uint8_t* dst, int32_t bytes, const Put& put) {
+    alignas(kVector) uint8_t copy[kVector];
+    if (kAdd) memcpy(copy, dst, static_cast<size_t>(bytes));
+    put(copy);
+    memcpy(dst, copy, static_cast<size_t>(bytes));
+}
+
 // Source cells from one vector's taps to the next one's, where all vectors have the same taps but
 // for that; 0 where they have not.
 int64_t repeating_cells(const QuarterRowShape& shape, int32_t samples) {
-    const int64_t points = int64_t{samples} * shape.source_extent;
-    return points % shape.target_extent == 0 ? points / shape.target_extent : 0;
+    const int64_t points = int64_t{samples} * shape.src_columns;
+    return points % shape.dst_columns == 0 ? points / shape.dst_columns : 0;
 }
 
 // Plans vectors until the samples or the storage end. Entries, one for each vector, grow from the
@@ -88,7 +98,7 @@ int64_t repeating_cells(const QuarterRowShape& shape, int32_t samples) {
 //
 // encode(masks, entry, taps, count) writes the masks of the vector with these taps, and all of its
 // entry but where the masks are. An entry's move(bytes, last_base) moves its windows on; false, and
-// nothing is moved, when one would begin behind last_base.
+// nothing is moved, when one would begin past last_base.
 template <class Entry, class Encode>
 void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumns& columns,
                   int32_t samples, int32_t span, int32_t mask_bytes, const Encode& encode) {
@@ -126,8 +136,8 @@ void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumn
     }
 }
 
-// The plan of sets that shuffle whole vectors: of every target vector, the offsets of its taps from
-// the start of its windows.
+// The plan of sets that shuffle whole vectors: of every destination vector, the offsets of its taps
+// from the start of its windows.
 struct VectorEntry {
     int32_t base;   // first byte of the windows within a row
     int32_t masks;  // where its Offsets lie in the plan
@@ -151,7 +161,7 @@ void plan_offsets(QuarterPlan& plan, const QuarterRowShape& shape, const WindowS
     const int32_t span = vector.windows * kVector;
     plan.sample_bytes = shape.sample_bytes;
     plan.vector_samples = vector.samples;
-    plan.row_bytes = int64_t{shape.source_samples} * shape.sample_bytes;
+    plan.row_bytes = int64_t{shape.src_columns} * shape.sample_bytes;
     const auto encode = [&](uint8_t* masks, VectorEntry& entry, const Tap* taps, int32_t count) {
         WindowTaps window;
         locate_taps(window, taps, count, plan, span);

@@ -3,8 +3,8 @@
 #include <ovrinresize.h>
 #include <string.h>
 
-#include "dispatch/band_size.h"
-#include "dispatch/helping_run.h"
+#include "bands/records.h"
+#include "bands/split.h"
 #include "kernels/kernels.h"
 #include "lanczos/rows.h"
 
@@ -41,37 +41,23 @@ void fill_bands(ovrin_lanczos_band* bands, int32_t count, int32_t height, const 
     }
 }
 
-enum class Outcome { kDone, kUseSingleThread };
-
-// Takes the pool over.
-Outcome resize_on(ovrin_threadpool* pool, const LanczosCall& call, int32_t count, int32_t height) {
-    LanczosPlan plan(call.dst_w, call.dst_h);
-    if (!plan.ready()) {
-        ovrin_threadpool_free(pool, 1);
-        return Outcome::kDone;
-    }
-    auto* bands = static_cast<ovrin_lanczos_band*>(
-        calloc(static_cast<size_t>(count), sizeof(ovrin_lanczos_band)));
-    if (bands == nullptr) {
-        ovrin_threadpool_free(pool, 1);
-        return Outcome::kUseSingleThread;
-    }
-    plan.fill(call.src_w, call.src_h);
-    fill_bands(bands, count, height, call, plan);
-    memset(call.dst, 0,
-           static_cast<size_t>(call.dst_w) * static_cast<size_t>(call.dst_h) * kPlacedBytes);
-    run_bands_with_caller(pool, _resize_lanczos_tp, bands, count, sizeof *bands);
-    free(bands);
-    return Outcome::kDone;
-}
-
-Outcome resize_in_bands(const LanczosCall& call) {
+// False when the picture is left to the calling thread.
+bool resize_in_bands(const LanczosCall& call) {
     const int32_t height = band_height(call.src_h, call.dst_h);
     const int32_t count = band_count(call.dst_h, height);
-    if (count < 2 || is_empty(call)) return Outcome::kUseSingleThread;
-    ovrin_threadpool* pool = ovrin_threadpool_init(kBandThreads);
-    if (pool == nullptr) return Outcome::kUseSingleThread;
-    return resize_on(pool, call, count, height);
+    if (count < 2 || is_empty(call)) return false;
+    BandPool pool;
+    if (!pool.ready()) return false;
+    LanczosPlan plan(call.dst_w, call.dst_h);
+    if (!plan.ready()) return true;
+    const BandRecords<ovrin_lanczos_band> bands(count);
+    if (bands.data() == nullptr) return false;
+    plan.fill(call.src_w, call.src_h);
+    fill_bands(bands.data(), count, height, call, plan);
+    memset(call.dst, 0,
+           static_cast<size_t>(call.dst_w) * static_cast<size_t>(call.dst_h) * kPlacedBytes);
+    run_records(pool, _resize_lanczos_tp, bands);
+    return true;
 }
 
 }  // namespace
@@ -107,7 +93,7 @@ void _resize_lanczos_tp(void* band) {
 void ovrin_resize_lanczos(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                           int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel) {
     const LanczosCall call = {src, dst, src_w, src_h, dst_w, dst_h, bytes_per_pixel};
-    if (resize_in_bands(call) == Outcome::kUseSingleThread) {
+    if (!resize_in_bands(call)) {
         ov_lanczos(src, src_w, src_h, dst, dst_w, dst_h, bytes_per_pixel);
     }
 }

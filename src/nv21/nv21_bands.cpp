@@ -8,42 +8,21 @@ namespace ovrin {
 
 namespace {
 
-void run_contiguous(void* band, BandRows whole_rows) {
+void run_contiguous(void* band) {
     auto& record = *static_cast<ovrin_nv21_band*>(band);
     run_yuv420_band(
         record,
         contiguous_source(kInterleavedChroma, record.src, record.src_width, record.src_height),
-        contiguous_target(record), record.src_vu_offset, record.vu_rows, whole_rows);
+        contiguous_target(record), record.src_vu_offset, record.vu_rows);
 }
 
-void run_separate(void* band, BandRows whole_rows) {
+void run_separate(void* band) {
     auto& record = *static_cast<ovrin_nv21_band*>(band);
     run_yuv420_band(record,
                     two_planes(record.src, record.src_vu, record.src_width, record.src_height,
                                record.src_row_bytes),
-                    separate_target(record), record.src_vu_offset, record.vu_rows, whole_rows);
+                    separate_target(record), record.src_vu_offset, record.vu_rows);
 }
-
-using Bands = Yuv420Bands<ovrin_nv21_band, &ovrin_nv21_band::vu_start_row,
-                          &ovrin_nv21_band::vu_rows, ovrin_resize_nv21_get_pos>;
-
-struct ContiguousBands : Bands {
-    static Band first(const Yuv420Source& source, const BandDestination& to) {
-        return first_band<Band>(source, to);
-    }
-
-    static void task(void* band) { run_contiguous(band, BandRows::kStore); }
-};
-
-struct TwoPlaneBands : Bands {
-    static Band first(const Yuv420Source& source, const BandDestination& to) {
-        Band band = first_band<Band>(source, to);
-        band.src_vu = source.chroma_planes[0];
-        return band;
-    }
-
-    static void task(void* band) { run_separate(band, BandRows::kStore); }
-};
 
 int64_t chroma_row_bytes(int32_t luma_row_bytes) {
     return int64_t{half_rounded_up(luma_row_bytes)} * kInterleavedChroma.sample_bytes;
@@ -77,17 +56,17 @@ void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, int32_t ds
 }
 
 void _resize_nv21_tp(void* band) {
-    run_contiguous(band, BandRows::kAdd);
+    run_contiguous(band);
 }
 
 void _resize_y_nv21_tp(void* band) {
-    run_separate(band, BandRows::kAdd);
+    run_separate(band);
 }
 
 void ovrin_resize_nv21_tps(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                            int32_t dst_w, int32_t dst_h) {
     const Yuv420Source source = contiguous_source(kInterleavedChroma, src, src_w, src_h);
-    if (!resize_yuv420_in_bands<ContiguousBands>(source, {dst, dst_w, dst_h, nullptr})) {
+    if (!resize_yuv420_in_bands(source, dst, dst_w, dst_h)) {
         ovrin_resize_nv21_sg(src, dst, src_w, src_h, dst_w, dst_h);
     }
 }
@@ -98,9 +77,10 @@ void ovrin_resize_y_nv_tps(const uint8_t* src_y, const uint8_t* src_vu, uint8_t*
     if (target != nullptr && threaded_canvas_is_rejected(*target)) return;
     const Yuv420Source source =
         two_planes(src_y, src_vu, src_w, src_h, threaded_row_bytes(target, src_w));
-    const BandDestination to =
-        target != nullptr ? in_canvas(*target) : BandDestination{dst, dst_w, dst_h, nullptr};
-    if (src_h < kThreadedRows || !resize_yuv420_in_bands<TwoPlaneBands>(source, to)) {
+    const bool done = src_h >= kThreadedRows &&
+                      (target != nullptr ? resize_yuv420_into_canvas_in_bands(source, *target)
+                                         : resize_yuv420_in_bands(source, dst, dst_w, dst_h));
+    if (!done) {
         ovrin_resize_y_nv_sg(src_y, src_vu, dst, src_w, src_h, dst_w, dst_h, target);
     }
 }

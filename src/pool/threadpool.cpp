@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <ovrinresize.h>
+#include "pool/threadpool.h"
+
 #include <stdlib.h>
 #include <string.h>
 
@@ -82,16 +83,6 @@ bool init_fields(ovrin_threadpool* pool, int32_t n) {
     return pool->threads != nullptr;
 }
 
-bool start_workers(ovrin_threadpool* pool, int32_t n) {
-    while (pool->thread_count < n) {
-        if (pthread_create(&pool->threads[pool->thread_count], nullptr, worker_loop, pool) != 0) {
-            return false;
-        }
-        ++pool->thread_count;
-    }
-    return true;
-}
-
 // A slot that the submitter owns: it is in neither queue.
 struct Acquired {
     ovrin_threadpool_task* slot;
@@ -121,6 +112,31 @@ bool submit_slot(ovrin_threadpool* pool, ovrin_threadpool_task* slot) {
 }
 
 }  // namespace
+
+namespace ovrin {
+
+ovrin_threadpool* make_pool(int32_t n) {
+    if (n > UINT16_MAX) return nullptr;
+    auto* pool = static_cast<ovrin_threadpool*>(malloc(sizeof(ovrin_threadpool)));
+    if (pool == nullptr) return nullptr;
+    if (!init_fields(pool, n)) {
+        free(pool);
+        return nullptr;
+    }
+    return pool;
+}
+
+bool start_workers(ovrin_threadpool* pool, int32_t n) {
+    while (pool->thread_count < n) {
+        if (pthread_create(&pool->threads[pool->thread_count], nullptr, worker_loop, pool) != 0) {
+            return false;
+        }
+        ++pool->thread_count;
+    }
+    return true;
+}
+
+}  // namespace ovrin
 
 int32_t ovrin_threadpool_queue_enqueue(ovrin_threadpool_queue* queue, void* entry) {
     if (queue->count == kCapacity) return -1;
@@ -171,14 +187,9 @@ ovrin_threadpool_task* ovrin_threadpool_task_get_task(ovrin_threadpool* pool) {
 }
 
 ovrin_threadpool* ovrin_threadpool_init(int32_t n) {
-    if (n > UINT16_MAX) return nullptr;
-    auto* pool = static_cast<ovrin_threadpool*>(malloc(sizeof(ovrin_threadpool)));
+    ovrin_threadpool* pool = ovrin::make_pool(n);
     if (pool == nullptr) return nullptr;
-    if (!init_fields(pool, n)) {
-        free(pool);
-        return nullptr;
-    }
-    if (!start_workers(pool, n)) {
+    if (!ovrin::start_workers(pool, n)) {
         ovrin_threadpool_free(pool, 0);
         return nullptr;
     }

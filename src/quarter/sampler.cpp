@@ -10,11 +10,11 @@ namespace ovrin {
 namespace {
 
 // Where the next samples of a source row go: those of the left columns and those of the right ones.
-struct RowTarget {
+struct RowDestination {
     uint8_t* left;
     uint8_t* right;
 
-    bool operator==(const RowTarget& other) const {
+    bool operator==(const RowDestination& other) const {
         return left == other.left && right == other.right;
     }
     void move(ptrdiff_t bytes) {
@@ -27,16 +27,15 @@ struct RowTarget {
 struct RowScan {
     QuarterPoints top;
     QuarterPoints bottom;
-    RowTarget top_target;
-    RowTarget bottom_target;
+    RowDestination top_dst;
+    RowDestination bottom_dst;
     int64_t rows;  // source rows in the scan
 
     bool has_top() const { return top.cell() < rows; }
     bool has_bottom() const { return bottom.cell() < rows; }
-    // Both rows of one target row lie in the scan and have all four samples in one place.
+    // Both rows of one destination row lie in the scan and have all four samples in one place.
     bool has_pair() const {
-        return has_top() && has_bottom() && top_target == bottom_target &&
-               top_target.left == top_target.right;
+        return has_top() && has_bottom() && top_dst == bottom_dst && top_dst.left == top_dst.right;
     }
 };
 
@@ -50,16 +49,16 @@ struct Strip {
 // Calls walk(strip, bytes to its left) for one strip after another.
 template <class Walk>
 void for_each_strip(const QuarterPlane& plane, const Walk& walk) {
-    const QuarterRowShape shape = {plane.sample_bytes, plane.src_samples, plane.src_columns,
-                                   plane.dst_columns};
+    PlanQuarters* const plan_quarters = kernels().plan_quarters;
+    const QuarterRowShape shape = {plane.sample_bytes, plane.src_columns, plane.dst_columns};
     QuarterColumns columns = {
         {quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns},
         {three_quarter_point(plane.src_columns), plane.src_columns, plane.dst_columns}};
     QuarterPlan plan;
-    for (int32_t done = 0; done < plane.samples; done += plan.samples) {
+    for (int32_t done = 0; done < plane.columns; done += plan.samples) {
         const QuarterColumns first = columns;
         const QuarterKernels& strip_kernels =
-            kernels().plan_quarters(plan, shape, columns, plane.samples - done);
+            plan_quarters(plan, shape, columns, plane.columns - done);
         walk(Strip{strip_kernels, plan, first}, ptrdiff_t{done} * plane.sample_bytes);
     }
 }
@@ -68,7 +67,7 @@ const uint8_t* row_at(const QuarterPlane& plane, const QuarterPoints& points) {
     return plane.src + points.cell() * plane.src_pitch;
 }
 
-// The row of the point after this one, or this one's if that lies behind the plane's `rows`.
+// The row of the next point, or this one's when the next lies past the plane's `rows`.
 const uint8_t* row_after(const QuarterPlane& plane, QuarterPoints points, int64_t rows) {
     const uint8_t* current = row_at(plane, points);
     points.next();
@@ -81,10 +80,22 @@ QuarterRows rows_at(const QuarterPlane& plane, const QuarterPoints& top,
             row_after(plane, bottom, rows)};
 }
 
-void store_strip(const QuarterPlane& plane, const Strip& strip, uint8_t* dst) {
-    QuarterPoints top(quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows);
-    QuarterPoints bottom(three_quarter_point(plane.src_rows), plane.src_rows, plane.dst_rows);
-    for (int32_t j = 0; j < plane.rows; ++j, dst += plane.dst_pitch) {
+// Destination rows [first, end) of a plane.
+struct RowRange {
+    int32_t first;
+    int32_t end;
+};
+
+// The points of a plane's rows from `row` on; `point` is that of the first row.
+QuarterPoints points_from(const QuarterPlane& plane, int32_t point, int32_t row) {
+    return {point + int64_t{row} * plane.src_rows, plane.src_rows, plane.dst_rows};
+}
+
+void store_strip(const QuarterPlane& plane, const Strip& strip, uint8_t* dst, RowRange range) {
+    QuarterPoints top = points_from(plane, quarter_point(plane.src_rows), range.first);
+    QuarterPoints bottom = points_from(plane, three_quarter_point(plane.src_rows), range.first);
+    dst += range.first * plane.dst_pitch;
+    for (int32_t j = range.first; j < range.end; ++j, dst += plane.dst_pitch) {
         strip.kernels.store_pair(dst, rows_at(plane, top, bottom, plane.src_rows), strip.plan);
         top.next();
         bottom.next();
@@ -100,22 +111,20 @@ void add_taps(uint8_t* dst, const uint8_t* row, QuarterPoints points, const Quar
     }
 }
 
-void add_row(const Strip& strip, const RowTarget& target, const uint8_t* row) {
-    if (target.left == target.right) {
-        strip.kernels.add_row(target.left, {row, row, row, row}, strip.plan);
+void add_row(const Strip& strip, const RowDestination& dst, const uint8_t* row) {
+    if (dst.left == dst.right) {
+        strip.kernels.add_row(dst.left, {row, row, row, row}, strip.plan);
         return;
     }
     // Only a record that no walk has made sends the columns' samples to two places.
-    add_taps(target.left, row, strip.columns.left, strip.plan);
-    add_taps(target.right, row, strip.columns.right, strip.plan);
+    add_taps(dst.left, row, strip.columns.left, strip.plan);
+    add_taps(dst.right, row, strip.columns.right, strip.plan);
 }
 
-// A target row whose two source rows both lie in the scan is done in one go. Bands also hold halves
-// of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
-// behind.
-void run_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip, BandRows whole_rows) {
-    const auto pair =
-        whole_rows == BandRows::kStore ? strip.kernels.store_pair : strip.kernels.add_pair;
+// A destination row whose two source rows both lie in the scan is done in one go. Bands also hold
+// halves of such pairs: a bottom row whose top lies in the band before, a top row whose bottom lies
+// in the band after.
+void add_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip) {
     while (scan.has_top() || scan.has_bottom()) {
         const bool both = scan.has_pair();
         // On one source row the bottom half goes first: it closes the row that is open.
@@ -123,46 +132,65 @@ void run_strip(const QuarterPlane& plane, RowScan scan, const Strip& strip, Band
         const bool take_top = both || (scan.has_top() && top_is_next);
         const bool take_bottom = both || !take_top;
         if (both) {
-            pair(scan.top_target.left, rows_at(plane, scan.top, scan.bottom, scan.rows),
-                 strip.plan);
+            strip.kernels.add_pair(scan.top_dst.left,
+                                   rows_at(plane, scan.top, scan.bottom, scan.rows), strip.plan);
         } else if (take_top) {
-            add_row(strip, scan.top_target, row_at(plane, scan.top));
+            add_row(strip, scan.top_dst, row_at(plane, scan.top));
         } else {
-            add_row(strip, scan.bottom_target, row_at(plane, scan.bottom));
+            add_row(strip, scan.bottom_dst, row_at(plane, scan.bottom));
         }
         if (take_top) {
             scan.top.next();
-            scan.top_target.move(plane.dst_pitch);
+            scan.top_dst.move(plane.dst_pitch);
         }
         if (take_bottom) {
             scan.bottom.next();
-            scan.bottom_target.move(plane.dst_pitch);
+            scan.bottom_dst.move(plane.dst_pitch);
         }
     }
 }
 
-void clear_plane(const QuarterPlane& plane) {
+void clear_rows(const QuarterPlane& plane, RowRange range) {
     const size_t row_bytes =
-        static_cast<size_t>(plane.samples) * static_cast<size_t>(plane.sample_bytes);
-    uint8_t* row = plane.dst;
-    for (int32_t j = 0; j < plane.rows; ++j, row += plane.dst_pitch) memset(row, 0, row_bytes);
+        static_cast<size_t>(plane.columns) * static_cast<size_t>(plane.sample_bytes);
+    uint8_t* row = plane.dst + range.first * plane.dst_pitch;
+    for (int32_t j = range.first; j < range.end; ++j, row += plane.dst_pitch) {
+        memset(row, 0, row_bytes);
+    }
+}
+
+// Stores the rows that take(work) gives to work(range), once for every strip of the plane.
+template <class Take>
+void store_rows(const QuarterPlane& plane, const Take& take) {
+    if (plane.columns < 1 || plane.rows < 1) return;
+    if (plane.src_columns < 1 || plane.src_rows < 1) {
+        take([&](RowRange range) { clear_rows(plane, range); });
+        return;
+    }
+    for_each_strip(plane, [&](const Strip& strip, ptrdiff_t offset) {
+        take([&](RowRange range) { store_strip(plane, strip, plane.dst + offset, range); });
+    });
 }
 
 }  // namespace
 
 void sample_plane(const QuarterPlane& plane) {
-    if (plane.samples < 1 || plane.rows < 1) return;
-    if (plane.src_columns < 1 || plane.src_rows < 1) {
-        clear_plane(plane);
-        return;
-    }
-    for_each_strip(plane, [&](const Strip& strip, ptrdiff_t offset) {
-        store_strip(plane, strip, plane.dst + offset);
+    store_rows(plane, [&](const auto& store) { store(RowRange{0, plane.rows}); });
+}
+
+void sample_plane_in_turns(const QuarterPlane& plane, TurnTaker& turns) {
+    store_rows(plane, [&](const auto& store) {
+        turns.take_pass([&](Turn turn) {
+            const auto row = [&](int32_t band) {
+                return static_cast<int32_t>(int64_t{plane.rows} * band / turns.bands());
+            };
+            store(RowRange{row(turn.first), row(turn.end)});
+        });
     });
 }
 
-void run_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, int32_t index_bytes,
-              BandRows whole_rows) {
+void add_band(const QuarterPlane& plane, const ScanState& state, int32_t band_rows,
+              int32_t index_bytes) {
     if (plane.src_columns < 1) return;
     const auto at = [&](int32_t index) { return plane.dst + ptrdiff_t{index} * index_bytes; };
     const ScanAxis axis = {plane.src_rows, plane.dst_rows, 0};
@@ -171,13 +199,13 @@ void run_band(const QuarterPlane& plane, const ScanState& state, int32_t rows, i
         bottom_points(state, axis),
         {at(state.top_left), at(state.top_right)},
         {at(state.bottom_left), at(state.bottom_right)},
-        rows,
+        band_rows,
     };
     for_each_strip(plane, [&](const Strip& strip, ptrdiff_t offset) {
         RowScan scan = whole;
-        scan.top_target.move(offset);
-        scan.bottom_target.move(offset);
-        run_strip(plane, scan, strip, whole_rows);
+        scan.top_dst.move(offset);
+        scan.bottom_dst.move(offset);
+        add_strip(plane, scan, strip);
     });
 }
 

@@ -16,9 +16,9 @@ int64_t count_points(QuarterPoints points, int32_t rows) {
 void walk_rows(ScanState& state, const ScanAxis& axis, int32_t rows) {
     const int64_t top = count_points(top_points(state, axis), rows);
     const int64_t bottom = count_points(bottom_points(state, axis), rows);
-    state.top_point = wrapping_add(state.top_point, top * axis.source_rows);
-    state.bottom_point = wrapping_add(state.bottom_point, bottom * axis.source_rows);
-    state.row_base = wrapping_add(state.row_base, int64_t{rows} * axis.target_rows);
+    state.top_point = wrapping_add(state.top_point, top * axis.src_rows);
+    state.bottom_point = wrapping_add(state.bottom_point, bottom * axis.src_rows);
+    state.row_base = wrapping_add(state.row_base, int64_t{rows} * axis.dst_rows);
     state.top_left = wrapping_add(state.top_left, top * axis.row_indices);
     state.top_right = wrapping_add(state.top_right, top * axis.row_indices);
     state.bottom_left = wrapping_add(state.bottom_left, bottom * axis.row_indices);

@@ -7,11 +7,11 @@ namespace ovrin {
 
 // The vertical state of the sampler, frozen between two source rows, as band records hold it.
 //
-// A target row takes samples from a top source row (its quarter point) and a bottom one (its
+// A destination row takes samples from a top source row (its quarter point) and a bottom one (its
 // three-quarter point). The points and the base of the current source row are positions on the
-// vertical axis (see QuarterPoints); the indices say where in the target the next samples of each
-// kind are added. Points and base wrap at 32 bits in tall pictures; only their distance is used,
-// which stays below source + target rows.
+// vertical axis (see QuarterPoints); the indices say where in the destination the next samples of
+// each kind are added. Points and base wrap at 32 bits in tall pictures; only their distance is
+// used, which stays below source + destination rows.
 struct ScanState {
     int32_t top_point;
     int32_t bottom_point;
@@ -22,10 +22,10 @@ struct ScanState {
     int32_t bottom_right;
 };
 
-// The rows of one plane: source rows, target rows, and the target indices from one row to the next.
+// The rows of one plane, and the destination indices from one row to the next.
 struct ScanAxis {
-    int32_t source_rows;
-    int32_t target_rows;
+    int32_t src_rows;
+    int32_t dst_rows;
     int32_t row_indices;
 };
 
@@ -40,20 +40,20 @@ inline int32_t distance_to(const ScanState& state, int32_t point) {
 }
 
 inline QuarterPoints top_points(const ScanState& state, const ScanAxis& axis) {
-    return {distance_to(state, state.top_point), axis.source_rows, axis.target_rows};
+    return {distance_to(state, state.top_point), axis.src_rows, axis.dst_rows};
 }
 
 inline QuarterPoints bottom_points(const ScanState& state, const ScanAxis& axis) {
-    return {distance_to(state, state.bottom_point), axis.source_rows, axis.target_rows};
+    return {distance_to(state, state.bottom_point), axis.src_rows, axis.dst_rows};
 }
 
 // Records do not hold the first points: a picture that has not been started has none yet.
-inline void start_points(ScanState& state, int32_t source_rows) {
-    state.top_point = quarter_point(source_rows);
-    state.bottom_point = three_quarter_point(source_rows);
+inline void start_points(ScanState& state, int32_t src_rows) {
+    state.top_point = quarter_point(src_rows);
+    state.bottom_point = three_quarter_point(src_rows);
 }
 
-// Some target row has received its top samples but not yet its bottom samples.
+// Some destination row has received its top samples but not yet its bottom samples.
 inline bool row_is_open(const ScanState& state) {
     return state.top_left != state.bottom_left || state.top_right != state.bottom_right ||
            state.top_left != state.top_right;

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "rgba/rgba_band.h"
 
-#include <string.h>
-
 namespace ovrin {
 
 namespace {
@@ -25,25 +23,21 @@ void store_scan_state(ovrin_rgba_band& band, const ScanState& state) {
     band.di_33 = state.bottom_right;
 }
 
-void sample_rgba_band(const ovrin_rgba_band& band, const RgbaRows& rows, BandRows whole_rows) {
-    const QuarterPlane plane = {
-        band.src + band.src_offset,
-        ptrdiff_t{rows.src_pixels} * kRgbaBytes,
-        band.src_w,
-        band.src_h,
-        reinterpret_cast<uint8_t*>(band.dst + rows.dst_x),
-        ptrdiff_t{rows.dst_pixels} * kRgbaBytes,
-        band.dst_w,
-        band.dst_h,
-        band.dst_h,
-        band.dst_w,
-        band.src_w,
-        kRgbaBytes,
-    };
-    run_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes, whole_rows);
-}
-
 }  // namespace
+
+QuarterPlane rgba_plane(const RgbaSource& src, const RgbaDestination& dst) {
+    QuarterPlane plane = {};
+    plane.src = src.pixels;
+    plane.src_pitch = ptrdiff_t{src.stride} * kRgbaBytes;
+    plane.src_columns = src.width;
+    plane.src_rows = src.height;
+    plane.dst = reinterpret_cast<uint8_t*>(dst.pixels);
+    plane.dst_pitch = ptrdiff_t{dst.stride} * kRgbaBytes;
+    plane.dst_columns = plane.columns = dst.width;
+    plane.dst_rows = plane.rows = dst.height;
+    plane.sample_bytes = kRgbaBytes;
+    return plane;
+}
 
 void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, const RgbaRows& rows) {
     ScanState state = scan_state(band, src_h);
@@ -55,14 +49,14 @@ void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, cons
     band.rows_to_do = src_h >= band.start_row ? walked : 0;
 }
 
-void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows, BandRows whole_rows) {
-    if (band.rows_to_do > 0 && band.src_w > 0) sample_rgba_band(band, rows, whole_rows);
+void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
+    if (band.rows_to_do > 0 && band.src_w > 0) {
+        const QuarterPlane plane =
+            rgba_plane({band.src + band.src_offset, rows.src_pixels, band.src_w, band.src_h},
+                       {band.dst + rows.dst_x, rows.dst_pixels, band.dst_w, band.dst_h});
+        add_band(plane, scan_state(band, band.src_h), band.rows_to_do, kRgbaBytes);
+    }
     __atomic_store_n(&band.done, 1, __ATOMIC_RELEASE);
-}
-
-void clear_open_row(const ovrin_rgba_band& band, const RgbaRows& rows) {
-    if (band.dst_w < 1) return;
-    memset(band.dst + rows.dst_x + band.di_31, 0, static_cast<size_t>(band.dst_w) * kRgbaBytes);
 }
 
 }  // namespace ovrin

@@ -10,6 +10,22 @@ namespace ovrin {
 
 constexpr int32_t kRgbaBytes = 4;
 
+// RGBA8888 pixels; the stride counts pixels too.
+struct RgbaSource {
+    const uint8_t* pixels;
+    int32_t stride;
+    int32_t width;
+    int32_t height;
+};
+struct RgbaDestination {
+    uint32_t* pixels;
+    int32_t stride;
+    int32_t width;
+    int32_t height;
+};
+
+QuarterPlane rgba_plane(const RgbaSource& src, const RgbaDestination& dst);
+
 // The lengths in which the two paths differ, in pixels.
 struct RgbaRows {
     int32_t src_pixels;  // from one source row to the next
@@ -20,28 +36,7 @@ struct RgbaRows {
 // Moves the record from one band to the next.
 void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, const RgbaRows& rows);
 
-// Takes the band's rows to the destination and reports the band done.
-void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows, BandRows whole_rows);
-
-// Clears the destination row that is open where the band starts.
-void clear_open_row(const ovrin_rgba_band& band, const RgbaRows& rows);
-
-// What the band driver asks of every format; `advance` is what the two paths do differently.
-struct RgbaBands {
-    using Band = ovrin_rgba_band;
-
-    static void end_where_next_begins(Band& previous, const Band& next) {
-        previous.rows_to_do = next.rows_to_do;
-    }
-
-    static bool take_rest(Band& last, const Band& previous) {
-        const int32_t end = previous.start_row + previous.rows_to_do;
-        if (last.src_h <= end) return false;
-        last.rows_to_do = last.src_h - end;
-        return true;
-    }
-
-    static bool shares_row(const Band& band) { return band.di_11 != band.di_31; }
-};
+// Adds the band's samples to the destination and reports the band done.
+void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows);
 
 }  // namespace ovrin

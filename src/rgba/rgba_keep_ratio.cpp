@@ -2,8 +2,9 @@
 // RGBA8888 into a canvas.
 #include <string.h>
 
+#include "bands/split.h"
 #include "canvas/margin.h"
-#include "dispatch/banded_run.h"
+#include "quarter/threaded.h"
 #include "rgba/rgba_band.h"
 
 namespace ovrin {
@@ -94,59 +95,25 @@ RgbaRows canvas_rows(const ovrin_rgba_band& band) {
             band.dst_x};
 }
 
-struct CanvasBands : RgbaBands {
-    static void task(void* band) {
-        auto* record = static_cast<Band*>(band);
-        run_rgba_band(*record, canvas_rows(*record), BandRows::kStore);
-    }
-
-    static void clear_shared_row(const Band& band) { clear_open_row(band, canvas_rows(band)); }
-
-    static void advance(Band& next, Band& previous) {
-        const int32_t canvas_w = next.dst_x + next.dst_w + next.dst_skip;
-        ovrin_resize_rgba8888_get_pos_keep_ratio(next.src_w, next.src_h, next.dst_w, next.dst_h,
-                                                 canvas_w, 0, &next);
-        end_where_next_begins(previous, next);
-    }
-};
-
-ovrin_rgba_band first_band(const uint8_t* src, const SourceSize& size,
+QuarterPlane picture_plane(const uint8_t* src, int32_t src_stride, const SourceSize& size,
                            const ovrin_resize_target& target) {
-    ovrin_rgba_band band = {};
-    band.src_w = size.width;
-    band.src_h = size.height;
-    band.src_stride = target.src_stride > 0 ? target.src_stride : size.width;
-    band.src_rows = target.src_buffer_height > 0 ? target.src_buffer_height : size.height;
-    band.dst_w = target.dst_width;
-    band.dst_h = target.dst_height;
-    band.dst_x = target.dst_x;
-    band.dst_skip = target.canvas_width - (target.dst_x + target.dst_width);
-    band.src = src;
-    band.dst = first_picture_row(target);
-    return band;
+    return rgba_plane({src, src_stride, size.width, size.height},
+                      {first_picture_row(target) + target.dst_x, target.canvas_width,
+                       target.dst_width, target.dst_height});
 }
 
-// A band record counts source bytes and canvas words in 32 bits.
-bool fits_band_record(const SourceSize& size, const ovrin_resize_target& target) {
-    const int64_t stride = target.src_stride > 0 ? target.src_stride : size.width;
-    return stride * size.height <= INT32_MAX / kRgbaBytes &&
-           int64_t{target.canvas_width} * target.canvas_height <= INT32_MAX;
-}
-
+// False when nothing has been written.
 bool resize_in_bands(const uint8_t* src, const SourceSize& size,
                      const ovrin_resize_target& target) {
-    const BandSplit split = split_into_bands(size.height, target.dst_height);
-    if (split.count < 2 || target.dst_width < 1 || target.dst_height < 1) return false;
-    if (!lies_in_canvas(target)) return false;
-    if (!fits_band_record(size, target)) return false;
-    BandedRun<CanvasBands> bands(first_band(src, size, target), split);
-    if (!bands.ready()) return false;
-    if (size.width < 1) {
-        clear_canvas(target);
-    } else {
-        clear_around_picture(target);
-    }
-    bands.run();
+    if (target.dst_width < 1 || target.dst_height < 1 || !lies_in_canvas(target)) return false;
+    const int32_t bands = picture_bands(size.height, target.dst_height);
+    if (bands < 2) return false;
+    BandPool pool;
+    if (!pool.ready()) return false;
+    clear_around_picture(target);
+    const int32_t src_stride = target.src_stride > 0 ? target.src_stride : size.width;
+    const QuarterPlane plane = picture_plane(src, src_stride, size, target);
+    sample_in_bands({&plane, 1, bands}, pool);
     return true;
 }
 
@@ -165,20 +132,7 @@ void ovrin_resize_rgba_keep_ratio_sg(const uint8_t* src, int32_t src_w, int32_t 
         return;
     }
     clear_around_picture(*target);
-    sample_plane({
-        src,
-        ptrdiff_t{target->src_stride} * kRgbaBytes,
-        size.width,
-        size.height,
-        reinterpret_cast<uint8_t*>(first_picture_row(*target) + target->dst_x),
-        ptrdiff_t{target->canvas_width} * kRgbaBytes,
-        target->dst_width,
-        target->dst_height,
-        target->dst_height,
-        target->dst_width,
-        size.width,
-        kRgbaBytes,
-    });
+    sample_plane(picture_plane(src, target->src_stride, size, *target));
 }
 
 void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t /*src_w*/, int32_t src_h, int32_t /*dst_w*/,
@@ -189,7 +143,7 @@ void ovrin_resize_rgba8888_get_pos_keep_ratio(int32_t /*src_w*/, int32_t src_h, 
 
 void _resize_rgba8888_keep_ratio_tp(void* band) {
     auto* record = static_cast<ovrin_rgba_band*>(band);
-    run_rgba_band(*record, canvas_rows(*record), BandRows::kAdd);
+    run_rgba_band(*record, canvas_rows(*record));
 }
 
 void ovrin_resize_rgba_keep_ratio_tps(const uint8_t* src, int32_t src_w, int32_t src_h,

@@ -8,42 +8,20 @@ namespace ovrin {
 
 namespace {
 
-void run_contiguous(void* band, BandRows whole_rows) {
+void run_contiguous(void* band) {
     auto& record = *static_cast<ovrin_yuv_band*>(band);
     run_yuv420_band(
         record, contiguous_source(kPlanarChroma, record.src, record.src_width, record.src_height),
-        contiguous_target(record), record.src_uv_offset, record.uv_rows, whole_rows);
+        contiguous_target(record), record.src_uv_offset, record.uv_rows);
 }
 
-void run_separate(void* band, BandRows whole_rows) {
+void run_separate(void* band) {
     auto& record = *static_cast<ovrin_yuv_band*>(band);
     run_yuv420_band(record,
                     three_planes(record.src, record.src_u, record.src_v, record.src_width,
                                  record.src_height, record.src_row_bytes),
-                    separate_target(record), record.src_uv_offset, record.uv_rows, whole_rows);
+                    separate_target(record), record.src_uv_offset, record.uv_rows);
 }
-
-using Bands = Yuv420Bands<ovrin_yuv_band, &ovrin_yuv_band::uv_start_row, &ovrin_yuv_band::uv_rows,
-                          ovrin_resize_yuv420_get_pos>;
-
-struct ContiguousBands : Bands {
-    static Band first(const Yuv420Source& source, const BandDestination& to) {
-        return first_band<Band>(source, to);
-    }
-
-    static void task(void* band) { run_contiguous(band, BandRows::kStore); }
-};
-
-struct ThreePlaneBands : Bands {
-    static Band first(const Yuv420Source& source, const BandDestination& to) {
-        Band band = first_band<Band>(source, to);
-        band.src_u = source.chroma_planes[0];
-        band.src_v = source.chroma_planes[1];
-        return band;
-    }
-
-    static void task(void* band) { run_separate(band, BandRows::kStore); }
-};
 
 }  // namespace
 
@@ -69,17 +47,17 @@ void ovrin_resize_yuv420_get_pos(int32_t /*src_width*/, int32_t src_height, int3
 }
 
 void _resize_yuv420_tp(void* band) {
-    run_contiguous(band, BandRows::kAdd);
+    run_contiguous(band);
 }
 
 void _resize_y_u_v_tp(void* band) {
-    run_separate(band, BandRows::kAdd);
+    run_separate(band);
 }
 
 void ovrin_resize_yuv420_tps(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                              int32_t dst_w, int32_t dst_h) {
     const Yuv420Source source = contiguous_source(kPlanarChroma, src, src_w, src_h);
-    if (!resize_yuv420_in_bands<ContiguousBands>(source, {dst, dst_w, dst_h, nullptr})) {
+    if (!resize_yuv420_in_bands(source, dst, dst_w, dst_h)) {
         ovrin_resize_yuv420_sg(src, dst, src_w, src_h, dst_w, dst_h);
     }
 }
@@ -90,9 +68,10 @@ void ovrin_resize_y_u_v_tps(const uint8_t* src_y, const uint8_t* src_u, const ui
     if (target != nullptr && threaded_canvas_is_rejected(*target)) return;
     const Yuv420Source source =
         three_planes(src_y, src_u, src_v, src_w, src_h, threaded_row_bytes(target, src_w));
-    const BandDestination to =
-        target != nullptr ? in_canvas(*target) : BandDestination{dst, dst_w, dst_h, nullptr};
-    if (src_h < kThreadedRows || !resize_yuv420_in_bands<ThreePlaneBands>(source, to)) {
+    const bool done = src_h >= kThreadedRows &&
+                      (target != nullptr ? resize_yuv420_into_canvas_in_bands(source, *target)
+                                         : resize_yuv420_in_bands(source, dst, dst_w, dst_h));
+    if (!done) {
         ovrin_resize_y_u_v_sg(src_y, src_u, src_v, dst, src_w, src_h, dst_w, dst_h, target);
     }
 }

@@ -7,7 +7,7 @@ namespace ovrin {
 
 PlaneWalk::PlaneWalk(PlaneState& plane, const ScanAxis& axis)
     : plane_(plane), axis_(axis), start_row_(plane.start_row) {
-    if (plane.start_row == 0) start_points(plane.scan, axis.source_rows);
+    if (plane.start_row == 0) start_points(plane.scan, axis.src_rows);
 }
 
 void PlaneWalk::walk(int32_t rows) {
@@ -38,7 +38,7 @@ int32_t least_chroma_rows(int32_t band_rows) {
     return static_cast<int32_t>((int64_t{band_rows} + 3) >> 2);
 }
 
-void sample_yuv420_band(const BandWork& work, const BandState& state, BandRows whole_rows) {
+void add_yuv420_band(const BandWork& work, const BandState& state) {
     const Yuv420Layout picture = {work.source.chroma, work.width, work.height};
     if (!has_grid(picture) || work.source.width < 1 || work.source.height < 1) return;
     const Yuv420Layout grid = grid_of(picture);
@@ -48,7 +48,7 @@ void sample_yuv420_band(const BandWork& work, const BandState& state, BandRows w
         plane.src += work.luma_offset;
         ScanState scan = state.luma.scan;
         if (state.luma.start_row == 0) start_points(scan, plane.src_rows);
-        run_band(plane, scan, work.luma_rows, 1, whole_rows);
+        add_band(plane, scan, work.luma_rows, 1);
     }
     const int32_t chroma_rows = half_rounded_up(work.source.height);
     if (work.chroma_rows < 1 || chroma_rows <= state.chroma.start_row) return;
@@ -57,7 +57,7 @@ void sample_yuv420_band(const BandWork& work, const BandState& state, BandRows w
         plane.src += work.chroma_offset;
         ScanState scan = state.chroma.scan;
         if (state.chroma.start_row == 0) start_points(scan, plane.src_rows);
-        run_band(plane, scan, work.chroma_rows, 1, whole_rows);
+        add_band(plane, scan, work.chroma_rows, 1);
     }
 }
 

@@ -44,7 +44,7 @@ public:
     bool ends_in_open_row() const { return row_is_open(plane_.scan); }
     int32_t rows() const { return walked_; }
     // Rows of the source plane behind the walk; negative once it has passed the end.
-    int64_t rows_left() const { return int64_t{axis_.source_rows} - start_row_ - walked_; }
+    int64_t rows_left() const { return int64_t{axis_.src_rows} - start_row_ - walked_; }
 
     // Rows of the walk that a band processes: none of a luma band that runs past the plane, those
     // inside the plane of a chroma band.
@@ -78,17 +78,17 @@ struct BandWork {
     int32_t chroma_rows;
 };
 
-// Takes the band's samples to its target.
-void sample_yuv420_band(const BandWork& work, const BandState& state, BandRows whole_rows);
+// Adds the band's samples to its target.
+void add_yuv420_band(const BandWork& work, const BandState& state);
 
 // Runs one band and reports it done. Without a target there is nowhere to go.
 template <class Band>
 void run_yuv420_band(Band& band, const Yuv420Source& source, uint8_t* target, int32_t chroma_offset,
-                     int32_t chroma_rows, BandRows whole_rows) {
+                     int32_t chroma_rows) {
     if (target != nullptr) {
-        sample_yuv420_band({source, band.dst_width, band.dst_height, target, band.src_y_offset,
-                            chroma_offset, band.y_rows, chroma_rows},
-                           load_state(band), whole_rows);
+        add_yuv420_band({source, band.dst_width, band.dst_height, target, band.src_y_offset,
+                         chroma_offset, band.y_rows, chroma_rows},
+                        load_state(band));
     }
     __atomic_store_n(&band.done, 1, __ATOMIC_RELEASE);
 }
@@ -104,38 +104,5 @@ template <class Band>
 uint8_t* separate_target(const Band& band) {
     return band.work != nullptr ? band.work : contiguous_target(band);
 }
-
-// What the band driver asks of a format, but for the task: the record, the fields that say which
-// chroma rows a band has, and the function that moves a record to the next band.
-template <class Record, int32_t Record::*kChromaStart, int32_t Record::*kChromaRows,
-          void (*kGetPos)(int32_t, int32_t, int32_t, int32_t, Record*)>
-struct Yuv420Bands {
-    using Band = Record;
-
-    static void advance(Band& next, Band& previous) {
-        kGetPos(next.src_width, next.src_height, next.dst_width, next.dst_height, &next);
-        previous.y_rows = next.y_rows;
-        previous.*kChromaRows = next.*kChromaRows;
-    }
-
-    // Chroma bands are short, so the last one takes about half of the plane.
-    static bool take_rest(Band& last, const Band& previous) {
-        const int32_t end = previous.y_start_row + previous.y_rows;
-        const int32_t chroma_end = previous.*kChromaStart + previous.*kChromaRows;
-        if (last.src_height <= end) return false;
-        last.y_rows = last.src_height - end;
-        const int32_t chroma_left = half_rounded_up(last.src_height) - chroma_end;
-        if (chroma_left > 0) last.*kChromaRows = chroma_left;
-        return true;
-    }
-
-    // Chroma bands end on whole destination rows.
-    static bool shares_row(const Band& band) { return band.y_top_left != band.y_bottom_left; }
-
-    static void clear_shared_row(const Band& band) {
-        if (band.dst_width < 1) return;
-        memset(separate_target(band) + band.y_bottom_left, 0, static_cast<size_t>(band.dst_width));
-    }
-};
 
 }  // namespace ovrin

@@ -25,29 +25,51 @@ inline Yuv420Destination contiguous_destination(const Yuv420Layout& layout, uint
 
 inline QuarterPlane luma_plane(const Yuv420Source& source, const Yuv420Layout& picture,
                                const Yuv420Destination& to) {
-    return {source.luma,    source.row_bytes, source.width,  source.height,
-            to.luma,        to.luma_pitch,    picture.width, picture.height,
-            picture.height, picture.width,    source.width,  1};
+    QuarterPlane plane = {};
+    plane.src = source.luma;
+    plane.src_pitch = source.row_bytes;
+    plane.src_columns = source.width;
+    plane.src_rows = source.height;
+    plane.dst = to.luma;
+    plane.dst_pitch = to.luma_pitch;
+    plane.dst_columns = plane.columns = picture.width;
+    plane.dst_rows = plane.rows = picture.height;
+    plane.sample_bytes = 1;
+    return plane;
 }
 
-// The picture's chroma: the first columns and rows of its grid. Interleaved chroma sets its ratio
-// in bytes, not in pairs: its points fall between those that pairs would give.
+// The picture's chroma: the first columns and rows of its grid.
 inline QuarterPlane chroma_plane(const Yuv420Source& source, const Yuv420Layout& picture,
-                                 const Yuv420Destination& to, int32_t plane) {
-    const Yuv420Layout packed = {source.chroma, source.width, source.height};
+                                 const Yuv420Destination& to, int32_t index) {
     const Yuv420Layout grid = grid_of(picture);
-    return {source.chroma_planes[plane],
-            source.chroma_row_bytes(),
-            static_cast<int32_t>(packed.chroma_row()),
-            packed.chroma_rows(),
-            to.chroma[plane],
-            to.chroma_pitch,
-            static_cast<int32_t>(grid.chroma_row()),
-            grid.chroma_rows(),
-            picture.chroma_rows(),
-            half_rounded_up(picture.width),
-            half_rounded_up(source.width),
-            source.chroma.sample_bytes};
+    QuarterPlane plane = {};
+    plane.src = source.chroma_planes[index];
+    plane.src_pitch = source.chroma_row_bytes();
+    plane.src_columns = half_rounded_up(source.width);
+    plane.src_rows = half_rounded_up(source.height);
+    plane.dst = to.chroma[index];
+    plane.dst_pitch = to.chroma_pitch;
+    plane.dst_columns = half_rounded_up(grid.width);
+    plane.dst_rows = half_rounded_up(grid.height);
+    plane.columns = half_rounded_up(picture.width);
+    plane.rows = half_rounded_up(picture.height);
+    plane.sample_bytes = source.chroma.sample_bytes;
+    return plane;
+}
+
+struct PicturePlanes {
+    QuarterPlane planes[3];
+    int32_t count;
+};
+
+inline PicturePlanes picture_planes(const Yuv420Source& source, const Yuv420Layout& picture,
+                                    const Yuv420Destination& to) {
+    PicturePlanes all = {};
+    all.planes[all.count++] = luma_plane(source, picture, to);
+    for (int32_t plane = 0; plane < source.chroma.planes; ++plane) {
+        all.planes[all.count++] = chroma_plane(source, picture, to, plane);
+    }
+    return all;
 }
 
 }  // namespace ovrin

@@ -11,10 +11,8 @@ namespace {
 
 void sample_into(const Yuv420Source& source, const Yuv420Layout& picture,
                  const Yuv420Destination& to) {
-    sample_plane(luma_plane(source, picture, to));
-    for (int32_t plane = 0; plane < source.chroma.planes; ++plane) {
-        sample_plane(chroma_plane(source, picture, to, plane));
-    }
+    const PicturePlanes planes = picture_planes(source, picture, to);
+    for (int32_t i = 0; i < planes.count; ++i) sample_plane(planes.planes[i]);
 }
 
 }  // namespace

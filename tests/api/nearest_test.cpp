@@ -173,3 +173,16 @@ TEST(Nearest, PositionsBeyond24BitsRoundToSinglePrecision) {
         }
     }
 }
+
+// The same on more rows than one: a step of 1 takes the second and the third row of three.
+TEST(Nearest, PositionsBeyond24BitsOnEveryRow) {
+    constexpr int32_t kLong = (1 << 24) + 60000;
+    const Sizes s = {kLong, 3, 5001, 3};
+    std::vector<uint32_t> src(size_t{kLong} * 3);
+    for (size_t i = 0; i < src.size(); ++i) src[i] = static_cast<uint32_t>(i) * 2654435761U;
+    std::vector<uint32_t> expected(size_t{5001} * 3, kOld);
+    reference::nearest(src.data(), expected, s.src_w, s.src_h, s.dst_w, s.dst_h);
+    ASSERT_NE(expected[0], expected[5001]);
+    EXPECT_EQ(expected[size_t{2} * 5001], kOld);
+    EXPECT_EQ(shrink(src, s), expected);
+}

@@ -75,20 +75,20 @@ TEST(BilinearFaults, RejectedFormatsLeakNothing) {
     }
 }
 
-TEST(BilinearFaults, RefusedTasksAreRunByTheCaller) {
+TEST(BilinearFaults, TheCallerDoesWithoutRefusedTasks) {
     const Picture src = Random(121).bytes(9 * 1200 * 4);
     const auto g = reference::packed_geometry(9, 1100, 7, 1100, 7);
     auto source = reference::contiguous_source(src.data(), 9, 1100);
     Picture sampled(7 * 1100 * 4);
     reference::bilinear(g, 9, 1100, 7, 1100, source, sampled);
-    for (const int every : {1, 2, 3, 34}) {
+    for (const int every : {1, 2, 3}) {
         Picture dst(sampled.size(), 0xEE);
         faults::reset();
         tasks_offered = 0;
         refused_every = every;
         ov_bilinear(src.data(), dst.data(), 9, 1100, 7, 1100, 7, nullptr);
         refused_every = 0;
-        EXPECT_GE(tasks_offered, 34);
+        EXPECT_EQ(tasks_offered, 4);
         EXPECT_TRUE(dst == sampled) << every;
         EXPECT_EQ(faults::live_blocks(), 0);
     }
@@ -121,17 +121,17 @@ TEST(LanczosFaults, OneBandFallsBackAndLeaksNothing) {
         [&](const Picture& dst) { EXPECT_TRUE(dst == whole || dst == untouched); });
 }
 
-TEST(LanczosFaults, RefusedTasksAreRunByTheCaller) {
+TEST(LanczosFaults, TheCallerDoesWithoutRefusedTasks) {
     const Picture src = Random(126).bytes(9 * 300 * 4);
     const Picture whole = reference::lanczos(src.data(), 9, 300, 6, 300, 4);
-    for (const int every : {1, 2, 3, 9}) {
+    for (const int every : {1, 2, 3}) {
         Picture dst(whole.size(), 0xEE);
         faults::reset();
         tasks_offered = 0;
         refused_every = every;
         ovrin_resize_lanczos(src.data(), dst.data(), 9, 300, 6, 300, 4);
         refused_every = 0;
-        EXPECT_GE(tasks_offered, 9);
+        EXPECT_EQ(tasks_offered, 4);
         EXPECT_TRUE(dst == whole) << every;
         EXPECT_EQ(faults::live_blocks(), 0);
     }

@@ -123,6 +123,17 @@ const std::vector<Placement>& placements() {
         {17, 1500, 19, 9, 333, 16, 360, 1, 2},    // tall, not whole ratios
         {21, 1031, 21, 20, 700, 15, 705, 2, 10},  // tall, across both edges
         {8, 1024, 8, 12, 1400, 16, 1500, 1, 7},   // tall, enlarged
+        // What the calling thread and the bands treat differently, on either side of 1024 rows.
+        {30, 1023, 30, 20, 40, 30, 50, 3, 50},  // height cut to nothing
+        {30, 1024, 30, 20, 40, 30, 50, 3, 50},
+        {30, 1023, 30, 20, 40, 30, 50, 30, 4},  // width cut to nothing
+        {30, 1024, 30, 20, 40, 30, 50, 30, 4},
+        {30, 1023, 30, 20, 40, 30, 50, 3, 51},  // below the canvas
+        {30, 1024, 30, 20, 40, 30, 50, 3, 51},
+        {30, 1023, 30, 20, 40, 80, 50, 55, 4},  // further right than the canvas is high
+        {30, 1024, 30, 20, 40, 80, 50, 55, 4},
+        {30, 1023, 30, 20, 40, 80, 50, 55, 52},  // both
+        {30, 1024, 30, 20, 40, 80, 50, 55, 52},
     };
     return all;
 }

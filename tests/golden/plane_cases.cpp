@@ -52,27 +52,32 @@ void run_planes(std::vector<Result>& results, const std::string& name, const Res
     }
 }
 
-// resize(planes, placement, target) over all placements.
+// resize(planes, placement, target) over all placements, and with a row length of 0, which stands
+// for the width or repeats the first row.
 template <class Resize>
 void run_canvas(std::vector<Result>& results, const std::string& name, const Resize& resize) {
-    for (const Placement& p : placements()) {
-        const std::string full_name = name + ":" + text(p);
-        const Planes planes(hash_of(full_name), p.stride, p.src_h);
-        Destination dst(yuv420_bytes(p.canvas_w, p.canvas_h));
-        ovrin_resize_target target = {};
-        target.src_width = p.src_w;
-        target.src_height = p.src_h;
-        target.src_stride = p.stride;
-        target.src_buffer_height = p.src_h;
-        target.dst = dst.bytes();
-        target.dst_width = p.dst_w;
-        target.dst_height = p.dst_h;
-        target.canvas_width = p.canvas_w;
-        target.canvas_height = p.canvas_h;
-        target.dst_x = p.x;
-        target.dst_y = p.y;
-        resize(planes, p, &target);
-        results.push_back({full_name, dst.hash()});
+    for (const Placement& placement : placements()) {
+        for (const int32_t stride : {placement.stride, 0}) {
+            Placement p = placement;
+            p.stride = stride;
+            const std::string full_name = name + ":" + text(p);
+            const Planes planes(hash_of(full_name), placement.stride, p.src_h);
+            Destination dst(yuv420_bytes(p.canvas_w, p.canvas_h));
+            ovrin_resize_target target = {};
+            target.src_width = p.src_w;
+            target.src_height = p.src_h;
+            target.src_stride = p.stride;
+            target.src_buffer_height = p.src_h;
+            target.dst = dst.bytes();
+            target.dst_width = p.dst_w;
+            target.dst_height = p.dst_h;
+            target.canvas_width = p.canvas_w;
+            target.canvas_height = p.canvas_h;
+            target.dst_x = p.x;
+            target.dst_y = p.y;
+            resize(planes, p, &target);
+            results.push_back({full_name, dst.hash()});
+        }
     }
 }
 

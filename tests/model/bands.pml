@@ -1,333 +1,115 @@
 // SPDX-License-Identifier: Apache-2.0
-// Bands on their way through the pool. Checked: no two bands that add into one destination row run
-// at the same time, every band runs once and is finished when the call returns, nobody waits for
-// ever.
+// How the threads of one call share its bands: TurnTaker in src/bands/turns.h, and the two ways of
+// src/bands/pool.cpp to run it. Checked: every band of every pass runs once, no thread waits for
+// another, and everything is finished when the call returns.
 //
-// DRIVER says who may take which band:
-//     QUEUED   run_bands in src/dispatch/band_schedule.cpp: even bands and those that share no row
-//              first, an odd one when the neighbours that it shares a row with are finished; whoever
-//              comes across a band claims it before running it, the caller those that it has
-//              released
-//     CLAIMED  the rule by itself, in any order: a thread claims any band none of whose neighbours
-//              in a shared row is running, and looks again after each band; it may leave when it
-//              finds none; the caller is one of these threads and waits for the rest. Holds for
-//              every schedule that keeps to it
-//     HELPED   run_bands_with_caller in src/dispatch/helping_run.cpp: bands that share no rows
-//
-// pool.pml shows that the pool is a queue that loses nothing; here it is just that, though it may
-// refuse any task, or take it and report an error all the same.
+// A worker may begin at any time or, where it could not be started or the pool refused its task,
+// never. pool.pml shows that the pool loses no task and ends its workers.
 
-#define QUEUED 1
-#define CLAIMED 2
-#define HELPED 3
-
-#define MAX_WORKERS 4
-#define MAX_BANDS 6
-
-byte workers, bands;
-
-bool shares[MAX_BANDS + 1];   /* this band and the one before it add into one row */
-bool skips_last;              /* nothing is left for the last band */
-bool released[MAX_BANDS];
-bool claimed[MAX_BANDS];
-bool running[MAX_BANDS + 1];
-bool by_worker[MAX_BANDS];    /* it is a worker that runs it */
-bool finished[MAX_BANDS];
-byte runs[MAX_BANDS];
-
-chan queue = [MAX_BANDS] of { byte };
-bool stop, workers_gone;
-byte idle;
-
-/* Only in a step of its own. A band runs from the moment when a thread claims it, which leaves out
-   nothing that a later start could show. */
-inline begin(k) {
-    runs[k]++;
-    assert(runs[k] == 1);
-    assert(!(k > 0 && shares[k] && running[k - 1]));
-    assert(!(shares[k + 1] && running[k + 1]));
-    running[k] = true
-}
-inline end(k) {
-    running[k] = false;
-    finished[k] = true
-}
-
-/* run_if_unclaimed in band_schedule.cpp */
-#ifdef BREAK_CLAIM
-inline claim(k) {
-    mine = !claimed[k];       /* looks and claims in two steps */
-    d_step {
-        claimed[k] = true;
-        if
-        :: mine -> begin(k)
-        :: else
-        fi
-    }
-}
-#else
-inline claim(k) {
-    d_step {
-        mine = !claimed[k];
-        claimed[k] = true;
-        if
-        :: mine -> begin(k)
-        :: else
-        fi
-    }
-}
+#ifndef MAX_WORKERS
+#define MAX_WORKERS 3
+#define MAX_BANDS 3
 #endif
+#define MAX_PASSES 2
+#define ALL (MAX_BANDS * MAX_PASSES)
 
-/* On the calling thread. */
-inline run_once(k) {
-    claim(k);
-    if
-    :: mine -> d_step { end(k); mine = false }
-    :: else
-    fi
-}
-inline run_always(k) {
-    d_step { begin(k) };
-    d_step { end(k) }
-}
+byte workers, bands, passes;
 
-/* A claimed band counts as running until it is finished. */
-#define BUSY(k) (claimed[k] && !finished[k])
-#ifdef BREAK_ORDER
-#define NEIGHBOUR_RUNS(k) false
-#else
-#define NEIGHBOUR_RUNS(k) ((shares[k] && BUSY((k + MAX_BANDS - 1) % MAX_BANDS)) || \
-                           (shares[k + 1] && BUSY((k + 1) % MAX_BANDS)))
-#endif
-#define CLAIMABLE(k) (k < bands && !(skips_last && k == bands - 1) && !claimed[k] && \
-                      !NEIGHBOUR_RUNS(k))
+byte next;                    /* Turns::next */
+bool all_taken;
+byte runs[ALL];               /* of band b of pass p: runs[p * bands + b] */
+byte finished[ALL];
+byte ended;                   /* workers that have ended, or never began */
 
-/* Chooses a band into k, or MAX_BANDS. */
-inline look() {
-    if
-    :: CLAIMABLE(0) -> k = 0
-    :: CLAIMABLE(1) -> k = 1
-    :: CLAIMABLE(2) -> k = 2
-    :: CLAIMABLE(3) -> k = 3
-    :: CLAIMABLE(4) -> k = 4
-    :: CLAIMABLE(5) -> k = 5
-    :: else -> k = MAX_BANDS
-    fi
+inline begin_turn() {
+    for (i : first .. after - 1) { runs[i]++; assert(runs[i] == 1) };
+    i = 0
 }
 
-#define WORKER_ENDS(n) by_worker[n] -> by_worker[n] = false; end(n)
+inline end_turn() {
+    for (i : first .. after - 1) { finished[i]++ };
+    i = 0; first = 0; after = 0
+}
 
-/* All workers: they do not differ, so this need not say which of them runs what. */
-proctype pool() {
-    byte k;
-    bool mine;
+/* Of any length: what holds does not depend on it. */
+inline choose_turn() {
+    after = first + 1;
     do
-#if DRIVER == CLAIMED
-    ::  atomic {
-            idle > 0 -> look();
-            if
-            :: k < MAX_BANDS -> claimed[k] = true; begin(k); by_worker[k] = true
-            :: else
-            fi;
-            idle--; k = 0
-        }
-#else
-    ::  atomic {
-            idle > 0 && nempty(queue) -> queue ? k;
-#if DRIVER == QUEUED
-            mine = !claimed[k]; claimed[k] = true;
-#else
-            mine = true;
-#endif
-            if
-            :: mine -> begin(k); by_worker[k] = true; idle--
-            :: else
-            fi;
-            k = 0; mine = false
-        }
-#endif
-    ::  atomic {
-            if
-            :: WORKER_ENDS(0)
-            :: WORKER_ENDS(1)
-            :: WORKER_ENDS(2)
-            :: WORKER_ENDS(3)
-            :: WORKER_ENDS(4)
-            :: WORKER_ENDS(5)
-            fi;
-#if !(DRIVER == CLAIMED && defined(BREAK_REFUSED))
-            idle++            /* broken: it leaves without looking again */
-#endif
-        }
-#if DRIVER == CLAIMED
-    :: atomic { stop && idle == 0 && !(by_worker[0] || by_worker[1] || by_worker[2] ||
-                                       by_worker[3] || by_worker[4] || by_worker[5]) -> break }
-#else
-    :: atomic { stop && empty(queue) && idle == workers -> break }
-#endif
-    od;
-    workers_gone = true
+    :: after < end -> after++
+    :: break
+    od
 }
 
-#if DRIVER == QUEUED
-inline release(b) {
-    if
-    :: skips_last && b == bands - 1
-    :: else ->
-        released[b] = true;
-        if
-        :: queue ! b
-        :: true               /* refused: left to the caller */
-        fi
-    fi
-}
-
-#define LEFT(b) (released[b] && !claimed[b])
-
-/* Chooses a band that no thread has taken into k, or MAX_BANDS. */
-inline look_for_work() {
+/* A step is one look at what others can change, or one change, with what follows from it for the
+   thread's own numbers. `left` passes are to be gone through, the present one ends at `end`. */
+inline work() {
     atomic {
         if
-        :: LEFT(0) -> k = 0
-        :: LEFT(1) -> k = 1
-        :: LEFT(2) -> k = 2
-        :: LEFT(3) -> k = 3
-        :: LEFT(4) -> k = 4
-        :: LEFT(5) -> k = 5
-        :: else -> k = MAX_BANDS
-        fi
-    }
-}
-
-inline help() {
-#ifndef BREAK_REFUSED
-    look_for_work();
-    if
-    :: k < MAX_BANDS -> run_once(k)
-    :: else
-    fi;
-#endif
-    k = 0
-}
-
-inline wait_for(b) {
-    do
-    :: !released[b] || finished[b] -> break
-    :: released[b] && !finished[b] -> help() /* sleeps a little when there is nothing to do */
-    od
-}
-
-#define MAY_RUN_AT_ONCE(b) ((b % 2 == 0 && b != bands - 1) || (!shares[b] && !shares[b + 1]))
-
-inline drive() {
-    for (band : 0 .. bands - 1) {
-        if
-        :: MAY_RUN_AT_ONCE(band) -> release(band)
-        :: else
+        :: all_taken          /* late */
+        :: else -> left = passes; end = bands
         fi
     };
-    for (band : 1 .. bands - 1) {
-        if
-        :: MAY_RUN_AT_ONCE(band)
-        :: else ->
-#ifndef BREAK_ORDER
-            if
-            :: shares[band] -> wait_for(band - 1)
-            :: else
-            fi;
-            if
-            :: band + 1 < bands && shares[band + 1] -> wait_for(band + 1)
-            :: else
-            fi;
-#endif
-            release(band)
-        fi
-    };
-#ifndef BREAK_REFUSED
     do
-    :: look_for_work();
-        if
-        :: k < MAX_BANDS -> run_once(k)
-        :: else -> break
-        fi
-    od;
+    :: left == 0 -> break
+    :: atomic {
+            left > 0 && after == 0 ->
+            first = next;
+#ifdef BREAK_PASS
+            if :: first > end -> next = end; first = end :: else fi;
 #endif
-    k = 0
-}
-#elif DRIVER == CLAIMED
-inline drive() {
-    do
-    ::  atomic {
-            look();
             if
-            :: k == MAX_BANDS -> k = 0; break
-            :: else
+            :: first < end -> choose_turn()
+            :: else -> first = 0; left--; end = end + bands
             fi;
+#ifdef BREAK_LEAVE
+            if :: end > bands -> left = 0 :: else fi;
+#endif
+            if :: left == 0 -> all_taken = true; end = 0 :: else fi
+        };
+        if
+        :: after == 0         /* the pass is over */
+        :: after > 0 ->
 #ifdef BREAK_CLAIM
-        };
-        atomic {              /* looks and claims in two steps */
+            atomic { if :: next == first :: else -> first = 0; after = 0 fi };
+            atomic { if :: after > 0 -> next = after; begin_turn() :: else fi };
+#else
+            atomic {
+                if
+                :: next == first -> next = after; begin_turn()
+                :: else -> first = 0; after = 0
+                fi
+            };
 #endif
-            claimed[k] = true;
-            begin(k)
-        };
-        d_step { end(k); k = 0 }
-#ifdef BREAK_REFUSED
-        ; break
-#endif
-    od;
-    for (band : 0 .. bands - 1) {
-        if
-        :: skips_last && band == bands - 1
-        :: else -> finished[band]     /* waited for */
+            if
+            :: atomic { after > 0 -> end_turn() }
+            :: after == 0     /* another thread was faster */
+            fi
         fi
-    }
-}
-#else
-inline submit(b) {
-    if
-    :: queue ! b
-#ifdef BREAK_REFUSED
-    :: true                   /* refused, and forgotten */
-#else
-    :: run_always(b)          /* refused */
-#endif
-    fi
-}
-
-inline drive() {
-    for (band : 0 .. bands - 1) { submit(band) };
-    do
-    :: queue ? k -> run_always(k); k = 0
-    :: atomic { empty(queue) -> break }
     od
 }
-#endif
+
+#define WAY byte left, end, first, after, i
+
+proctype worker() {
+    WAY;
+    if
+    :: work()
+    :: true                   /* not started, or its task refused */
+    fi;
+    ended++
+}
 
 init {
-    byte k, band;
-    bool mine;
-    select(workers : 2 .. MAX_WORKERS);
-    select(bands : 2 .. MAX_BANDS);
-#if DRIVER != HELPED
-    for (band : 1 .. bands - 1) {
-        if
-        :: shares[band] = true
-        :: true
-        fi
+    WAY;
+    select(workers : 1 .. MAX_WORKERS);
+    select(bands : 1 .. MAX_BANDS);
+    select(passes : 1 .. MAX_PASSES);
+    atomic {
+        for (i : 1 .. workers) { run worker() }
     };
-    if
-    :: skips_last = true
-    :: true
-    fi;
-#endif
-    atomic { idle = workers; run pool() };
-    drive();
+    work();
 #ifndef BREAK_STOP
-    stop = true;              /* ovrin_threadpool_free */
+    ended == workers;         /* ovrin_threadpool_free */
 #endif
-    workers_gone;
-    for (band : 0 .. bands - 1) {
-        assert(runs[band] == (skips_last && band == bands - 1 -> 0 : 1));
-        assert(finished[band] || (skips_last && band == bands - 1))
-    }
+    for (i : 0 .. passes * bands - 1) { assert(finished[i] == 1) }
 }

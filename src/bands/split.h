@@ -1,4 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
+// When a picture is cut into bands, and how high they are.
 #pragma once
 
 #include <stdint.h>
@@ -26,21 +27,9 @@ inline int32_t band_count(int32_t rows, int32_t height) {
     return static_cast<int32_t>((int64_t{rows} + (height >> 1)) / height);
 }
 
-// How a threaded call cuts its source.
-struct BandSplit {
-    int32_t rows;   // in every band but the last
-    int32_t count;  // less than 2: not worth any thread
-};
-
-// Runs of bands are handed out as one band: a few for each thread keep all of them busy, and every
-// further one would cost its start and its plan.
-constexpr int32_t kMostBands = 16;
-
-inline BandSplit split_into_bands(int32_t src_rows, int32_t dst_rows) {
-    const int32_t height = band_height(src_rows, dst_rows);
-    const int32_t run = (band_count(src_rows, height) + kMostBands - 1) / kMostBands;
-    if (run < 1) return {height, 0};
-    return {height * run, band_count(src_rows, height * run)};
+// Bands of a picture that is cut by its source rows; fewer than two are not worth any thread.
+inline int32_t picture_bands(int32_t src_rows, int32_t dst_rows) {
+    return band_count(src_rows, band_height(src_rows, dst_rows));
 }
 
 }  // namespace ovrin
