@@ -146,8 +146,10 @@ Planned plan_down(const Kernels& set, int32_t bytes, const Ratio& ratio) {
     const auto run = bilinear_run(bytes, ratio);
     ovrin::BilinearDown* down = set.plan_bilinear(run->plan, run->columns).down;
     return {identity(down), [run, down](int rows) {
+                const ovrin::BilinearNext nothing = {{run->row.data(), run->row.data()}, 0};
                 for (int i = 0; i < rows; ++i) {
-                    down(run->dst.data(), run->sums[0], run->sums[1], 1024 + i % 4096, run->plan);
+                    down(run->dst.data(), run->sums[0], run->sums[1], 1024 + i % 4096, run->plan,
+                         nothing);
                 }
             }};
 }

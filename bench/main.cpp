@@ -30,8 +30,8 @@ constexpr char kUsage[] =
     "  --json FILE     write all numbers\n"
     "  --chart FILE    write what bench/chart.gp draws\n"
     "  --stack         measure instead how much stack our calls take\n"
-    "  --kernels       measure instead each kernel of each set alone\n"
-    "  --threads       measure only what threads cost\n";
+    "  --threads       measure instead what threads cost\n"
+    "  --kernels       measure instead each kernel of each set alone\n";
 
 struct Options {
     std::string filter;
@@ -40,8 +40,8 @@ struct Options {
     std::string chart;
     Effort effort = {Caches::kWarm, 31, 5e-4, 8};
     bool stack = false;
-    bool kernels = false;
     bool threads = false;
+    bool kernels = false;
 };
 
 [[noreturn]] void give_up(const std::string& why) {
@@ -64,7 +64,7 @@ Options parse(int argc, char** argv) {
         {"rounds", required_argument, nullptr, 'r'}, {"cold", no_argument, nullptr, 'C'},
         {"quick", no_argument, nullptr, 'q'},        {"json", required_argument, nullptr, 'j'},
         {"chart", required_argument, nullptr, 'c'},  {"stack", no_argument, nullptr, 's'},
-        {"kernels", no_argument, nullptr, 'k'},      {"threads", no_argument, nullptr, 't'},
+        {"threads", no_argument, nullptr, 't'},      {"kernels", no_argument, nullptr, 'k'},
         {"help", no_argument, nullptr, 'h'},         {nullptr, 0, nullptr, 0}};
     Options options;
     for (int c; (c = getopt_long(argc, argv, "", kOptions, nullptr)) != -1;) {
@@ -95,11 +95,11 @@ Options parse(int argc, char** argv) {
             case 's':
                 options.stack = true;
                 break;
-            case 'k':
-                options.kernels = true;
-                break;
             case 't':
                 options.threads = true;
+                break;
+            case 'k':
+                options.kernels = true;
                 break;
             case 'h':
                 std::cout << kUsage;

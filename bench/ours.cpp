@@ -74,9 +74,6 @@ void letterbox_rgba_wrapper(const Job& job, const Picture& src, const Picture& c
     ovrin_resize_rgba8888_keep_ratio(src.data(), src.size.width, src.size.height, &target);
 }
 
-constexpr int32_t kFormatRgba = 7;
-constexpr int32_t kFormatNv21 = 18;
-
 template <auto resize, int32_t format>
 void bilinear(const Job& /*job*/, const Picture& src, const Picture& dst) {
     resize(src.data(), dst.data(), src.size.width, src.size.height, dst.size.width, dst.size.height,
@@ -116,13 +113,14 @@ OurCalls our_nearest() {
 }
 
 OurCalls our_bilinear(Layout layout) {
-    if (layout == Layout::kNv21) return {bilinear<ov_bilinear_sg, kFormatNv21>, nullptr};
-    return {bilinear<ov_bilinear_sg, kFormatRgba>, nullptr};
+    if (layout == Layout::kNv21)
+        return {bilinear<ov_bilinear_sg, OVRIN_FORMAT_SEMI_PLANAR>, nullptr};
+    return {bilinear<ov_bilinear_sg, OVRIN_FORMAT_PIXELS>, nullptr};
 }
 
 OurCalls our_banded_bilinear(Layout layout) {
-    if (layout == Layout::kNv21) return {nullptr, bilinear<ov_bilinear, kFormatNv21>};
-    return {nullptr, bilinear<ov_bilinear, kFormatRgba>};
+    if (layout == Layout::kNv21) return {nullptr, bilinear<ov_bilinear, OVRIN_FORMAT_SEMI_PLANAR>};
+    return {nullptr, bilinear<ov_bilinear, OVRIN_FORMAT_PIXELS>};
 }
 
 OurCalls our_lanczos() {

@@ -15,7 +15,9 @@ add_library(ovrinresize_objects OBJECT
   src/bilinear/rows.cpp
   src/bilinear/single.cpp
   src/bilinear/threaded.cpp
-  src/canvas/margin.cpp
+  src/canvas/paint.cpp
+  src/canvas/placement.cpp
+  src/dispatch/records.cpp
   src/dispatch/wrappers.cpp
   src/kernels/bilinear_scalar.cpp
   src/kernels/cpu.cpp
@@ -27,7 +29,6 @@ add_library(ovrinresize_objects OBJECT
   src/lanczos/threaded.cpp
   src/lanczos/transform.cpp
   src/lanczos/weights.cpp
-  src/layout.cpp
   src/nv21/nv21.cpp
   src/nv21/nv21_bands.cpp
   src/pool/threadpool.cpp
@@ -44,16 +45,17 @@ add_library(ovrinresize_objects OBJECT
   src/yuv420/bands.cpp
   src/yuv420/place.cpp
   src/yuv420/resize.cpp
-  src/yuv420/threaded.cpp
   src/yuv420/work_buffer.cpp)
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
   target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
-    src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp)
+    src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp
+    src/kernels/quarter_ratios_neon.cpp)
   # Otherwise atomics may call helpers of the compiler's run-time library.
   target_compile_options(ovrinresize_objects PRIVATE -mno-outline-atomics)
 elseif(CMAKE_SYSTEM_PROCESSOR MATCHES "x86_64|AMD64")
   set(avx2_sources src/kernels/bilinear_avx2.cpp src/kernels/copy_avx2.cpp
-    src/kernels/lanczos_avx2.cpp src/kernels/quarter_avx2.cpp)
+    src/kernels/lanczos_avx2.cpp src/kernels/quarter_avx2.cpp
+    src/kernels/quarter_ratios_avx2.cpp)
   set(avx512_sources src/kernels/bilinear_avx512.cpp
     src/kernels/lanczos_avx512.cpp src/kernels/quarter_avx512.cpp)
   target_sources(ovrinresize_objects PRIVATE ${avx2_sources} ${avx512_sources})

@@ -93,16 +93,15 @@ Picture draw_sheet(const Picture& sample) {
     Picture sheet({kColumns * (kTile + kGap) + kGap, 2 * (kTile + kLabel) + kGap});
     std::fill(sheet.words.begin(), sheet.words.end(), 0xFFFFFFFF);
     // Text, line pairs and landscape; and the edge of a letter with its surroundings.
-    const Picture large = cropped(sample, 300, 110, {3 * kTile, 3 * kTile});
-    const Picture small = cropped(sample, 676, 822, {80, 80});
+    Picture large = cropped(sample, 300, 110, {3 * kTile, 3 * kTile});
+    Picture small = cropped(sample, 676, 822, {80, 80});
     int32_t x = kGap;
     for (const Resampler& resampler : kResamplers) {
         int32_t y = kLabel;
         const char* const suffixes[] = {", to a third", ", 4.5 times as large"};
-        for (const Picture* source : {&large, &small}) {
+        for (Picture* source : {&large, &small}) {
             Picture tile({kTile, kTile});
-            tool::resize(resampler.engine, *source, {false, true, tile.size, tile.size, 0, 0},
-                         &tile);
+            tool::resize(resampler.engine, source, &tile);
             write(&sheet, (std::string(resampler.label) + suffixes[source == &small]).c_str(),
                   {x + 2.0, y - 9.0}, 14);
             paste(&sheet, tile, x, y);
@@ -126,7 +125,7 @@ int main(int argc, char** argv) {
         Picture sample;
         tool::open_source(argv[1], std::nullopt)->next(&sample);
         tool::OutputFile file(argv[2]);
-        tool::encode_png(draw_sheet(sample), file.stream());
+        tool::encode_png(draw_sheet(sample), {}, file.stream());
         file.commit();
     } catch (const std::exception& error) {
         std::cerr << "contact_sheet: " << error.what() << "\n";

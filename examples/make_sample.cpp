@@ -490,7 +490,9 @@ int main(int argc, char** argv) {
         draw_title(&canvas);
         draw_panels(&canvas);
         tool::OutputFile file(argv[1]);
-        tool::encode_png(canvas.picture(), file.stream());
+        tool::Metadata metadata;
+        metadata.srgb_intent = 0;
+        tool::encode_png(canvas.picture(), metadata, file.stream());
         file.commit();
     } catch (const std::exception& error) {
         std::cerr << "make_sample: " << error.what() << "\n";

@@ -2,22 +2,22 @@
 /*
  * libovrinresize: resizing of raw pictures in memory.
  *
- * Rules that hold for every function here unless its own comment says otherwise:
+ * These rules hold for every function, unless its own comment says otherwise:
  *
- *  - The caller owns every buffer and every record. Buffers must stay valid until the call returns.
- *    Source and destination must not overlap.
- *  - Widths and heights are in pixels, offsets in bytes, unless a name or comment says otherwise.
- *    Rows are packed: one row starts where the one before it ends.
- *  - Nothing is reported. Bad arguments make a call return early, as each comment states.
- *    Pointers are not checked for null unless the comment says that they are.
- *  - Every function may be called from any number of threads at once, on different buffers. The
- *    library has no global state; nothing that a call makes outlives the call.
- *  - Sizes are not compared with anything: a picture must lie in its buffer whole, as its sizes and
- *    its row length say. A size of 0 or less means that there is no picture and no buffer.
- *  - A band record must hold what a walk from the first band or a driver would give it. Its source
- *    height and its band_rows, each times the destination height, must fit 32 bits.
- *  - No byte outside the stated pictures is read or written. Buffers need no alignment beyond
- *    that of their type.
+ *  - The caller owns every buffer and every record, and keeps them valid until the call returns.
+ *    Source and destination do not overlap.
+ *  - Widths and heights are in pixels, offsets in bytes. Rows are packed: each starts where the one
+ *    before it ends.
+ *  - Nothing is reported. With bad arguments a call returns early; its comment says when, and what
+ *    it has written by then. Null pointers are looked for only where the comment says so.
+ *  - Any number of threads may call any functions at once, on different buffers. The library has no
+ *    global state, and nothing that a call makes outlives it.
+ *  - The library does not know how long a buffer is. It reads and writes as much as sizes and row
+ *    lengths say. A size of 0 or less means that there is no picture and no buffer.
+ *  - Band records come from a walk that starts at the first band, as below; other values are not
+ *    checked. The source height, and band_rows, each times the destination height, fit 32 bits.
+ *  - No byte outside the pictures is read or written. Buffers need no alignment beyond that of
+ *    their type.
  */
 #ifndef OVRINRESIZE_H
 #define OVRINRESIZE_H
@@ -41,21 +41,21 @@ extern "C" {
 
 /*
  * Where the keep-ratio functions and the bilinear engine find their source rows and put the scaled
- * picture. The caller fills it. Only ovrin_resize_rgba8888_keep_ratio and the two functions behind
- * it ever write it.
+ * picture. The caller fills it. Only ovrin_resize_rgba8888_keep_ratio and the two functions that it
+ * calls ever write it.
  *
  * dst_x and dst_y must not be negative.
  */
 typedef struct ovrin_resize_target {
     void* reserved_head;         /* the caller's; neither read nor written */
-    const uint8_t* src_vu_plane; /* source chroma pairs: bilinear engine, formats 18 and 19 */
-    const uint8_t* src_u_plane;  /* source U plane: bilinear engine, format 2 */
-    const uint8_t* src_v_plane;  /* source V plane: bilinear engine, format 2 */
+    const uint8_t* src_vu_plane; /* source chroma pairs: bilinear engine, semi-planar formats */
+    const uint8_t* src_u_plane;  /* source U plane: bilinear engine, planar format */
+    const uint8_t* src_v_plane;  /* source V plane: bilinear engine, planar format */
     int32_t src_width; /* source size, pixels; rewritten when an RGBA picture is clipped */
     int32_t src_height;
     int32_t src_stride;        /* source row length: pixels (RGBA8888), bytes (planes) */
     int32_t src_buffer_height; /* rows in the source buffer */
-    int32_t format;            /* format code of the bilinear engine */
+    int32_t format;            /* bilinear engine: an OVRIN_FORMAT_ code */
     void* dst;                 /* the canvas: 32-bit pixels or planes */
     int32_t dst_width;         /* size of the scaled picture, pixels; rewritten when an RGBA */
     int32_t dst_height;        /* picture is clipped */
@@ -237,8 +237,7 @@ OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst,
  * width or height is not a multiple of 4, the chroma that is kept covers a little less of the
  * source than the luma. On the calling thread, such sizes need a work buffer of 2 * width * height
  * bytes, both rounded up; without memory for it nothing is written. A destination size of 0 or less
- * writes nothing; a
- * source size of 0 or less fills the destination with 0, chroma included.
+ * writes nothing; a source size of 0 or less fills the destination with 0, chroma included.
  *
  * The keep-ratio forms paint the target's canvas black (luma 0, chroma 128) and place the picture,
  * scaled to dst_width x dst_height, at (dst_x, dst_y). What does not fit into the canvas is cut
@@ -254,8 +253,12 @@ OVRIN_API void ovrin_resize_nearest_rgba8888(const uint32_t* src, uint32_t* dst,
 /* I420 to I420, contiguous buffers. */
 OVRIN_API void ovrin_resize_yuv420(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                    int32_t dst_w, int32_t dst_h);
+
+/* As ovrin_resize_yuv420, on the calling thread whatever the height. */
 OVRIN_API void ovrin_resize_yuv420_sg(const uint8_t* src, uint8_t* dst, int32_t src_w,
                                       int32_t src_h, int32_t dst_w, int32_t dst_h);
+
+/* As ovrin_resize_yuv420, in bands on worker threads whatever the height. */
 OVRIN_API void ovrin_resize_yuv420_tps(const uint8_t* src, uint8_t* dst, int32_t src_w,
                                        int32_t src_h, int32_t dst_w, int32_t dst_h);
 
@@ -264,23 +267,32 @@ OVRIN_API void ovrin_resize_y_u_v(const uint8_t* src_y, const uint8_t* src_u, co
                                   uint8_t* dst, int32_t src_w, int32_t src_h, int32_t dst_w,
                                   int32_t dst_h);
 
-/* Three source planes into an I420 canvas. */
+/*
+ * Three source planes into an I420 canvas: as ovrin_resize_y_u_v_sg below 1024 source rows, as
+ * ovrin_resize_y_u_v_tps from there on. They differ for a src_stride of 0 or less, and in which
+ * placements they turn down.
+ */
 OVRIN_API void ovrin_resize_y_u_v_keep_ratio(const uint8_t* src_y, const uint8_t* src_u,
                                              const uint8_t* src_v, int32_t src_w, int32_t src_h,
                                              const ovrin_resize_target* target);
 
 /*
- * Both of these: a null target selects the contiguous destination; otherwise dst, dst_w and dst_h
- * are ignored.
- *
- * The driver runs on the calling thread below 1024 source rows. With a target it takes a src_stride
- * of 0 or less for src_w, and its second test compares canvas_height with dst_x, not dst_y: a
- * picture that starts below the canvas gives a black canvas.
+ * On the calling thread whatever the height. A null target selects the contiguous destination;
+ * with a target, dst, dst_w and dst_h are ignored. A src_stride of 0 samples the first row for
+ * every destination row.
  */
 OVRIN_API void ovrin_resize_y_u_v_sg(const uint8_t* src_y, const uint8_t* src_u,
                                      const uint8_t* src_v, uint8_t* dst, int32_t src_w,
                                      int32_t src_h, int32_t dst_w, int32_t dst_h,
                                      const ovrin_resize_target* target);
+
+/*
+ * As ovrin_resize_y_u_v_sg, in bands on worker threads from 1024 source rows on. With a target it
+ * takes a src_stride of 0 or less for src_w, and its second test compares canvas_height with dst_x,
+ * not dst_y: a picture that starts below the canvas gives a black canvas. Does as
+ * ovrin_resize_y_u_v_sg when the picture makes fewer than two bands or memory is missing; with a
+ * target also when a thread is.
+ */
 OVRIN_API void ovrin_resize_y_u_v_tps(const uint8_t* src_y, const uint8_t* src_u,
                                       const uint8_t* src_v, uint8_t* dst, int32_t src_w,
                                       int32_t src_h, int32_t dst_w, int32_t dst_h,
@@ -338,19 +350,27 @@ OVRIN_API void ovrin_resize_yuv420_get_pos(int32_t src_width, int32_t src_height
                                            int32_t dst_height, ovrin_yuv_band* band);
 
 /*
- * Band tasks; band points to an ovrin_yuv_band. They add to what the work buffer or destination
- * holds, then set done; where a work buffer is needed and missing they only set done. The first
- * reads three planes and prefers the work buffer whenever there is one; the second reads one
- * contiguous buffer.
+ * Band task for a source in three planes; band points to an ovrin_yuv_band. Adds to what the work
+ * buffer holds or, without one, the destination, then sets done. Where a work buffer is needed and
+ * missing it only sets done.
  */
 OVRIN_API void _resize_y_u_v_tp(void* band);
+
+/*
+ * Band task for a contiguous source. As _resize_y_u_v_tp, except that it uses the work buffer only
+ * where the destination's width or height is not a multiple of 4.
+ */
 OVRIN_API void _resize_yuv420_tp(void* band);
 
 /* NV21 to NV21, contiguous buffers. */
 OVRIN_API void ovrin_resize_nv21(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                  int32_t dst_w, int32_t dst_h);
+
+/* As ovrin_resize_nv21, on the calling thread whatever the height. */
 OVRIN_API void ovrin_resize_nv21_sg(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                     int32_t dst_w, int32_t dst_h);
+
+/* As ovrin_resize_nv21, in bands on worker threads whatever the height. */
 OVRIN_API void ovrin_resize_nv21_tps(const uint8_t* src, uint8_t* dst, int32_t src_w, int32_t src_h,
                                      int32_t dst_w, int32_t dst_h);
 
@@ -358,15 +378,17 @@ OVRIN_API void ovrin_resize_nv21_tps(const uint8_t* src, uint8_t* dst, int32_t s
 OVRIN_API void ovrin_resize_y_nv21(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
                                    int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h);
 
-/* Luma and chroma plane apart, into an NV21 canvas. */
+/* Luma and chroma plane apart, into an NV21 canvas. As ovrin_resize_y_u_v_keep_ratio. */
 OVRIN_API void ovrin_resize_y_nv21_keep_ratio(const uint8_t* src_y, const uint8_t* src_vu,
                                               int32_t src_w, int32_t src_h,
                                               const ovrin_resize_target* target);
 
-/* As ovrin_resize_y_u_v_sg and ovrin_resize_y_u_v_tps, for NV21. */
+/* As ovrin_resize_y_u_v_sg, for NV21. */
 OVRIN_API void ovrin_resize_y_nv_sg(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
                                     int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
                                     const ovrin_resize_target* target);
+
+/* As ovrin_resize_y_u_v_tps, for NV21. */
 OVRIN_API void ovrin_resize_y_nv_tps(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
                                      int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h,
                                      const ovrin_resize_target* target);
@@ -414,22 +436,19 @@ typedef struct ovrin_nv21_band {
 OVRIN_API void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
                                          int32_t dst_height, ovrin_nv21_band* band);
 
-/* Band tasks; band points to an ovrin_nv21_band. As _resize_yuv420_tp and _resize_y_u_v_tp. */
+/* Band task for a contiguous source; band points to an ovrin_nv21_band. As _resize_yuv420_tp. */
 OVRIN_API void _resize_nv21_tp(void* band);
+
+/* Band task for a source in two planes; band points to an ovrin_nv21_band. As _resize_y_u_v_tp. */
 OVRIN_API void _resize_y_nv21_tp(void* band);
 
 /*
  * ---- Bilinear engine ---------------------------------------------------------------------------
  *
- * Shrinks or enlarges by any ratio with 12-bit fixed-point weights. Format codes:
- *
- *     2        planar 4:2:0: a Y plane, then U, then V
- *     7, 8     four 8-bit channels per pixel, all treated alike
- *     18, 19   semi-planar 4:2:0: a Y plane, then one plane of two-byte chroma pairs
- *
- * Chroma planes have (height + 1) / 2 rows; a row of U or V has (width + 1) / 2 bytes, a row of
- * pairs twice that. With any other code nothing is written. The two codes of a pair do the same;
- * which channel comes first makes no difference.
+ * Shrinks or enlarges by any ratio with 12-bit fixed-point weights. Planar pictures are a Y plane,
+ * then U, then V; semi-planar ones a Y plane, then one plane of two-byte chroma pairs. Chroma
+ * planes have (height + 1) / 2 rows; a row of U or V has (width + 1) / 2 bytes, a row of pairs
+ * twice that.
  *
  * Output column i lies at source position i * src_width / dst_w, whose whole part is its left
  * source column; the weight of the column to the right of that is the fraction plus one quarter.
@@ -443,12 +462,24 @@ OVRIN_API void _resize_y_nv21_tp(void* band);
  *    step over the last but one, as in many reductions, none is.
  *  - Chroma takes the weights of its luma pixel. The columns of U and V round up.
  *  - Samples just outside the picture are read and can reach the result: those one column to the
- *    right, one row below and, in U and V, two rows below. Behind every source plane src_stride + 1
+ *    right, one row below and, in U and V, two rows below. After every source plane src_stride + 1
  *    samples (pixels, bytes or pairs) must be readable, whatever they hold.
  *
  * The whole canvas is cleared first: 0, chroma 128. Only sizes of 0 are tested for; those of the
  * source must not be negative.
  */
+
+/*
+ * Format codes: the planes and the bytes of a pixel. Which channel comes first makes no difference,
+ * so the two codes of a layout do the same. With any other code nothing is written.
+ */
+enum {
+    OVRIN_FORMAT_PLANAR = 2,        /* 4:2:0 in three planes, such as I420 */
+    OVRIN_FORMAT_PIXELS = 7,        /* four 8-bit channels, such as RGBA8888 */
+    OVRIN_FORMAT_PIXELS_2 = 8,      /* the same */
+    OVRIN_FORMAT_SEMI_PLANAR = 18,  /* 4:2:0 with pairs of chroma, such as NV21 */
+    OVRIN_FORMAT_SEMI_PLANAR_2 = 19 /* the same */
+};
 
 /*
  * Resizes src (src_w x src_h pixels) into dst (dst_w x dst_h pixels) on the calling thread.
@@ -578,7 +609,7 @@ OVRIN_API void ov_lanczos(const uint8_t* src, int32_t src_w, int32_t src_h, uint
                           int32_t dst_w, int32_t dst_h, int32_t bytes_per_pixel);
 
 /*
- * Resizes a Y plane and the VU pairs behind it, one pair per pixel. Unlike NV21, which has a pair
+ * Resizes a Y plane and the VU pairs after it, one pair per pixel. Unlike NV21, which has a pair
  * for every four pixels, the second plane has the full height, and rows of twice the width: 3 * w *
  * h bytes in all, for source and destination alike. A plain NV21 buffer is too short on both sides.
  *

@@ -8,22 +8,23 @@
 #include <cstdint>
 #include <cstdio>
 
+#include "metadata.h"
 #include "picture.h"
 
 namespace tool {
 
 bool is_png(const uint8_t* data, size_t size);
-Picture decode_png(const uint8_t* data, size_t size);
-void encode_png(const Picture& picture, FILE* out);
+Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata);
+void encode_png(const Picture& picture, const Metadata& metadata, FILE* out);
 
 bool is_jpeg(const uint8_t* data, size_t size);
-Picture decode_jpeg(const uint8_t* data, size_t size);
+Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata);
 // quality: 1 to 100. Alpha is dropped.
-void encode_jpeg(const Picture& picture, int quality, FILE* out);
+void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out);
 
-// Binary PPM (P6).
+// Binary PPM (P6), which holds no metadata.
 bool is_ppm(const uint8_t* data, size_t size);
-Picture decode_ppm(const uint8_t* data, size_t size);
+Picture decode_ppm(const uint8_t* data, size_t size, Metadata* metadata);
 // Alpha is dropped.
 void encode_ppm(const Picture& picture, FILE* out);
 

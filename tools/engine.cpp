@@ -7,6 +7,7 @@
 
 #include "convert.h"
 #include "error.h"
+#include "thumbnail.h"
 
 namespace tool {
 
@@ -61,15 +62,6 @@ void place_yuv(const Picture& source, const Placement& placement, Picture* canva
     ovrin_resize_y_u_v_keep_ratio(luma, chroma, v, width, height, &target);
 }
 
-void resize_on_canvas(const Picture& source, const Placement& placement, Picture* canvas) {
-    if (has_chroma_planes(source.format)) return place_yuv(source, placement, canvas);
-    if (source.format == PixelFormat::kRgba) return place_rgba(source, placement, canvas);
-    // The library places no RGB; RGBA gives the same bytes.
-    Picture rgba(placement.result);
-    place_rgba(converted(source, PixelFormat::kRgba), placement, &rgba);
-    *canvas = converted(rgba, PixelFormat::kRgb);
-}
-
 void resize_nearest(const Picture& source, Picture* result) {
     ovrin_resize_nearest_rgba8888(source.words.data(), result->words.data(), source.size.width,
                                   source.size.height, result->size.width, result->size.height);
@@ -86,21 +78,26 @@ int32_t bilinear_format(PixelFormat format) {
     }
 }
 
-// On the calling thread at any height: in bands the engine would not interpolate. Not for RGB.
-void resize_bilinear(const Picture& source, Picture* result) {
+using Bilinear = void(const uint8_t*, uint8_t*, int32_t, int32_t, int32_t, int32_t, int32_t,
+                      const ovrin_resize_target*);
+
+// Not for RGB.
+void resize_bilinear(Bilinear* bilinear, Picture* source, Picture* result) {
     // The engine may read a row and a sample past the end, which then count; they repeat the end.
-    const size_t words = source.words.size();
-    std::vector<uint32_t> padded(source.words);
-    padded.resize(words + static_cast<size_t>(source.size.width) + 1, padded.back());
-    ov_bilinear_sg(reinterpret_cast<const uint8_t*>(padded.data()), result->bytes(),
-                   source.size.width, source.size.height, result->size.width, result->size.height,
-                   bilinear_format(source.format), nullptr);
+    std::vector<uint32_t>& words = source->words;
+    const size_t count = words.size();
+    words.resize(count + static_cast<size_t>(source->size.width) + 1, words.back());
+    bilinear(source->bytes(), result->bytes(), source->size.width, source->size.height,
+             result->size.width, result->size.height, bilinear_format(source->format), nullptr);
+    words.resize(count);
 }
 
 // The engine knows no RGB; RGBA gives the same bytes.
-void resize_rgb_bilinear(const Picture& source, Picture* result) {
+void resize_any_bilinear(Bilinear* bilinear, Picture* source, Picture* result) {
+    if (source->format != PixelFormat::kRgb) return resize_bilinear(bilinear, source, result);
     Picture rgba(result->size);
-    resize_bilinear(converted(source, PixelFormat::kRgba), &rgba);
+    Picture rgba_source = converted(*source, PixelFormat::kRgba);
+    resize_bilinear(bilinear, &rgba_source, &rgba);
     *result = converted(rgba, PixelFormat::kRgb);
 }
 
@@ -131,12 +128,18 @@ void resize_lanczos(const Picture& source, Picture* result) {
                          result->size.width, result->size.height, 4);
 }
 
+}  // namespace
+
 const char* name_of(Engine engine) {
     switch (engine) {
         case Engine::kQuarter:
             return "quarter";
+        case Engine::kThumbnail:
+            return "thumbnail";
         case Engine::kBilinear:
             return "bilinear";
+        case Engine::kBilinearProgressive:
+            return "bilinear-progressive";
         case Engine::kLanczos:
             return "lanczos";
         case Engine::kNearest:
@@ -145,32 +148,45 @@ const char* name_of(Engine engine) {
     return "";
 }
 
-}  // namespace
-
-void check_engine(Engine engine, PixelFormat format, const Placement& placement) {
-    if (engine == Engine::kQuarter) return;
+void check_engine(Engine engine, PixelFormat format) {
     if (engine == Engine::kNearest && format != PixelFormat::kRgba) {
         throw Error(std::string("the nearest engine handles rgba, not ") + name_of(format));
     }
-    if (placement.on_canvas) {
-        throw Error(std::string("the ") + name_of(engine) + " engine knows no canvas");
+}
+
+void resize(Engine engine, Picture* source, Picture* result) {
+    result->has_alpha = source->has_alpha;
+    result->is_gray = source->is_gray;
+    switch (engine) {
+        case Engine::kQuarter:
+            return resize_whole(*source, result);
+        case Engine::kThumbnail:
+            return resize_thumbnail(source, result);
+        case Engine::kBilinear:
+            // On the calling thread at any height: in bands the engine would not interpolate.
+            return resize_any_bilinear(ov_bilinear_sg, source, result);
+        case Engine::kBilinearProgressive:
+            return resize_any_bilinear(ov_bilinear_ex, source, result);
+        case Engine::kLanczos:
+            return resize_lanczos(*source, result);
+        case Engine::kNearest:
+            return resize_nearest(*source, result);
     }
 }
 
-void resize(Engine engine, const Picture& source, const Placement& placement, Picture* result) {
-    result->has_alpha = source.has_alpha;
-    switch (engine) {
-        case Engine::kQuarter:
-            if (placement.on_canvas) return resize_on_canvas(source, placement, result);
-            return resize_whole(source, result);
-        case Engine::kBilinear:
-            if (source.format == PixelFormat::kRgb) return resize_rgb_bilinear(source, result);
-            return resize_bilinear(source, result);
-        case Engine::kLanczos:
-            return resize_lanczos(source, result);
-        case Engine::kNearest:
-            return resize_nearest(source, result);
-    }
+void resize_onto_canvas(const Picture& source, const Placement& placement, Picture* canvas) {
+    canvas->has_alpha = source.has_alpha;
+    canvas->is_gray = source.is_gray;
+    if (has_chroma_planes(source.format)) return place_yuv(source, placement, canvas);
+    if (source.format == PixelFormat::kRgba) return place_rgba(source, placement, canvas);
+    // The library places no RGB; RGBA gives the same bytes.
+    Picture rgba(placement.result);
+    place_rgba(converted(source, PixelFormat::kRgba), placement, &rgba);
+    *canvas = converted(rgba, PixelFormat::kRgb);
+}
+
+int white_of(Engine engine) {
+    return engine == Engine::kQuarter ? 252 : 255;
 }
 
 }  // namespace tool

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: Apache-2.0
-// The library's resamplers by name. All calls of the library are here.
+// The library's resamplers by name, and one made of them. All calls of the library are here.
 #pragma once
 
 #include <string>
@@ -9,13 +9,21 @@
 
 namespace tool {
 
-enum class Engine { kQuarter, kBilinear, kLanczos, kNearest };
+enum class Engine { kQuarter, kThumbnail, kBilinear, kBilinearProgressive, kLanczos, kNearest };
 
-// Throws Error when the engine cannot do that with pictures of this format.
-void check_engine(Engine engine, PixelFormat format, const Placement& placement);
+const char* name_of(Engine engine);
 
-// Resizes into *result, which has the source's format and the placement's size. The engine has
-// passed check_engine().
-void resize(Engine engine, const Picture& source, const Placement& placement, Picture* result);
+// Throws Error when the engine cannot resize pictures of this format.
+void check_engine(Engine engine, PixelFormat format);
+
+// Resizes into *result, which has the source's format. The engine has passed check_engine(). May
+// use up the source.
+void resize(Engine engine, Picture* source, Picture* result);
+
+// The quarter engine, straight onto a black, transparent canvas.
+void resize_onto_canvas(const Picture& source, const Placement& placement, Picture* canvas);
+
+// What the engine makes of white and of full alpha, 255.
+int white_of(Engine engine);
 
 }  // namespace tool

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <new>
 #include <stdexcept>
 #include <string>
 
@@ -19,6 +20,8 @@ auto concerning(const std::string& name, Action action) {
         return action();
     } catch (const Error& error) {
         throw Error(name + ": " + error.what());
+    } catch (const std::bad_alloc&) {
+        throw Error(name + ": not enough memory");
     }
 }
 

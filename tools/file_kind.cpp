@@ -29,6 +29,15 @@ constexpr Ending kEndings[] = {
 
 }  // namespace
 
+bool is_image_file(FileKind kind) {
+    return kind.container != Container::kRaw && kind.container != Container::kY4m;
+}
+
+bool holds_alpha(FileKind kind) {
+    return kind.container == Container::kPng ||
+           (kind.container == Container::kRaw && kind.format == PixelFormat::kRgba);
+}
+
 FileKind kind_of_name(const std::string& path) {
     std::string extension = std::filesystem::path(path).extension();
     for (char& letter : extension) {

@@ -14,6 +14,12 @@ struct FileKind {
     PixelFormat format;  // of frames in kRaw and kY4m; image files hold RGBA as far as we see
 };
 
+// PNG and the like, which hold one picture; not frames.
+bool is_image_file(FileKind kind);
+
+// Whether such a file can hold transparent pixels.
+bool holds_alpha(FileKind kind);
+
 // What the ending of a file's name stands for. Throws Error when it stands for nothing.
 FileKind kind_of_name(const std::string& path);
 

@@ -1,52 +1,31 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "output_file.h"
 
-#include <signal.h>
+#include <fcntl.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 #include <cerrno>
+#include <csignal>
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
 
+#include "doomed_file.h"
 #include "error.h"
 
 namespace tool {
 
 namespace {
 
-// The name that a signal handler has to remove; null when there is none.
-const char* volatile doomed_file = nullptr;
-
-// The handler is taken away when it is called, so the second signal ends the program.
-void remove_and_die(int signal_number) {
-    if (doomed_file != nullptr) unlink(doomed_file);
-    static_cast<void>(raise(signal_number));
-}
-
-void remove_on_signals(const char* name) {
-    doomed_file = name;
-    struct sigaction removing = {};
-    removing.sa_handler = remove_and_die;
-    removing.sa_flags = static_cast<int>(SA_RESETHAND);
-    for (const int number : {SIGHUP, SIGINT, SIGTERM}) {
-        struct sigaction previous = {};
-        sigaction(number, nullptr, &previous);
-        // What was ignored from the start, as under nohup, stays ignored.
-        if (previous.sa_handler != SIG_IGN) sigaction(number, &removing, nullptr);
-    }
-    // A file past its size limit is an error to report like any other.
-    struct sigaction ignoring = {};
-    ignoring.sa_handler = SIG_IGN;
-    sigaction(SIGXFSZ, &ignoring, nullptr);
-}
+namespace fs = std::filesystem;
 
 // A link's own name shall survive, so the file is replaced where it really lies.
 std::string real_path(const std::string& path) {
     std::error_code none;
-    if (!std::filesystem::is_symlink(path, none)) return path;
-    const std::filesystem::path real = std::filesystem::canonical(path, none);
+    if (!fs::is_symlink(path, none)) return path;
+    const fs::path real = fs::canonical(path, none);
     return none ? path : real.string();
 }
 
@@ -54,6 +33,71 @@ mode_t default_mode() {
     const mode_t mask = umask(0);
     umask(mask);
     return 0666 & ~mask;
+}
+
+std::string in_folder_of(const std::string& path, const std::string& name) {
+    return fs::path(path).parent_path() / name;
+}
+
+std::string folder_of(const std::string& path) {
+    const fs::path folder = fs::path(path).parent_path();
+    return folder.empty() ? "." : folder.string();
+}
+
+// The name by which the system knows what a descriptor refers to.
+std::string path_of(int descriptor) {
+    return "/proc/self/fd/" + std::to_string(descriptor);
+}
+
+// A file without a name, or -1: the file system, an old kernel or a system without /proc does not
+// have them, or the folder cannot be written to.
+int open_nameless(const std::string& folder) {
+    const int descriptor = open(folder.c_str(), O_TMPFILE | O_WRONLY | O_CLOEXEC, 0666);
+    if (descriptor < 0 || access(path_of(descriptor).c_str(), F_OK) == 0) return descriptor;
+    close(descriptor);
+    return -1;
+}
+
+bool link_to(const std::string& from, const char* to) {
+    return linkat(AT_FDCWD, from.c_str(), AT_FDCWD, to, AT_SYMLINK_FOLLOW) == 0;
+}
+
+// Gives a file without a name one in place of an older file; returns an errno, EEXIST where the
+// hidden name is taken. Linux can do that in two steps only: the file gets the hidden name, which
+// then replaces the other one. A process of its own takes both, so that whatever ends this one, the
+// hidden name does not stay; and in a session of its own, so that it is not ended along with a
+// group of processes. What remains is a kill of just that process, or of the system, in the
+// microseconds between the steps.
+int replace(const std::string& from, const std::string& hidden, const std::string& to) {
+    const SignalsBlocked blocked;
+    volatile int failure = 0;     // written by the other process, whose memory this is
+    const pid_t child = vfork();  // NOLINT: it does nothing but system calls
+    if (child < 0) return errno;
+    if (child == 0) {
+        setsid();
+        if (!link_to(from, hidden.c_str())) {
+            failure = errno;
+        } else if (rename(hidden.c_str(), to.c_str()) != 0) {
+            failure = errno;
+            unlink(hidden.c_str());
+        }
+        _exit(0);
+    }
+    while (waitpid(child, nullptr, 0) < 0 && errno == EINTR) {
+    }
+    return failure;
+}
+
+// Gives a file without a name one, whether that is taken or not. Throws Error.
+void give_name(const std::string& from, const std::string& to) {
+    if (link_to(from, to.c_str())) return;
+    int failure = errno;
+    for (int attempt = 0; failure == EEXIST; ++attempt) {
+        const std::string hidden = in_folder_of(
+            to, ".ovrinresize." + std::to_string(getpid()) + "." + std::to_string(attempt));
+        failure = replace(from, hidden, to);
+    }
+    if (failure != 0) throw Error(strerror(failure));
 }
 
 }  // namespace
@@ -77,38 +121,58 @@ void OutputFile::open() {
         return;
     }
 
-    temporary_ = std::filesystem::path(path_).parent_path() / ".ovrinresize.XXXXXX";
-    const int descriptor = mkstemp(temporary_.data());
-    if (descriptor < 0) throw Error(std::string("cannot be written: ") + strerror(errno));
-    remove_on_signals(temporary_.c_str());
+    // A file past its size limit is an error to report like any other.
+    static_cast<void>(signal(SIGXFSZ, SIG_IGN));
+    const int descriptor = open_new();
     // Best effort: some file systems know no permissions.
-    static_cast<void>(fchmod(descriptor, exists ? existing.st_mode & 07777 : default_mode()));
+    if (exists) static_cast<void>(fchmod(descriptor, existing.st_mode & 07777));
     stream_ = fdopen(descriptor, "wb");
     if (stream_ == nullptr) {
         close(descriptor);
-        unlink(temporary_.c_str());
-        doomed_file = nullptr;
+        discard();
         throw Error(strerror(errno));
     }
+}
+
+int OutputFile::open_new() {
+    const int nameless = open_nameless(folder_of(path_));
+    is_nameless_ = nameless >= 0;
+    if (is_nameless_) return nameless;
+
+    const SignalsBlocked blocked;
+    temporary_ = in_folder_of(path_, ".ovrinresize.XXXXXX");
+    const int descriptor = mkstemp(temporary_.data());
+    if (descriptor < 0) throw Error(std::string("cannot be written: ") + strerror(errno));
+    doom_file(temporary_);
+    static_cast<void>(fchmod(descriptor, default_mode()));
+    return descriptor;
+}
+
+void OutputFile::discard() {
+    if (temporary_.empty()) return;
+    unlink(temporary_.c_str());
+    spare_file();
 }
 
 OutputFile::~OutputFile() {
     if (stream_ == nullptr) return;
     static_cast<void>(fclose(stream_));
-    if (!temporary_.empty()) {
-        unlink(temporary_.c_str());
-        doomed_file = nullptr;
-    }
+    discard();
+}
+
+void OutputFile::publish() {
+    if (is_nameless_) return give_name(path_of(fileno(stream_)), path_);
+    if (temporary_.empty()) return;
+    const SignalsBlocked blocked;
+    if (rename(temporary_.c_str(), path_.c_str()) != 0) throw Error(strerror(errno));
+    spare_file();
 }
 
 void OutputFile::commit() {
     concerning(name_, [this] {
         if (fflush(stream_) != 0 || ferror(stream_) != 0) throw Error(strerror(errno));
-        if (!temporary_.empty() && rename(temporary_.c_str(), path_.c_str()) != 0) {
-            throw Error(strerror(errno));
-        }
+        publish();
     });
-    doomed_file = nullptr;
     static_cast<void>(fclose(stream_));
     stream_ = nullptr;
 }

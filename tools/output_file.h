@@ -6,12 +6,13 @@
 
 namespace tool {
 
-// A file that comes into being whole or not at all: it is written under a temporary name in the
-// same folder and renamed by commit(). Without commit(), or when a signal ends the program, the
-// temporary file is removed and what stood under the final name stays as it was.
+// A file that comes into being whole or not at all. It has no name until commit() gives it the
+// final one, so whatever ends the program before leaves nothing behind, and what stood under that
+// name stays as it was. Where the file system knows no files without a name, a temporary one in the
+// same folder stands in, which is removed when a signal that can be caught ends the program.
 //
 // What exists and is no regular file (a pipe, /dev/null) is written to directly, and so is standard
-// output, "-". At most one object at a time.
+// output, "-".
 class OutputFile {
 public:
     // Throws Error.
@@ -27,10 +28,14 @@ public:
 
 private:
     void open();
+    int open_new();
+    void publish();
+    void discard();
 
     std::string name_;  // as the user gave it
     std::string path_;
-    std::string temporary_;  // empty when path_ itself is written to
+    std::string temporary_;  // the stand-in's name; empty when there is none
+    bool is_nameless_ = false;
     FILE* stream_ = nullptr;
 };
 

@@ -27,7 +27,10 @@ size_t picture_bytes(PixelFormat format, Size size) {
     return size.pixels() * (format == PixelFormat::kRgb ? 3 : 4);
 }
 
-Picture::Picture(Size the_size, PixelFormat the_format)
-    : format(the_format), size(the_size), words((picture_bytes(format, size) + 3) / 4) {}
+Picture::Picture(Size the_size, PixelFormat the_format) : format(the_format), size(the_size) {
+    const size_t count = (picture_bytes(format, size) + 3) / 4;
+    words.reserve(count + static_cast<size_t>(size.width) + 1);
+    words.resize(count);
+}
 
 }  // namespace tool

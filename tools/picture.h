@@ -31,8 +31,10 @@ struct Picture {
 
     PixelFormat format = PixelFormat::kRgba;
     Size size = {};
-    std::vector<uint32_t> words;  // words because the library writes RGBA as words
-    bool has_alpha = false;       // of RGBA; false: A means nothing and image files leave it out
+    // Words because the library writes RGBA as words. There is room for a row and a sample more.
+    std::vector<uint32_t> words;
+    bool has_alpha = false;  // of RGBA; false: A means nothing and image files leave it out
+    bool is_gray = false;    // of RGBA: R, G and B are equal everywhere
 };
 
 }  // namespace tool

@@ -59,7 +59,7 @@ bool is_ppm(const uint8_t* data, size_t size) {
     return size >= 3 && data[0] == 'P' && data[1] == '6' && (is_space(data[2]) || data[2] == '#');
 }
 
-Picture decode_ppm(const uint8_t* data, size_t size) {
+Picture decode_ppm(const uint8_t* data, size_t size, Metadata* /*metadata*/) {
     HeaderReader header(data + 2, size - 2);
     const int64_t width = header.number();
     const int64_t height = header.number();

@@ -28,8 +28,8 @@ std::string bar(double part) {
 
 }  // namespace
 
-Progress::Progress()
-    : is_terminal_(isatty(STDERR_FILENO) == 1),
+Progress::Progress(bool is_wanted)
+    : is_wanted_(is_wanted && isatty(STDERR_FILENO) == 1),
       start_(Clock::now()),
       next_update_(start_ + kPatience) {}
 
@@ -39,7 +39,7 @@ Progress::~Progress() {
 
 void Progress::update(int64_t frames, double part) {
     const Clock::time_point now = Clock::now();
-    if (!is_terminal_ || now < next_update_) return;
+    if (!is_wanted_ || now < next_update_) return;
     next_update_ = now + kInterval;
     is_visible_ = true;
     const double seconds = std::chrono::duration<double>(now - start_).count();

@@ -10,7 +10,8 @@ namespace tool {
 // only when standard error is a terminal, and is wiped at the end.
 class Progress {
 public:
-    Progress();
+    // is_wanted: otherwise nothing appears.
+    explicit Progress(bool is_wanted);
     ~Progress();
     Progress(const Progress&) = delete;
     Progress& operator=(const Progress&) = delete;
@@ -21,7 +22,7 @@ public:
 private:
     using Clock = std::chrono::steady_clock;
 
-    bool is_terminal_;
+    bool is_wanted_;
     bool is_visible_ = false;
     Clock::time_point start_;
     Clock::time_point next_update_;

@@ -11,16 +11,8 @@
 
 namespace tool {
 
-namespace {
-
-bool is_image_file(Container container) {
-    return container != Container::kRaw && container != Container::kY4m;
-}
-
-}  // namespace
-
 void Sink::write(const Picture& frame) {
-    if (!is_first_ && is_image_file(kind_.container)) {
+    if (!is_first_ && is_image_file(kind_)) {
         throw Error("an image file holds one picture, but there are more");
     }
     if (frame.format == kind_.format) {
@@ -34,13 +26,14 @@ void Sink::write(const Picture& frame) {
 void Sink::write_in_format(const Picture& frame) {
     switch (kind_.container) {
         case Container::kPng:
-            return encode_png(frame, stream_);
+            return encode_png(frame, settings_.metadata, stream_);
         case Container::kJpeg:
-            return encode_jpeg(frame, quality_, stream_);
+            return encode_jpeg(frame, settings_.metadata, settings_.quality, stream_);
         case Container::kPpm:
             return encode_ppm(frame, stream_);
         case Container::kY4m: {
-            const std::string head = (is_first_ ? y4m_header_line(*y4m_header_) : "") + "FRAME\n";
+            const std::string head =
+                (is_first_ ? y4m_header_line(*settings_.y4m_header) : "") + "FRAME\n";
             write_bytes(head.data(), head.size());
             return write_bytes(frame.bytes(), frame.byte_count());
         }

@@ -5,18 +5,24 @@
 #include <optional>
 
 #include "file_kind.h"
+#include "metadata.h"
 #include "picture.h"
 #include "y4m.h"
 
 namespace tool {
 
+struct SinkSettings {
+    std::optional<Y4mHeader> y4m_header;  // of Y4M
+    Metadata metadata;                    // of image files
+    int quality;                          // of JPEG, 1 to 100
+};
+
 // Writes frames to a stream as the kind of file asked for, converting them where need be.
 // Everything throws Error.
 class Sink {
 public:
-    // The header is for Y4M only. quality: of JPEG, 1 to 100.
-    Sink(FileKind kind, const std::optional<Y4mHeader>& y4m_header, int quality, FILE* stream)
-        : kind_(kind), y4m_header_(y4m_header), quality_(quality), stream_(stream) {}
+    Sink(FileKind kind, const SinkSettings& settings, FILE* stream)
+        : kind_(kind), settings_(settings), stream_(stream) {}
 
     void write(const Picture& frame);
 
@@ -25,8 +31,7 @@ private:
     void write_bytes(const void* bytes, size_t count);
 
     FileKind kind_;
-    std::optional<Y4mHeader> y4m_header_;
-    int quality_;
+    SinkSettings settings_;
     FILE* stream_;
     bool is_first_ = true;
 };

@@ -10,8 +10,7 @@ namespace tool {
 namespace {
 
 constexpr int64_t kMaxSide = 65535;
-// 1 GiB of RGBA. Byte counts fit 31 bits, which is all that the library promises to handle.
-constexpr int64_t kMaxPixels = int64_t{1} << 28;
+int64_t most_pixels = kMostPixels;
 
 // Reads a number and returns the place behind it; null where there is none. A number with more
 // digits than an int64_t holds is as good as the largest one: too big.
@@ -24,16 +23,15 @@ const char* parse_side(const char* begin, const char* end, int64_t* side) {
 
 }  // namespace
 
-Size parse_size(const std::string& text) {
+std::optional<Size> parse_size(const std::string& text) {
     const char* const end = text.data() + text.size();
     int64_t width = 0;
     int64_t height = 0;
     const char* at = parse_side(text.data(), end, &width);
-    if (at != nullptr && at != end && (*at == 'x' || *at == 'X')) {
-        at = parse_side(at + 1, end, &height);
-        if (at == end) return checked_size(width, height);
-    }
-    throw Error("'" + text + "' is not a size; write it like 640x480");
+    if (at == nullptr || at == end || (*at != 'x' && *at != 'X')) return std::nullopt;
+    at = parse_side(at + 1, end, &height);
+    if (at != end) return std::nullopt;
+    return checked_size(width, height);
 }
 
 Size checked_size(int64_t width, int64_t height) {
@@ -41,10 +39,14 @@ Size checked_size(int64_t width, int64_t height) {
     if (width > kMaxSide || height > kMaxSide) {
         throw Error("too large: a side is at most " + std::to_string(kMaxSide) + " pixels");
     }
-    if (width * height > kMaxPixels) {
-        throw Error("too large: a picture has at most " + std::to_string(kMaxPixels) + " pixels");
+    if (width * height > most_pixels) {
+        throw Error("too large: a picture has at most " + std::to_string(most_pixels) + " pixels");
     }
     return {static_cast<int32_t>(width), static_cast<int32_t>(height)};
+}
+
+void set_most_pixels(int64_t pixels) {
+    most_pixels = pixels;
 }
 
 std::string to_string(const Size& size) {

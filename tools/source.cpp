@@ -3,6 +3,7 @@
 
 #include <utility>
 
+#include "alpha.h"
 #include "codecs.h"
 #include "error.h"
 
@@ -17,12 +18,13 @@ constexpr size_t kPeekBytes = 16;
 // An image file: one picture.
 class Still : public Source {
 public:
-    using Decode = Picture(const uint8_t*, size_t);
+    using Decode = Picture(const uint8_t*, size_t, Metadata*);
 
     Still(Input input, Container container, Decode* decode)
         : Source(std::move(input), {container, PixelFormat::kRgba}) {
         const std::vector<uint8_t> file = input_.read_all();
-        picture_ = decode(file.data(), file.size());
+        picture_ = decode(file.data(), file.size(), &metadata_);
+        picture_->has_alpha = picture_->has_alpha && !is_opaque(*picture_);
         size_ = picture_->size;
     }
 
@@ -41,7 +43,7 @@ class Raw : public Source {
 public:
     Raw(Input input, const RawLayout& layout)
         : Source(std::move(input), {Container::kRaw, layout.format}) {
-        size_ = layout.size;
+        size_ = checked_size(layout.size.width, layout.size.height);
     }
 
     bool next(Picture* frame) override { return read_frame(frame); }

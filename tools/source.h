@@ -8,6 +8,7 @@
 
 #include "file_kind.h"
 #include "input.h"
+#include "metadata.h"
 #include "picture.h"
 #include "y4m.h"
 
@@ -31,6 +32,7 @@ public:
     Size size() const { return size_; }
     // Of Y4M only.
     const std::optional<Y4mHeader>& y4m_header() const { return y4m_header_; }
+    const Metadata& metadata() const { return metadata_; }
     double part_read() const { return input_.part_read(); }
 
 protected:
@@ -43,6 +45,7 @@ protected:
     FileKind kind_;
     Size size_;
     std::optional<Y4mHeader> y4m_header_;
+    Metadata metadata_;
 
 private:
     int64_t frames_read_ = 0;

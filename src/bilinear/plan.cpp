@@ -1,17 +1,16 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "bilinear/plan.h"
 
-#include <string.h>
-
+#include "canvas/paint.h"
+#include "canvas/placement.h"
 #include "kernels/bilinear.h"
-#include "yuv420/place.h"
 
 namespace ovrin {
 
 namespace {
 
-ChromaLayout chroma_of(BilinearLayout layout) {
-    return layout == BilinearLayout::kPlanar ? kPlanarChroma : kInterleavedChroma;
+Yuv420Format format_of(BilinearLayout layout) {
+    return layout == BilinearLayout::kPlanar ? kI420 : kNv21;
 }
 
 // Single precision can round the last positions of a very long axis up to 2^31.
@@ -62,8 +61,7 @@ BilinearGeometry geometry_of_target(const BilinearCall& call, const ovrin_resize
 
 BilinearGeometry geometry_of_arguments(const BilinearCall& call) {
     const BilinearLayout layout = bilinear_layout(call.format);
-    const Yuv420Source source =
-        contiguous_source(chroma_of(layout), call.src, call.src_w, call.src_h);
+    const Yuv420Layout src = {format_of(layout), call.src_w, call.src_h};
     BilinearGeometry g = {};
     g.layout = layout;
     g.format = call.format;
@@ -71,8 +69,10 @@ BilinearGeometry geometry_of_arguments(const BilinearCall& call) {
     g.src_height = call.src_h;
     g.src_stride = call.src_w;
     g.src = call.src;
-    g.src_chroma[0] = source.chroma_planes[0];
-    g.src_chroma[1] = source.chroma_planes[1];
+    if (layout != BilinearLayout::kPixels && !src.is_empty()) {
+        g.src_chroma[0] = call.src + src.chroma_offset(0);
+        g.src_chroma[1] = call.src + src.chroma_offset(1);
+    }
     g.canvas = call.dst;
     g.canvas_width = call.dst_w;
     g.canvas_height = call.dst_h;
@@ -83,13 +83,13 @@ BilinearGeometry geometry_of_arguments(const BilinearCall& call) {
 
 BilinearLayout bilinear_layout(int32_t format) {
     switch (format) {
-        case 7:
-        case 8:
+        case OVRIN_FORMAT_PIXELS:
+        case OVRIN_FORMAT_PIXELS_2:
             return BilinearLayout::kPixels;
-        case 2:
+        case OVRIN_FORMAT_PLANAR:
             return BilinearLayout::kPlanar;
-        case 18:
-        case 19:
+        case OVRIN_FORMAT_SEMI_PLANAR:
+        case OVRIN_FORMAT_SEMI_PLANAR_2:
             return BilinearLayout::kSemiPlanar;
         default:
             return BilinearLayout::kUnknown;
@@ -97,7 +97,7 @@ BilinearLayout bilinear_layout(int32_t format) {
 }
 
 Yuv420Layout BilinearGeometry::canvas_planes() const {
-    return {chroma_of(layout), canvas_width, canvas_height};
+    return {format_of(layout), canvas_width, canvas_height};
 }
 
 BilinearGeometry geometry_of(const BilinearCall& call) {
@@ -128,16 +128,11 @@ BilinearExtent extent_of(const BilinearGeometry& geometry, const BilinearTables&
     BilinearExtent extent = {tables.dst_w, tables.dst_h,
                              edge_count(tables.col_index, tables.dst_w, geometry.src_width),
                              edge_count(tables.row_index, tables.dst_h, geometry.src_height)};
-    const int64_t room_right = int64_t{geometry.canvas_width} - geometry.dst_x;
-    const int64_t room_below = int64_t{geometry.canvas_height} - geometry.dst_y;
-    if (room_right < extent.columns) {
-        extent.columns = room_right < 0 ? 0 : static_cast<int32_t>(room_right);
-        extent.edge_cols = 0;
-    }
-    if (room_below < extent.rows) {
-        extent.rows = room_below < 0 ? 0 : static_cast<int32_t>(room_below);
-        extent.edge_cols = 0;
-    }
+    const int64_t columns = visible(tables.dst_w, geometry.dst_x, geometry.canvas_width);
+    const int64_t rows = visible(tables.dst_h, geometry.dst_y, geometry.canvas_height);
+    if (columns < extent.columns || rows < extent.rows) extent.edge_cols = 0;
+    extent.columns = columns < 0 ? 0 : static_cast<int32_t>(columns);
+    extent.rows = rows < 0 ? 0 : static_cast<int32_t>(rows);
     return extent;
 }
 
@@ -147,11 +142,9 @@ void clear_canvas(const BilinearGeometry& geometry, const BilinearExtent& extent
                             extent.rows == geometry.canvas_height;
     if (is_covered) return;
     if (geometry.layout != BilinearLayout::kPixels) {
-        paint_black(geometry.canvas, geometry.canvas_planes());
-    } else if (geometry.canvas_width > 0 && geometry.canvas_height > 0) {
-        memset(geometry.canvas, 0,
-               static_cast<size_t>(geometry.canvas_width) *
-                   static_cast<size_t>(geometry.canvas_height) * 4);
+        paint_planes_black(geometry.canvas, geometry.canvas_planes());
+    } else {
+        paint_rgba_black(geometry.canvas, geometry.canvas_width, geometry.canvas_height);
     }
 }
 

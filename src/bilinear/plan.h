@@ -6,7 +6,7 @@
 #include <stddef.h>
 #include <stdlib.h>
 
-#include "yuv420/layout.h"
+#include "canvas/yuv420_layout.h"
 
 namespace ovrin {
 

@@ -50,14 +50,14 @@ Plane first_plane(const BilinearGeometry& g) {
 Plane chroma_plane(const BilinearGeometry& g, int32_t number) {
     const Yuv420Layout canvas = g.canvas_planes();
     const bool planar = g.layout == BilinearLayout::kPlanar;
-    const int32_t bytes = canvas.chroma.sample_bytes;
+    const int32_t bytes = canvas.format.chroma_bytes();
     Plane plane = {};
     plane.src = g.src_chroma[number];
     plane.src_pitch = ptrdiff_t{half_rounded_up(g.src_stride)} * bytes;
     // Planar edge columns take their lower sample a luma row further on, about two chroma rows
     // down.
     plane.edge_pitch = planar ? ptrdiff_t{g.src_stride} : plane.src_pitch;
-    plane.dst_pitch = canvas.chroma_row();
+    plane.dst_pitch = canvas.chroma_pitch();
     plane.dst = g.canvas + canvas.chroma_offset(number) + (g.dst_y >> 1) * plane.dst_pitch +
                 ptrdiff_t{g.dst_x >> 1} * bytes;
     plane.sample_bytes = bytes;
@@ -70,7 +70,7 @@ template <class Function>
 void for_each_plane(const BilinearGeometry& g, const Function& function) {
     function(first_plane(g));
     if (g.layout == BilinearLayout::kPixels) return;
-    const int32_t planes = g.canvas_planes().chroma.planes;
+    const int32_t planes = g.canvas_planes().format.chroma_planes;
     for (int32_t i = 0; i < planes; ++i) function(chroma_plane(g, i));
 }
 
@@ -98,10 +98,16 @@ void for_each_strip(const Plane& plane, const BilinearAxes& axes, Range samples,
     }
 }
 
-void prefetch_columns(const BilinearColumns& columns, const uint8_t* row) {
+// The part of a source row that the columns name.
+struct Span {
+    int64_t first;
+    int64_t bytes;
+};
+
+Span span_of(const BilinearColumns& columns) {
     const int64_t bytes = columns.sample_bytes;
     const int64_t first = bytes * columns.index[0];
-    prefetch(row + first, bytes * (columns.index[columns.count - 1] + int64_t{2}) - first);
+    return {first, bytes * (columns.index[columns.count - 1] + int64_t{2}) - first};
 }
 
 // A strip of a plane, and two of its source rows, blended horizontally. A destination row takes two
@@ -122,16 +128,23 @@ public:
             const uint8_t* bottom = top + below;
             const BilinearSums& upper = sums(top, bottom);
             const BilinearSums& lower = sums(bottom, top);
-            if (r + step < rows.end) {
-                const uint8_t* next = plane.src_row(axes.row_index[r + step]);
-                if (next > bottom) prefetch_columns(columns_, next);
-                if (next > top) prefetch_columns(columns_, next + below);
-            }
-            kernels_.down(plane.dst_row(r) + offset, upper, lower, axes.row_weight[r], plan_);
+            const uint8_t* next =
+                r + step < rows.end ? plane.src_row(axes.row_index[r + step]) : top;
+            kernels_.down(plane.dst_row(r) + offset, upper, lower, axes.row_weight[r], plan_,
+                          rows_to_fetch(top, bottom, next, below));
         }
     }
 
 private:
+    // What `next` and the row below it take that `top` and `bottom` do not.
+    BilinearNext rows_to_fetch(const uint8_t* top, const uint8_t* bottom, const uint8_t* next,
+                               ptrdiff_t below) const {
+        if (next <= top) return {};
+        const Span span = span_of(columns_);
+        const uint8_t* second = next + below + span.first;
+        return {{next > bottom ? next + span.first : second, second}, span.bytes};
+    }
+
     // The sums of `row`; those of `kept` stay as well if they are there.
     const BilinearSums& sums(const uint8_t* row, const uint8_t* kept) {
         const int held = row == rows_[0] ? 0 : 1;
@@ -178,9 +191,12 @@ void copy_plane(const Kernels& set, const Plane& plane, const BilinearAxes& axes
     const auto copy_strip = [&](const BilinearColumns& strip, int32_t first) {
         BilinearPlan plan;
         BilinearCopy* copy = set.plan_bilinear_copy(plan, strip);
+        const Span span = span_of(strip);
         for (int32_t r = plane.first_row(rows.first); r < rows.end; r += plane.subsampling) {
             const int32_t next = r + plane.subsampling;
-            if (next < rows.end) prefetch_columns(strip, plane.src_row(axes.row_index[next]));
+            if (next < rows.end) {
+                prefetch(plane.src_row(axes.row_index[next]) + span.first, span.bytes);
+            }
             copy(plane.dst_row(r) + ptrdiff_t{first} * plane.sample_bytes,
                  plane.src_row(axes.row_index[r]), plan);
         }

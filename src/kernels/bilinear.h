@@ -41,6 +41,12 @@ struct BilinearSums {
     alignas(64) uint32_t values[kBilinearColumns * 4];
 };
 
+// Parts of two source rows that will be asked for next, to be fetched meanwhile.
+struct BilinearNext {
+    const uint8_t* rows[2];
+    int64_t bytes;
+};
+
 // Row kernels for a plan. For every column i, with the weight wx, and every byte c of a sample of N
 // bytes, modulo 2^32:
 //
@@ -57,7 +63,7 @@ struct BilinearSums {
 // named are written. No alignment is needed.
 using BilinearAcross = void(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan);
 using BilinearDown = void(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower,
-                          int32_t wy, const BilinearPlan& plan);
+                          int32_t wy, const BilinearPlan& plan, const BilinearNext& next);
 using BilinearCopy = void(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan);
 
 struct BilinearKernels {

@@ -67,11 +67,13 @@ __m256i blend_bytes(const uint32_t* upper, const uint32_t* lower, __m256i wy) {
 }
 
 void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
-          const BilinearPlan& plan) {
+          const BilinearPlan& plan, const BilinearNext& next) {
     const int32_t bytes = plan.bytes();
+    SteadyFetch fetch(next, bytes / kStepBytes);
     const __m256i weight = _mm256_set1_epi32(wy);
     int32_t i = 0;
     for (; i + kStepBytes <= bytes; i += kStepBytes) {
+        fetch.step();
         _mm256_storeu_si256(reinterpret_cast<__m256i*>(dst + i),
                             blend_bytes(upper.values + i, lower.values + i, weight));
     }

@@ -69,11 +69,13 @@ uint8x16_t blend_bytes(const uint32_t* upper, const uint32_t* lower, uint32_t wy
 }
 
 void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
-          const BilinearPlan& plan) {
+          const BilinearPlan& plan, const BilinearNext& next) {
     const int32_t bytes = plan.bytes();
+    SteadyFetch fetch(next, bytes / kStepBytes);
     const uint32_t weight = static_cast<uint32_t>(wy);
     int32_t i = 0;
     for (; i + kStepBytes <= bytes; i += kStepBytes) {
+        fetch.step();
         vst1q_u8(dst + i, blend_bytes(upper.values + i, lower.values + i, weight));
     }
     if (i < bytes) {

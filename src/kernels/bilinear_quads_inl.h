@@ -8,6 +8,7 @@
 #include <string.h>
 
 #include "kernels/bilinear.h"
+#include "kernels/prefetch.h"
 
 namespace ovrin {
 
@@ -83,6 +84,27 @@ bool plan_quads(BilinearPlan& plan, const BilinearColumns& columns, const QuadSh
     if (columns.sample_bytes == 2) return plan_quads_of<2>(plan, columns, shape);
     return plan_quads_of<4>(plan, columns, shape);
 }
+
+// Fetches rows line by line while something else goes on in so many steps: asked for all at once,
+// lines would wait for each other, and the processor for them.
+class SteadyFetch {
+public:
+    SteadyFetch(const BilinearNext& next, int32_t steps)
+        : next_(next), step_bytes_(next.bytes / (steps > 0 ? steps : 1)) {}
+
+    OVRIN_ALWAYS_INLINE void step() {
+        wanted_ += step_bytes_;
+        for (; fetched_ < wanted_; fetched_ += kCacheLine) {
+            for (const uint8_t* row : next_.rows) __builtin_prefetch(row + fetched_);
+        }
+    }
+
+private:
+    const BilinearNext next_;
+    const int64_t step_bytes_;
+    int64_t wanted_ = 0;
+    int64_t fetched_ = 0;
+};
 
 template <int N>
 bool plan_groups_of(BilinearPlan& plan, const BilinearColumns& columns, int32_t group_bytes,

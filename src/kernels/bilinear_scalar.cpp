@@ -25,7 +25,7 @@ void across(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
 }
 
 void down(uint8_t* dst, const BilinearSums& upper, const BilinearSums& lower, int32_t wy,
-          const BilinearPlan& plan) {
+          const BilinearPlan& plan, const BilinearNext& /*next*/) {
     const int32_t bytes = plan.bytes();
     for (int32_t i = 0; i < bytes; ++i) {
         const uint32_t result = blend(upper.values[i], lower.values[i], wy);

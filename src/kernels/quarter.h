@@ -26,6 +26,7 @@ struct QuarterPlan {
     int32_t samples;         // in the strip
     int32_t vector_samples;  // vector kernels: in a destination vector
     int64_t row_bytes;
+    int64_t first_byte;  // kernels of simple ratios: of the strip's first group, in a source row
     union {
         alignas(64) Tap taps[kPlanTaps];
         uint8_t bytes[kPlanBytes];
@@ -65,5 +66,10 @@ struct QuarterKernels {
 // ratio.
 using PlanQuarters = const QuarterKernels&(QuarterPlan& plan, const QuarterRowShape& shape,
                                            QuarterColumns& columns, int32_t samples);
+
+// The same for rows with one of the ratios that a set has kernels for; null, and nothing is
+// changed, for all others.
+using PlanSimpleQuarters = const QuarterKernels*(QuarterPlan& plan, const QuarterRowShape& shape,
+                                                 QuarterColumns& columns, int32_t samples);
 
 }  // namespace ovrin

@@ -163,6 +163,8 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
 
 const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
+    const QuarterKernels* simple = plan_simple_quarters_avx2(plan, shape, columns, samples);
+    if (simple != nullptr) return *simple;
     const WindowShape lane = window_shape(shape, kLane, kMaxWindows);
     if (lane.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
     plan.sample_bytes = shape.sample_bytes;

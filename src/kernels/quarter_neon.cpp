@@ -136,6 +136,8 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
 
 const QuarterKernels& plan_quarters_neon(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
+    const QuarterKernels* simple = plan_simple_quarters_neon(plan, shape, columns, samples);
+    if (simple != nullptr) return *simple;
     const WindowShape vector = window_shape(shape, kVector, kMaxWindows);
     if (vector.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
     plan_offsets<kVector>(plan, shape, vector, columns, samples);

@@ -3,15 +3,17 @@
 
 #include <stdint.h>
 
+#include "kernels/inline.h"
+
 namespace ovrin {
 
 // The quarter or three-quarter points of successive destination cells (rows or columns) along one
 // axis, and the source cells that hold them.
 //
 // With S source cells scaled to D destination cells, the axis is measured in units of which a
-// source cell holds D and a destination cell S. The point of destination cell k lies at first + k *
-// S, so in source cell (first + k * S) / D. Stepping keeps quotient and remainder: walking an axis
-// divides only once, and nothing overflows.
+// source cell holds D and a destination cell S. The point of destination cell k lies at
+// first + k * S, so in source cell (first + k * S) / D. Stepping keeps quotient and remainder:
+// walking an axis divides only once, and nothing overflows.
 class QuarterPoints {
 public:
     // Source cells are counted from the one that starts at position 0. When the first point lies
@@ -26,9 +28,9 @@ public:
     }
 
     // The source cell that holds the current point.
-    int64_t cell() const { return cell_; }
+    OVRIN_ALWAYS_INLINE int64_t cell() const { return cell_; }
 
-    void next() {
+    OVRIN_ALWAYS_INLINE void next() {
         cell_ += step_cells_;
         const int64_t remainder = int64_t{remainder_} + step_remainder_;
         const bool carry = remainder >= destination_;
@@ -37,7 +39,7 @@ public:
     }
 
     // To a later point that lies a whole number of source cells further on.
-    void skip_cells(int64_t cells) { cell_ += cells; }
+    OVRIN_ALWAYS_INLINE void skip_cells(int64_t cells) { cell_ += cells; }
 
 private:
     int64_t cell_ = INT64_MAX;
@@ -58,14 +60,14 @@ struct QuarterColumns {
     QuarterPoints left;
     QuarterPoints right;
 
-    Tap next() {
+    OVRIN_ALWAYS_INLINE Tap next() {
         const Tap tap = {static_cast<int32_t>(left.cell()), static_cast<int32_t>(right.cell())};
         left.next();
         right.next();
         return tap;
     }
 
-    void skip_cells(int64_t cells) {
+    OVRIN_ALWAYS_INLINE void skip_cells(int64_t cells) {
         left.skip_cells(cells);
         right.skip_cells(cells);
     }

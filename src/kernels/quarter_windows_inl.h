@@ -5,6 +5,7 @@
 // past the row, so kernels load whole vectors and have no border case.
 #pragma once
 
+#include <stddef.h>
 #include <string.h>
 
 #include "kernels/quarter.h"

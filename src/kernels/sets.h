@@ -10,6 +10,8 @@ PlanQuarters plan_quarters_scalar;
 PlanQuarters plan_quarters_avx2;
 PlanQuarters plan_quarters_avx512;
 PlanQuarters plan_quarters_neon;
+PlanSimpleQuarters plan_simple_quarters_avx2;
+PlanSimpleQuarters plan_simple_quarters_neon;
 
 PlanBilinear plan_bilinear_scalar;
 PlanBilinear plan_bilinear_avx2;

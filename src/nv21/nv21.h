@@ -1,13 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "yuv420/layout.h"
+#include "yuv420/source.h"
 
 namespace ovrin {
 
-inline Yuv420Source two_planes(const uint8_t* y, const uint8_t* vu, int32_t width, int32_t height,
-                               int32_t row_bytes) {
-    return {kInterleavedChroma, width, height, row_bytes, y, {vu, nullptr}};
+inline Yuv420Source two_planes(const uint8_t* y, const uint8_t* vu, int32_t width, int32_t height) {
+    return {kNv21, width, height, width, y, {vu, nullptr}};
 }
 
 }  // namespace ovrin

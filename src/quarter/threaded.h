@@ -7,7 +7,7 @@
 namespace ovrin {
 
 // Several threads that share the bands of a picture, plane by plane. A band is a run of source
-// rows, with the target rows whose cells begin in it, so that no two bands have a target row in
+// rows, with the destination rows whose cells begin in it, so that no two bands have one in
 // common.
 struct BandedPlanes {
     const QuarterPlane* planes;

@@ -4,7 +4,8 @@
 #pragma once
 
 #include "quarter/sampler.h"
-#include "yuv420/layout.h"
+#include "yuv420/grid.h"
+#include "yuv420/source.h"
 
 namespace ovrin {
 
@@ -19,41 +20,41 @@ struct Yuv420Destination {
 inline Yuv420Destination contiguous_destination(const Yuv420Layout& layout, uint8_t* base) {
     return {base,
             {base + layout.chroma_offset(0), base + layout.chroma_offset(1)},
-            layout.width,
-            layout.chroma_row()};
+            layout.luma_pitch(),
+            layout.chroma_pitch()};
 }
 
 inline QuarterPlane luma_plane(const Yuv420Source& source, const Yuv420Layout& picture,
-                               const Yuv420Destination& to) {
+                               const Yuv420Destination& dst) {
     QuarterPlane plane = {};
     plane.src = source.luma;
-    plane.src_pitch = source.row_bytes;
+    plane.src_pitch = source.luma_pitch();
     plane.src_columns = source.width;
     plane.src_rows = source.height;
-    plane.dst = to.luma;
-    plane.dst_pitch = to.luma_pitch;
+    plane.dst = dst.luma;
+    plane.dst_pitch = dst.luma_pitch;
     plane.dst_columns = plane.columns = picture.width;
     plane.dst_rows = plane.rows = picture.height;
-    plane.sample_bytes = 1;
+    plane.sample_bytes = source.format.luma_bytes();
     return plane;
 }
 
 // The picture's chroma: the first columns and rows of its grid.
 inline QuarterPlane chroma_plane(const Yuv420Source& source, const Yuv420Layout& picture,
-                                 const Yuv420Destination& to, int32_t index) {
+                                 const Yuv420Destination& dst, int32_t index) {
     const Yuv420Layout grid = grid_of(picture);
     QuarterPlane plane = {};
-    plane.src = source.chroma_planes[index];
-    plane.src_pitch = source.chroma_row_bytes();
+    plane.src = source.chroma[index];
+    plane.src_pitch = source.chroma_pitch();
     plane.src_columns = half_rounded_up(source.width);
     plane.src_rows = half_rounded_up(source.height);
-    plane.dst = to.chroma[index];
-    plane.dst_pitch = to.chroma_pitch;
-    plane.dst_columns = half_rounded_up(grid.width);
-    plane.dst_rows = half_rounded_up(grid.height);
-    plane.columns = half_rounded_up(picture.width);
-    plane.rows = half_rounded_up(picture.height);
-    plane.sample_bytes = source.chroma.sample_bytes;
+    plane.dst = dst.chroma[index];
+    plane.dst_pitch = dst.chroma_pitch;
+    plane.dst_columns = grid.chroma_width();
+    plane.dst_rows = grid.chroma_height();
+    plane.columns = picture.chroma_width();
+    plane.rows = picture.chroma_height();
+    plane.sample_bytes = source.format.chroma_bytes();
     return plane;
 }
 
@@ -63,11 +64,11 @@ struct PicturePlanes {
 };
 
 inline PicturePlanes picture_planes(const Yuv420Source& source, const Yuv420Layout& picture,
-                                    const Yuv420Destination& to) {
+                                    const Yuv420Destination& dst) {
     PicturePlanes all = {};
-    all.planes[all.count++] = luma_plane(source, picture, to);
-    for (int32_t plane = 0; plane < source.chroma.planes; ++plane) {
-        all.planes[all.count++] = chroma_plane(source, picture, to, plane);
+    all.planes[all.count++] = luma_plane(source, picture, dst);
+    for (int32_t i = 0; i < source.format.chroma_planes; ++i) {
+        all.planes[all.count++] = chroma_plane(source, picture, dst, i);
     }
     return all;
 }

@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include <stdlib.h>
-
-#include "yuv420/layout.h"
+#include "canvas/yuv420_layout.h"
 
 namespace ovrin {
 
@@ -11,7 +9,7 @@ namespace ovrin {
 class WorkBuffer {
 public:
     explicit WorkBuffer(const Yuv420Layout& grid);
-    ~WorkBuffer() { free(data_); }
+    ~WorkBuffer();
 
     WorkBuffer(const WorkBuffer&) = delete;
     WorkBuffer& operator=(const WorkBuffer&) = delete;

@@ -47,10 +47,10 @@ make_twin() {
         s/ int32_t format;  / int32_t src_buffer_height;  /
         s/ HELD; / format; /'
     change include/ovrinresize.h 's/ov_sleep(uint32_t/ov_sleep(uint64_t/'
-    change src/dispatch/sleep.cpp 's/ov_sleep(uint32_t/ov_sleep(uint64_t/'
-    change src/dispatch/sleep.cpp 's/usleep(useconds)/usleep(static_cast<uint32_t>(useconds))/'
+    change src/bands/sleep.cpp 's/ov_sleep(uint32_t/ov_sleep(uint64_t/'
+    change src/bands/sleep.cpp 's/usleep(useconds)/usleep(static_cast<uint32_t>(useconds))/'
     # Its assertions would refuse the record before anything is compared.
-    change src/layout.cpp "/^static_assert/,\$d"
+    change src/dispatch/records.cpp "/^static_assert/,\$d"
     cd - >/dev/null
 }
 

@@ -139,8 +139,9 @@ TEST_F(BilinearKernelsTest, DownEqualsTheScalarOne) {
             std::vector<uint8_t> expected(static_cast<size_t>(plan->bytes()));
             GuardedBuffer<uint8_t> actual(expected.size(),
                                           random.pick({Flush::kEnd, Flush::kStart}), 0xEE);
-            scalar(expected.data(), *upper, *lower, weight, *scalar_plan);
-            tested(actual.data(), *upper, *lower, weight, *plan);
+            const BilinearNext next = {{actual.data(), expected.data()}, random.between(0, 5000)};
+            scalar(expected.data(), *upper, *lower, weight, *scalar_plan, next);
+            tested(actual.data(), *upper, *lower, weight, *plan, next);
             EXPECT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()));
             EXPECT_TRUE(actual.intact());
         }

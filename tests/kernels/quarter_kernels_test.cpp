@@ -4,7 +4,11 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <iterator>
 #include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
 
 #include "support/compare.h"
 #include "support/guarded_buffer.h"
@@ -64,13 +68,15 @@ void run(const Planned& planned, Kernel kernel, uint8_t* dst, const uint8_t* top
     }
 }
 
-// Compares the strips of a whole row; returns whether the set has kernels of its own for it.
-bool check_row(const NamedKernels& set, const Row& row, Random& random) {
+// Compares the strips of columns `first` to `end` of a row; returns whether the set has kernels of
+// its own for them.
+bool check_columns(const NamedKernels& set, const Row& row, int32_t first, int32_t end,
+                   Random& random) {
     const size_t row_bytes =
         static_cast<size_t>(row.src_columns) * static_cast<size_t>(row.sample_bytes);
     bool differs = false;
-    for (int32_t done = 0; done < row.dst_columns;) {
-        const auto tested = plan_with(*set.kernels, row, done, row.dst_columns - done);
+    for (int32_t done = first; done < end;) {
+        const auto tested = plan_with(*set.kernels, row, done, end - done);
         const int32_t strip = tested->plan.samples;
         for (const Kernel kernel : {Kernel::kStorePair, Kernel::kAddPair, Kernel::kAddRow}) {
             const Flush flush = random.pick({Flush::kEnd, Flush::kStart});
@@ -96,6 +102,47 @@ bool check_row(const NamedKernels& set, const Row& row, Random& random) {
         done += strip;
     }
     return differs;
+}
+
+bool check_row(const NamedKernels& set, const Row& row, Random& random) {
+    return check_columns(set, row, 0, row.dst_columns, random);
+}
+
+struct Ratio {
+    int32_t src;
+    int32_t dst;
+};
+
+// What each set does with kernels made for the ratio.
+struct SimpleRatio {
+    std::string_view set;
+    int32_t sample_bytes;
+    Ratio ratio;
+};
+
+std::vector<SimpleRatio> simple_ratios(const NamedKernels& set) {
+    std::vector<SimpleRatio> all;
+    for (const int32_t n : {1, 2, 4}) {
+        for (const Ratio ratio : {Ratio{2, 1}, Ratio{3, 1}, Ratio{4, 1}, Ratio{3, 2}}) {
+            all.push_back({"avx2", n, ratio});
+            all.push_back({"neon", n, ratio});
+        }
+        all.push_back({"neon", n, {2, 3}});
+    }
+    std::vector<SimpleRatio> of_set;
+    std::copy_if(all.begin(), all.end(), std::back_inserter(of_set),
+                 [&](const SimpleRatio& simple) { return simple.set == set.name; });
+    return of_set;
+}
+
+Row row_of(const SimpleRatio& simple, int32_t groups) {
+    return {simple.sample_bytes, simple.ratio.src * groups, simple.ratio.dst * groups};
+}
+
+std::string describe(const SimpleRatio& simple) {
+    return std::string(simple.set) + ' ' + std::to_string(simple.ratio.src) + ':' +
+           std::to_string(simple.ratio.dst) + ", samples of " +
+           std::to_string(simple.sample_bytes) + " bytes";
 }
 
 using VectorQuarterKernels = VectorSets;
@@ -126,6 +173,58 @@ TEST_F(VectorQuarterKernels, EveryRatioUpToTenOfLongRows) {
                 const int32_t samples = random.between(257, 700);
                 const int32_t source = std::max(1, samples * tenths / 10 + random.between(-3, 3));
                 check_row(set, {n, source, samples}, random);
+            }
+        }
+    }
+}
+
+// A ratio that is just missed takes the kernels for any ratio; were they to take the simple ones
+// too, the two would be the same.
+TEST_F(VectorQuarterKernels, SimpleRatiosHaveKernelsOfTheirOwn) {
+    for (const NamedKernels& set : vector_sets_) {
+        for (const SimpleRatio& simple : simple_ratios(set)) {
+            SCOPED_TRACE(describe(simple));
+            const auto kernels_of = [](const Kernels& kernels, const Row& row) {
+                return plan_with(kernels, row, 0, row.dst_columns)->kernels;
+            };
+            const Row row = row_of(simple, 100);
+            Row missed = row;
+            ++missed.src_columns;
+            const QuarterKernels* own = kernels_of(*set.kernels, row);
+            EXPECT_NE(own, kernels_of(*set.kernels, missed));
+            EXPECT_NE(own, kernels_of(scalar_kernels, row));
+            EXPECT_EQ(own, kernels_of(*set.kernels, row_of(simple, 131)));
+            EXPECT_EQ(plan_with(*set.kernels, row, 0, row.dst_columns)->plan.samples,
+                      row.dst_columns);
+        }
+    }
+}
+
+TEST_F(VectorQuarterKernels, SimpleRatiosOfAllLengths) {
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(34);
+        SCOPED_TRACE(random.trace());
+        for (const SimpleRatio& simple : simple_ratios(set)) {
+            SCOPED_TRACE(describe(simple));
+            for (int32_t groups = 1; groups <= 200 && !HasFailure(); ++groups) {
+                check_row(set, row_of(simple, groups), random);
+            }
+        }
+    }
+}
+
+// Strips that begin inside a row, and inside a group of columns that repeats, or end before it.
+TEST_F(VectorQuarterKernels, PartsOfRowsWithSimpleRatios) {
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(35);
+        SCOPED_TRACE(random.trace());
+        for (const SimpleRatio& simple : simple_ratios(set)) {
+            SCOPED_TRACE(describe(simple));
+            for (int i = 0; i < rounds(100) && !HasFailure(); ++i) {
+                const Row row = row_of(simple, random.between(1, 200));
+                const int32_t first = random.between(0, row.dst_columns - 1);
+                const int32_t end = random.between(first + 1, row.dst_columns);
+                check_columns(set, row, first, end, random);
             }
         }
     }

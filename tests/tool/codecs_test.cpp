@@ -59,6 +59,21 @@ Picture gradient(tool::Size size) {
     return picture;
 }
 
+Picture decode_png(const uint8_t* data, size_t size) {
+    tool::Metadata ignored;
+    return tool::decode_png(data, size, &ignored);
+}
+
+Picture decode_jpeg(const uint8_t* data, size_t size) {
+    tool::Metadata ignored;
+    return tool::decode_jpeg(data, size, &ignored);
+}
+
+Picture decode_ppm(const uint8_t* data, size_t size) {
+    tool::Metadata ignored;
+    return tool::decode_ppm(data, size, &ignored);
+}
+
 struct Codec {
     const char* name;
     bool (*recognise)(const uint8_t*, size_t);
@@ -67,10 +82,11 @@ struct Codec {
 };
 
 const Codec kCodecs[] = {
-    {"PNG", tool::is_png, tool::decode_png, tool::encode_png},
-    {"JPEG", tool::is_jpeg, tool::decode_jpeg,
-     [](const Picture& picture, FILE* out) { tool::encode_jpeg(picture, 90, out); }},
-    {"PPM", tool::is_ppm, tool::decode_ppm, tool::encode_ppm},
+    {"PNG", tool::is_png, decode_png,
+     [](const Picture& picture, FILE* out) { tool::encode_png(picture, {}, out); }},
+    {"JPEG", tool::is_jpeg, decode_jpeg,
+     [](const Picture& picture, FILE* out) { tool::encode_jpeg(picture, {}, 90, out); }},
+    {"PPM", tool::is_ppm, decode_ppm, tool::encode_ppm},
 };
 
 Bytes encoded(const Codec& codec, const Picture& picture) {
@@ -123,7 +139,7 @@ Bytes pixels_of(const Picture& picture) {
 }
 
 Picture decode_ppm(const std::string& file) {
-    return tool::decode_ppm(reinterpret_cast<const uint8_t*>(file.data()), file.size());
+    return decode_ppm(reinterpret_cast<const uint8_t*>(file.data()), file.size());
 }
 
 }  // namespace
@@ -135,14 +151,14 @@ TEST(Codecs, LosslessTypesKeepEveryPixel) {
         for (const bool has_alpha : {false, true}) {
             const Picture picture = random_picture(&random, size, has_alpha);
             const Bytes png = encoded(kCodecs[0], picture);
-            const Picture from_png = tool::decode_png(png.data(), png.size());
+            const Picture from_png = decode_png(png.data(), png.size());
             EXPECT_EQ(from_png.has_alpha, has_alpha);
             EXPECT_EQ(rgb_bytes(from_png), rgb_bytes(picture));
             if (has_alpha) {
                 EXPECT_EQ(from_png.words, picture.words);
             }
             const Bytes ppm = encoded(kCodecs[2], picture);
-            const Picture from_ppm = tool::decode_ppm(ppm.data(), ppm.size());
+            const Picture from_ppm = decode_ppm(ppm.data(), ppm.size());
             EXPECT_FALSE(from_ppm.has_alpha);
             EXPECT_EQ(rgb_bytes(from_ppm), rgb_bytes(picture));
         }
@@ -152,7 +168,7 @@ TEST(Codecs, LosslessTypesKeepEveryPixel) {
 TEST(Codecs, JpegComesClose) {
     const Picture picture = gradient({80, 60});
     const Bytes file = encoded(kCodecs[1], picture);
-    const Picture decoded = tool::decode_jpeg(file.data(), file.size());
+    const Picture decoded = decode_jpeg(file.data(), file.size());
     ASSERT_EQ(decoded.size.width, 80);
     ASSERT_EQ(decoded.size.height, 60);
     for (size_t i = 0; i < picture.size.pixels() * 4; ++i) {
@@ -163,25 +179,25 @@ TEST(Codecs, JpegComesClose) {
 TEST(Codecs, PngOfOtherDepthsBecomesEightBitRgba) {
     const Bytes deep = png_of(16, PNG_COLOR_TYPE_RGB,
                               {0xFF, 0xFF, 0x80, 0x80, 0, 0, 0x12, 0x12, 0x34, 0x34, 0x56, 0x56});
-    EXPECT_EQ(pixels_of(tool::decode_png(deep.data(), deep.size())),
+    EXPECT_EQ(pixels_of(decode_png(deep.data(), deep.size())),
               (Bytes{0xFF, 0x80, 0, 255, 0x12, 0x34, 0x56, 255}));
     const Bytes gray = png_of(8, PNG_COLOR_TYPE_GRAY, {7, 250});
-    EXPECT_EQ(pixels_of(tool::decode_png(gray.data(), gray.size())),
+    EXPECT_EQ(pixels_of(decode_png(gray.data(), gray.size())),
               (Bytes{7, 7, 7, 255, 250, 250, 250, 255}));
     const Bytes gray_alpha = png_of(8, PNG_COLOR_TYPE_GRAY_ALPHA, {7, 90, 250, 0});
-    const Picture with_alpha = tool::decode_png(gray_alpha.data(), gray_alpha.size());
+    const Picture with_alpha = decode_png(gray_alpha.data(), gray_alpha.size());
     EXPECT_TRUE(with_alpha.has_alpha);
     EXPECT_EQ(pixels_of(with_alpha), (Bytes{7, 7, 7, 90, 250, 250, 250, 0}));
     const Bytes bits = png_of(1, PNG_COLOR_TYPE_GRAY, {0x40});
-    EXPECT_EQ(pixels_of(tool::decode_png(bits.data(), bits.size())),
+    EXPECT_EQ(pixels_of(decode_png(bits.data(), bits.size())),
               (Bytes{0, 0, 0, 255, 255, 255, 255, 255}));
 }
 
 TEST(Codecs, GrayJpegIsReadAndCmykIsRefused) {
     const Bytes gray = jpeg_of(JCS_GRAYSCALE, 1);
-    EXPECT_EQ(pixels_of(tool::decode_jpeg(gray.data(), gray.size()))[0], 200);
+    EXPECT_EQ(pixels_of(decode_jpeg(gray.data(), gray.size()))[0], 200);
     const Bytes cmyk = jpeg_of(JCS_CMYK, 4);
-    EXPECT_THROW(tool::decode_jpeg(cmyk.data(), cmyk.size()), tool::Error);
+    EXPECT_THROW(decode_jpeg(cmyk.data(), cmyk.size()), tool::Error);
 }
 
 TEST(Codecs, PpmHeadersAndDepths) {
@@ -214,7 +230,7 @@ TEST(Codecs, EveryTruncationIsRefused) {
     for (const Codec& codec : kCodecs) {
         const Bytes file = encoded(codec, gradient({40, 30}));
         // The last bytes of a PNG, its closing chunk, hold nothing of the picture.
-        const size_t needed = file.size() - (codec.decode == tool::decode_png ? 16 : 0);
+        const size_t needed = file.size() - (codec.decode == decode_png ? 16 : 0);
         for (size_t size = 0; size < needed; ++size) {
             const Bytes part(file.begin(), file.begin() + static_cast<ptrdiff_t>(size));
             if (!codec.recognise(part.data(), size)) continue;

@@ -11,11 +11,11 @@ make_picture >in.ppm
 for type in png jpg jpeg ppm PNG; do
     works in.ppm "out.$type" --size 24x20
 done
-works in.ppm in.png -s 48x40
+works in.ppm in.png -s 48x40 -e quarter
 works in.ppm in.jpg -s 48x40
 for type in ppm png jpg; do
     for to in png jpg ppm; do
-        works "in.$type" "from_$type.$to" --size 31x17 --engine quarter
+        works "in.$type" "from_$type.$to" --size 31x17! --engine quarter
         has_size "from_$type.$to" 31x17
     done
 done
@@ -27,7 +27,7 @@ cmp -s out.png out.PNG || complain "the ending .PNG differs from .png"
 
 # The content decides what a file is, not its name.
 cp in.png disguised.jpg
-works disguised.jpg from_disguise.ppm -s 31x17
+works disguised.jpg from_disguise.ppm -s 31x17! -e quarter
 cmp -s from_disguise.ppm from_png.ppm || complain "a PNG called .jpg is read differently"
 
 works in.ppm low.jpg -s 48x40 --quality 5
@@ -37,7 +37,7 @@ works in.ppm low.jpg -s 48x40 --quality 5
 
 # Four samples a quarter and three quarters of the way, each divided by 4 and rounded down.
 printf 'P6 4 2 255 \xff\x03\x00\xff\x04\x01\x08\x10\x20\x80\x81\x82\xff\x07\x02\xff\x08\x03\x0b\x13\x23\x40\x41\x42' >tiny.ppm
-works tiny.ppm tiny_out.ppm -s 2x1
+works tiny.ppm tiny_out.ppm -s 2x1 -e quarter
 [ "$(hex tiny_out.ppm)" = "$(printf 'P6\n2 1\n255\n' | od -An -tx1 | tr -d ' \n')fc0400343840" ] ||
     complain "2x1 result is $(hex tiny_out.ppm)"
 
@@ -50,8 +50,8 @@ fails 2 'a side is at most' in.ppm no.png --size 65536x1
 fails 2 'a side is at most' in.ppm no.png --size 1x99999999999999999999999999
 fails 2 'at least 1' in.ppm no.png --size=-99999999999999999999999999x1
 fails 2 'a picture has at most' in.ppm no.png --size 65535x65535
-for size in '' 10 10x x10 10x10x10 '10 x 10' axb 1e3x5 0x 10x10px; do
-    fails 2 "--size.*'$size' is not a size" in.ppm no.png --size "$size"
+for size in '' x 10x10x10 % 0% -5% 5%% 0@ 10! 50%^ '10 x' '>' '10 x 10' axb 1e3x5 10x10px; do
+    fails 2 "--size: '$size'" in.ppm no.png --size "$size"
 done
 fails 2 '--size or --canvas is required' in.ppm no.png
 fails 2 '--canvas.*at least 1' in.ppm no.png --canvas 0x3
@@ -112,11 +112,11 @@ chmod a-w locked
 for type in png jpg ppm; do
     (
         ulimit -f 4
-        fails 1 "no.$type: .*\(Write Error\|disk space?\|File too large\)" in.ppm "no.$type" -s 999x999 -q 100
+        fails 1 "no.$type: .*\(Write Error\|disk space?\|File too large\)" in.ppm "no.$type" -s 999x999! -q 100
         exit "$failures"
     ) || failures=$((failures + 1))
 done
-fails 1 'at most 65500\|65500 pixels' in.ppm no.jpg --size 65501x1
+fails 1 'at most 65500\|65500 pixels' in.ppm no.jpg --size 65501x1!
 
 # ---- Standard input and output ----
 
@@ -125,16 +125,16 @@ works in.ppm expected.ppm --size 24x20
 cmp -s expected.ppm piped.ppm || complain "standard input and output give another picture"
 "$tool" in.png - -s 24x20 >piped.png || complain "exit code $? of: in.png -"
 has_size piped.png 24x20
-"$tool" in.ppm - -s 300x300 >/dev/full 2>stderr && complain "success with a full standard output"
+"$tool" in.ppm - -s 300x300! >/dev/full 2>stderr && complain "success with a full standard output"
 grep -q '^ovrinresize: -: ' stderr || complain "full standard output gives: $(cat stderr)"
 
 # ---- What was done ----
 
 "$tool" in.ppm out.png -s 24x20 --verbose 2>stderr || complain "exit code $? of --verbose"
-grep -Eqx 'rgba 48x40 to 24x20: resized in [0-9]+\.[0-9]+ ms' stderr ||
+grep -Eqx 'rgba 48x40 to 24x20: resized by thumbnail in [0-9]+\.[0-9]+ ms' stderr ||
     complain "--verbose says: $(cat stderr)"
 "$tool" in.ppm out.png -c 96x40 -v 2>stderr || complain "exit code $? of -v"
-grep -Eqx 'rgba 48x40 to 48x40 on 96x40: resized in [0-9]+\.[0-9]+ ms' stderr ||
+grep -Eqx 'rgba 48x40 to 48x40 on 96x40: resized by lanczos in [0-9]+\.[0-9]+ ms' stderr ||
     complain "-v says: $(cat stderr)"
 
 # ---- What stands under the name of the result ----
@@ -143,13 +143,13 @@ cp in.ppm keep.png
 fails 1 'cut.ppm' cut.ppm keep.png --size 3x3
 cmp -s in.ppm keep.png || complain "a failure changed the older file"
 chmod 640 keep.png
-works in.ppm keep.png --size 3x3
+works in.ppm keep.png --size 3x3!
 has_size keep.png 3x3
 [ "$(stat -c %a keep.png)" = 640 ] || complain "permissions of the older file were lost"
-(umask 027 && "$tool" in.ppm masked.png -s 3x3)
+(umask 027 && "$tool" in.ppm masked.png -s 3x3!)
 [ "$(stat -c %a masked.png)" = 640 ] || complain "permissions do not follow the umask"
 ln -s keep.png link.png
-works in.ppm link.png --size 4x4
+works in.ppm link.png --size 4x4!
 [ -L link.png ] || complain "a link was replaced by a file"
 has_size keep.png 4x4
 mkfifo pipe.ppm
@@ -159,7 +159,7 @@ wait
 [ -p pipe.ppm ] || complain "a pipe was replaced by a file"
 cmp -s expected.ppm through_pipe.ppm || complain "a named pipe gives another picture"
 cp in.ppm same.ppm
-works same.ppm same.ppm --size 5x5
+works same.ppm same.ppm --size 5x5!
 has_size same.ppm 5x5
 [ -z "$(find . -name '.ovrinresize*')" ] || complain "temporary files: $(find . -name '.ovrinresize*')"
 
@@ -167,14 +167,20 @@ has_size same.ppm 5x5
 
 for flag in --help -h; do
     "$tool" "$flag" >help 2>stderr || complain "exit code $? of $flag"
-    grep -q '^Usage: ovrinresize IN OUT --size WxH' help || complain "no usage in $flag"
+    grep -q '^Usage: ovrinresize IN OUT --size SIZE' help || complain "no usage in $flag"
     [ ! -s stderr ] || complain "$flag writes to standard error"
     awk 'length > 100 { exit 1 }' help || complain "$flag has lines over 100 columns"
 done
-for option in --size --canvas --fit --engine --format --input-size --quality --verbose --help --version; do
-    grep -q -e " $option " help || complain "no $option in --help"
+for option in --size --canvas --fit --gravity --engine --format --input-size --quality --background --premultiply --no-rotate --strip --max-pixels --quiet --json --verbose --help --version; do
+    grep -q -e " ${option}[ ,]" help || complain "no $option in --help"
 done
+for flag in --help --version; do
+    "$tool" "$flag" >/dev/full 2>stderr && complain "success of $flag with a full standard output"
+    grep -q '^ovrinresize: standard output cannot be written' stderr || complain "$flag: $(cat stderr)"
+done
+"$tool" in.ppm out.png -s 3x3 --json >/dev/full 2>stderr && complain "success of --json, unprinted"
 for flag in --version -V; do
+    "$tool" "$flag" | grep -Eq '^libovrinresize [0-9.]+, kernels: (scalar|avx2|avx512|neon)$' || complain "$flag"
     "$tool" "$flag" | grep -Eq '^ovrinresize [0-9]+\.[0-9]+\.[0-9]+$' || complain "$flag"
 done
 

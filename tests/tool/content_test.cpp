@@ -68,7 +68,7 @@ struct Case {
     int32_t src_w, src_h, dst_w, dst_h;
 
     std::string input_size() const { return size_text(src_w, src_h); }
-    std::string options() const { return "--size " + size_text(dst_w, dst_h); }
+    std::string options() const { return "--size " + size_text(dst_w, dst_h) + "!"; }
 };
 
 struct CanvasCase {

@@ -51,7 +51,7 @@ TEST(Placement, OfPicturesWithoutChromaPlanes) {
     const Size size = {100, 50};
     const Size canvas = {130, 77};
     // Fields: size, canvas, fit; then: on a canvas, proportions kept, result, picture, position.
-    expect_place({size, {}, {}}, {300, 300}, rgba, {false, false, size, size, 0, 0});
+    expect_place({size, {}, Fit::kExact, {}}, {300, 300}, rgba, {false, false, size, size, 0, 0});
     expect_place({size, {}, Fit::kContain}, {300, 300}, rgba,
                  {false, true, {50, 50}, {50, 50}, 0, 0});
     expect_place({size, {}, Fit::kContain}, {300, 100}, rgba,

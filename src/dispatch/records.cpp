@@ -3,8 +3,6 @@
 #include <ovrinresize.h>
 #include <stddef.h>
 
-#include "yuv420/bands.h"
-
 static_assert(__BYTE_ORDER__ == __ORDER_LITTLE_ENDIAN__,
               "pixels are handled byte-wise where the interface says 32-bit words");
 static_assert(sizeof(void*) == 8, "record layouts are given for 64-bit platforms");
@@ -73,10 +71,6 @@ static_assert(offsetof(ovrin_nv21_band, work) == 128, "");
 static_assert(offsetof(ovrin_nv21_band, y_rows) == 136, "");
 static_assert(offsetof(ovrin_nv21_band, done) == 144, "");
 static_assert(sizeof(ovrin_nv21_band) == 152, "");
-
-// The library reads and writes the running state of either record as one block.
-static_assert(sizeof(ovrin::BandState) == offsetof(ovrin_yuv_band, src_width), "");
-static_assert(sizeof(ovrin::BandState) == offsetof(ovrin_nv21_band, src_width), "");
 
 static_assert(offsetof(ovrin_bilinear_band, target) == 0, "");
 static_assert(offsetof(ovrin_bilinear_band, src_width) == 8, "");

@@ -1,0 +1,84 @@
+#!/usr/bin/env bash
+# SPDX-License-Identifier: Apache-2.0
+# Whatever ends the ovrinresize command, and whenever: nothing is left beside OUT, and OUT is whole, or
+# what it was before.
+# Usage: interruption_test.sh PATH_OF_OVRINRESIZE PATH_OF_no_nameless_files.so
+source "$(dirname "${BASH_SOURCE[0]}")/support.sh"
+no_nameless_files=$2
+# A child that a signal ends before it has become the tool would act on the trap too.
+trap - EXIT
+
+rounds=$((100 / ${OVRIN_TEST_DIVISOR:-1}))
+RANDOM=${OVRIN_TEST_SEED:-1}
+{
+    printf 'P6\n900 700\n255\n'
+    head -c $((900 * 700 * 3)) /dev/urandom
+} >in.ppm
+arguments=(in.ppm folder/out.ppm -s 1000x800 -e lanczos)
+mkdir folder
+started=$(date +%s%N)
+works "${arguments[@]}"
+run_ns=$(($(date +%s%N) - started))
+mv folder/out.ppm whole.ppm
+ended=0
+finished=0
+
+# One run with the tool's environment in $@, ended by $signal at a random time, or twice.
+interrupted_run() {
+    local pause status
+    rm -f folder/out.ppm
+    if ((RANDOM % 2)); then echo older >folder/out.ppm; fi
+    # Background jobs of a script ignore some signals unless told otherwise.
+    env --default-signal=INT,QUIT "$@" "$tool" "${arguments[@]}" &
+    printf -v pause '%d.%09d' 0 $(((RANDOM * 32768 + RANDOM) % (run_ns * 5 / 4)))
+    sleep "$pause"
+    kill "-$signal" $! 2>/dev/null
+    if ((RANDOM % 2)); then kill "-$signal" $! 2>/dev/null; fi
+    wait $! 2>/dev/null
+    status=$?
+    if ((status > 128)); then ended=$((ended + 1)); else finished=$((finished + 1)); fi
+}
+
+check_folder() {
+    [ -z "$(find folder -mindepth 1 ! -name out.ppm)" ] ||
+        complain "$1: left after SIG$signal: $(ls -A folder)"
+    [ ! -e folder/out.ppm ] || cmp -s whole.ppm folder/out.ppm ||
+        [ "$(head -c 6 folder/out.ppm)" = older ] || complain "$1: a part of OUT after SIG$signal"
+}
+
+for signal in TERM INT HUP QUIT KILL; do
+    for ((round = 0; round < rounds; ++round)); do
+        interrupted_run
+        check_folder nameless
+    done
+done
+echo "files without a name: $ended runs ended, $finished finished"
+((ended > 0 && finished > 0)) || complain "$ended runs ended, $finished finished: nothing was tried"
+
+# Where the file system has no files without a name, SIGKILL leaves one; other signals do not, though a
+# temporary file is seen to be there.
+mkfifo never_ending
+rm folder/out.ppm
+for signal in TERM INT HUP QUIT; do
+    env --default-signal=INT,QUIT "LD_PRELOAD=$no_nameless_files" \
+        "$tool" never_ending folder/out.ppm -s 16x8 --format rgba --input-size 99x99 &
+    exec 9>never_ending
+    for _ in $(seq 100); do
+        [ -n "$(ls -A folder)" ] && break
+        sleep 0.05
+    done
+    [ -n "$(ls -A folder)" ] || complain "no temporary file to interrupt"
+    kill -"$signal" $!
+    wait $! 2>/dev/null && complain "success after SIG$signal"
+    exec 9>&-
+    check_folder fallback
+
+    for ((round = 0; round < rounds; ++round)); do
+        interrupted_run "LD_PRELOAD=$no_nameless_files"
+        check_folder fallback
+    done
+    rm -f folder/out.ppm
+done
+
+rm -rf "$folder"
+finish

@@ -1,0 +1,117 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "job.h"
+
+#include <chrono>
+#include <iostream>
+#include <memory>
+
+#include "error.h"
+#include "file_kind.h"
+#include "metadata.h"
+#include "output_file.h"
+#include "progress.h"
+#include "report.h"
+#include "resizer.h"
+#include "sink.h"
+#include "source.h"
+
+namespace tool {
+
+namespace {
+
+class Stopwatch {
+public:
+    template <class Action>
+    void time(Action action) {
+        const auto start = std::chrono::steady_clock::now();
+        action();
+        elapsed_ += std::chrono::steady_clock::now() - start;
+    }
+
+    double milliseconds() const { return elapsed_.count(); }
+
+private:
+    std::chrono::duration<double, std::milli> elapsed_ = {};
+};
+
+std::optional<Y4mHeader> resized_header(const Source& source, const Placement& placement) {
+    if (!source.y4m_header()) return std::nullopt;
+    return resized_y4m_header(*source.y4m_header(), placement.picture, placement.result,
+                              placement.keeps_aspect);
+}
+
+// Of still pictures that shrink a lot every pixel should count; frames come in numbers, and
+// quickly.
+Engine engine_for(const Options& options, const Source& source, Size upright, Size picture) {
+    if (options.engine) return *options.engine;
+    if (!is_image_file(source.kind())) return Engine::kQuarter;
+    // Lanczos copies.
+    const bool is_copy = upright.width == picture.width && upright.height == picture.height;
+    if (is_copy) return Engine::kLanczos;
+    const bool shrinks_a_lot =
+        upright.width / 2 >= picture.width && upright.height / 2 >= picture.height;
+    return shrinks_a_lot ? Engine::kThumbnail : Engine::kQuarter;
+}
+
+std::optional<Color> background_of(const Options& options, FileKind out) {
+    if (options.background || holds_alpha(out)) return options.background;
+    return kWhite;
+}
+
+SinkSettings settings_of(const Options& options, const Source& source, const Placement& placement) {
+    SinkSettings settings = {resized_header(source, placement), {}, options.quality};
+    if (!options.strip) {
+        settings.metadata = resized_metadata(source.metadata(), placement.result, options.rotate);
+    }
+    return settings;
+}
+
+}  // namespace
+
+void run(const Options& options) {
+    set_most_pixels(options.most_pixels);
+    std::optional<RawLayout> raw;
+    if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
+    const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
+    const PixelFormat format = source->kind().format;
+    const FileKind out_kind = concerning(options.out, [&] {
+        return options.out == "-" ? source->kind() : kind_of_name(options.out);
+    });
+    check_conversion(source->kind(), out_kind);
+    const Orientation orientation =
+        options.rotate ? orientation_of(source->metadata()) : Orientation::kUpright;
+    const Size upright = turned(source->size(), orientation);
+    const Placement placement = place(options.wish, upright, format);
+    const Engine engine = engine_for(options, *source, upright, placement.picture);
+    check_engine(engine, format);
+    const Resizing how = {engine,
+                          placement,
+                          orientation,
+                          background_of(options, out_kind),
+                          options.background,
+                          options.premultiply,
+                          is_image_file(source->kind())};
+
+    OutputFile file(options.out);
+    Sink sink(out_kind, settings_of(options, *source, placement), file.stream());
+    Picture frame;
+    Picture result;
+    Stopwatch resizing;
+    int64_t frames = 0;
+    {
+        Progress progress(!options.quiet);
+        while (concerning(options.in, [&] { return source->next(&frame); })) {
+            concerning(options.in, [&] { resizing.time([&] { resize(how, &frame, &result); }); });
+            concerning(options.out, [&] { sink.write(result); });
+            progress.update(++frames, source->part_read());
+        }
+    }
+    if (frames == 0) throw Error(options.in + ": holds no frame");
+    file.commit();
+    const Report report = {options.in, options.out, format, upright,
+                           placement,  engine,      frames, resizing.milliseconds()};
+    if (options.verbose) std::cerr << in_words(report);
+    if (options.json) std::cout << as_json(report);
+}
+
+}  // namespace tool

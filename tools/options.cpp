@@ -1,0 +1,214 @@
+// SPDX-License-Identifier: Apache-2.0
+#include "options.h"
+
+#include <initializer_list>
+#include <memory>
+#include <utility>
+#include <vector>
+
+#include "error.h"
+#include "version.h"
+
+namespace tool {
+
+namespace {
+
+// CLI11's help in the look of other command-line tools: "-s, --size WxH", and defaults in words.
+class HelpFormatter : public CLI::Formatter {
+public:
+    HelpFormatter() {
+        column_width(26);
+        label("Positionals", "Arguments");
+    }
+
+    std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
+        return "Usage: ovrinresize IN OUT --size SIZE [OPTION]...\n";
+    }
+
+    std::string make_option_name(const CLI::Option* option, bool is_positional) const override {
+        std::string name = Formatter::make_option_name(option, is_positional);
+        const size_t comma = name.find(',');
+        if (comma != std::string::npos) name.insert(comma + 1, " ");
+        // What CLI11 adds to the name of a switch that is turned off.
+        const size_t brace = name.find('{');
+        if (brace != std::string::npos) name.erase(brace);
+        return name;
+    }
+
+    std::string make_option_opts(const CLI::Option* option) const override {
+        return option->get_type_name().empty() ? "" : " " + option->get_type_name();
+    }
+};
+
+[[noreturn]] void reject(const std::string& names, const std::string& why) {
+    throw CLI::ValidationError(names.substr(names.find("--")), why);
+}
+
+// An option whose value `read` makes of a word, or throws Error.
+template <class Value, class Read>
+void add_value(CLI::App* app, const std::string& names, const std::string& type_name,
+               std::optional<Value>* value, Read read, const std::string& help) {
+    const auto parse = [value, names, read](const std::string& text) {
+        try {
+            *value = read(text);
+        } catch (const Error& error) {
+            reject(names, error.what());
+        }
+    };
+    app->add_option_function<std::string>(names, parse, help)->type_name(type_name);
+}
+
+Size read_size(const std::string& text) {
+    const std::optional<Size> size = parse_size(text);
+    if (!size) throw Error("'" + text + "' is not a size; write it like 640x480");
+    return *size;
+}
+
+// An option whose value is one of a few words. Target: a Value, or an optional one.
+template <class Target, class Value>
+void add_choice(CLI::App* app, const std::string& names, const std::string& type_name,
+                Target* target, std::initializer_list<std::pair<const char*, Value>> choices,
+                const std::string& help) {
+    const std::vector<std::pair<const char*, Value>> known(choices);
+    const auto parse = [target, names, known](const std::string& text) {
+        std::string words;
+        for (const auto& [word, value] : known) {
+            if (text == word) {
+                *target = value;
+                return;
+            }
+            words += std::string(" ") + word;
+        }
+        reject(names, "'" + text + "' is none of:" + words);
+    };
+    app->add_option_function<std::string>(names, parse, help)->type_name(type_name);
+}
+
+void add_switch_off(CLI::App* app, const std::string& name, bool* value, const std::string& help) {
+    app->add_flag_callback(
+        name, [value] { *value = false; }, help);
+}
+
+void declare_files(CLI::App* app, Options* options) {
+    app->add_option(
+           "IN", options->in,
+           "PNG, JPEG, binary PPM, Y4M or, with --format, raw frames;\n- is standard input")
+        ->required()
+        ->type_name("");
+    app->add_option("OUT", options->out,
+                    "Its name ends in .png, .jpg, .jpeg, .ppm, .y4m, or for raw frames\n"
+                    "in .nv21, .i420, .yuv, .rgba, .rgb; - is standard output, with\n"
+                    "the type of IN")
+        ->required()
+        ->type_name("");
+    add_choice<std::optional<PixelFormat>, PixelFormat>(
+        app, "--format", "FORMAT", &options->raw_format,
+        {{"nv21", PixelFormat::kNv21},
+         {"i420", PixelFormat::kI420},
+         {"rgba", PixelFormat::kRgba},
+         {"rgb", PixelFormat::kRgb}},
+        "IN holds raw frames: nv21, i420, rgba or rgb");
+    add_value(app, "--input-size", "WxH", &options->raw_size, read_size, "Size of the raw frames");
+    app->get_option("--format")->needs("--input-size");
+    app->get_option("--input-size")->needs("--format");
+}
+
+void declare_resizing(CLI::App* app, Options* options) {
+    add_value(app, "-s,--size", "SIZE", &options->wish.size, parse_geometry,
+              "640x480 fits inside and keeps the proportions; so do 640x, x480 and\n"
+              "640 (a width). 640x480! is exact, 640x480^ covers and is cropped.\n"
+              "50% is of both sides, 100000@ of pixels in all. With > behind it a\n"
+              "picture only shrinks, with < it only grows");
+    add_value(app, "-c,--canvas", "WxH", &options->wish.canvas, read_size,
+              "Put it in the middle of a canvas of this size, which it fills\n"
+              "unless there is a --size");
+    add_choice<std::optional<Fit>, Fit>(
+        app, "-f,--fit", "MODE", &options->wish.fit,
+        {{"contain", Fit::kContain}, {"exact", Fit::kExact}, {"cover", Fit::kCover}},
+        "Words for what the signs behind a size say: contain (the default),\n"
+        "exact (!) or cover (^)");
+    add_choice<Gravity, Gravity>(
+        app, "-g,--gravity", "PLACE", &options->wish.gravity,
+        {{"center", {1, 1}},
+         {"north", {1, 0}},
+         {"northeast", {2, 0}},
+         {"east", {2, 1}},
+         {"southeast", {2, 2}},
+         {"south", {1, 2}},
+         {"southwest", {0, 2}},
+         {"west", {0, 1}},
+         {"northwest", {0, 0}}},
+        "Which end of the canvas the picture lies at, or which part of it is\n"
+        "left when it is cropped: north, southeast and so on");
+    add_choice<std::optional<Engine>, Engine>(
+        app, "-e,--engine", "NAME", &options->engine,
+        {{"quarter", Engine::kQuarter},
+         {"thumbnail", Engine::kThumbnail},
+         {"bilinear", Engine::kBilinear},
+         {"bilinear-progressive", Engine::kBilinearProgressive},
+         {"lanczos", Engine::kLanczos},
+         {"nearest", Engine::kNearest}},
+        "Resampler: quarter, thumbnail, bilinear, bilinear-progressive,\n"
+        "lanczos or nearest. Without it thumbnail for pictures that shrink\n"
+        "to half or less in both directions, and quarter for all others");
+}
+
+void declare(CLI::App* app, Options* options) {
+    app->formatter(std::make_shared<HelpFormatter>());
+    declare_resizing(app, options);
+    declare_files(app, options);
+    app->add_option("-q,--quality", options->quality, "JPEG quality, 1 to 100; 90 by default")
+        ->type_name("N")
+        ->check(CLI::Range(1, 100).description(""));
+    add_value(app, "--background", "COLOUR", &options->background, parse_color,
+              "Colour behind what is transparent, and of the canvas: #rrggbb, #rgb\n"
+              "or a name. Without it PNG stays transparent, JPEG and others get\n"
+              "white, and the canvas is black");
+    app->add_flag("--premultiply,!--no-premultiply", options->premultiply,
+                  "Whether colours count as much as they are opaque, so that those of\n"
+                  "transparent pixels do not show; they do unless told otherwise");
+    add_switch_off(app, "--no-rotate", &options->rotate,
+                   "Leave pixels and the orientation that a camera recorded as they are;\n"
+                   "otherwise the result is upright");
+    app->add_flag("--strip", options->strip,
+                  "Drop colour profile, EXIF and all other metadata, which OUT keeps\n"
+                  "where its type can hold them");
+    app->add_flag("-v,--verbose", options->verbose,
+                  "Say on standard error what was done and how long the resizing took");
+    app->add_flag("--json", options->json,
+                  "Say on standard output what was done, as one line of JSON");
+    app->add_flag("--quiet", options->quiet, "Say nothing but what went wrong");
+    app->get_option("--quiet")->excludes("--verbose");
+    app->add_option("--max-pixels", options->most_pixels,
+                    "Refuse larger pictures, before memory is taken for them;\n"
+                    "268435456, which is the most, by default")
+        ->type_name("N")
+        ->check(CLI::Range(int64_t{1}, kMostPixels).description(""));
+    app->set_help_flag("-h,--help", "Print this help and exit");
+    app->set_version_flag("-V,--version", version_text(),
+                          "Print the versions and the kernels in use, and exit");
+    app->footer(
+        "The content of IN decides what it is, not its name. An older OUT is replaced.\n"
+        "See ovrinresize(1) for the details.\n"
+        "\n"
+        "Examples:\n"
+        "  ovrinresize photo.jpg small.jpg --size 1024x768\n"
+        "  ovrinresize photo.jpg screen.png --canvas 1920x1080\n"
+        "  ovrinresize camera.nv21 small.nv21 --format nv21 --input-size 4000x3000 -s 1000x750\n"
+        "  ffmpeg -i film.mp4 -f yuv4mpegpipe - | ovrinresize - - -s 640x360 | ffplay -");
+}
+
+}  // namespace
+
+void parse(int argc, char** argv, CLI::App* app, Options* options) {
+    declare(app, options);
+    app->parse(argc, argv);
+    if (!options->wish.size && !options->wish.canvas) {
+        throw CLI::RequiredError("--size or --canvas");
+    }
+    if (options->json && options->out == "-") {
+        throw CLI::ValidationError("--json", "standard output is taken by OUT");
+    }
+}
+
+}  // namespace tool
