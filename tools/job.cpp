@@ -69,12 +69,12 @@ SinkSettings settings_of(const Options& options, const Source& source, const Pla
 }  // namespace
 
 void run(const Options& options) {
-    set_most_pixels(options.most_pixels);
     std::optional<RawLayout> raw;
     if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
     const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
     const PixelFormat format = source->kind().format;
     const FileKind out_kind = concerning(options.out, [&] {
+        if (options.output_type) return *options.output_type;
         return options.out == "-" ? source->kind() : kind_of_name(options.out);
     });
     check_conversion(source->kind(), out_kind);
@@ -99,14 +99,20 @@ void run(const Options& options) {
     Stopwatch resizing;
     int64_t frames = 0;
     {
-        Progress progress(!options.quiet);
-        while (concerning(options.in, [&] { return source->next(&frame); })) {
+        Progress progress(options.shows_progress && !options.quiet, "frames");
+        const auto next = [&] { return source->next(&frame); };
+        for (int64_t number = 1; number <= options.frames.last && concerning(options.in, next);
+             ++number) {
+            if (number < options.frames.first) continue;
             concerning(options.in, [&] { resizing.time([&] { resize(how, &frame, &result); }); });
             concerning(options.out, [&] { sink.write(result); });
             progress.update(++frames, source->part_read());
         }
     }
-    if (frames == 0) throw Error(options.in + ": holds no frame");
+    if (frames == 0) {
+        throw Error(options.in +
+                    (options.frames.first > 1 ? ": holds no such frame" : ": holds no frame"));
+    }
     file.commit();
     const Report report = {options.in, options.out, format, upright,
                            placement,  engine,      frames, resizing.milliseconds()};

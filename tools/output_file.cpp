@@ -29,10 +29,15 @@ std::string real_path(const std::string& path) {
     return none ? path : real.string();
 }
 
+// Asking for the mask means to change it for a moment, in all threads: it is done once, before any
+// of them makes a file.
 mode_t default_mode() {
-    const mode_t mask = umask(0);
-    umask(mask);
-    return 0666 & ~mask;
+    static const mode_t mode = [] {
+        const mode_t mask = umask(0);
+        umask(mask);
+        return 0666 & ~mask;
+    }();
+    return mode;
 }
 
 std::string in_folder_of(const std::string& path, const std::string& name) {
@@ -135,6 +140,7 @@ void OutputFile::open() {
 }
 
 int OutputFile::open_new() {
+    const mode_t mode = default_mode();
     const int nameless = open_nameless(folder_of(path_));
     is_nameless_ = nameless >= 0;
     if (is_nameless_) return nameless;
@@ -144,14 +150,14 @@ int OutputFile::open_new() {
     const int descriptor = mkstemp(temporary_.data());
     if (descriptor < 0) throw Error(std::string("cannot be written: ") + strerror(errno));
     doom_file(temporary_);
-    static_cast<void>(fchmod(descriptor, default_mode()));
+    static_cast<void>(fchmod(descriptor, mode));
     return descriptor;
 }
 
 void OutputFile::discard() {
     if (temporary_.empty()) return;
     unlink(temporary_.c_str());
-    spare_file();
+    spare_file(temporary_);
 }
 
 OutputFile::~OutputFile() {
@@ -165,7 +171,7 @@ void OutputFile::publish() {
     if (temporary_.empty()) return;
     const SignalsBlocked blocked;
     if (rename(temporary_.c_str(), path_.c_str()) != 0) throw Error(strerror(errno));
-    spare_file();
+    spare_file(temporary_);
 }
 
 void OutputFile::commit() {

@@ -82,11 +82,23 @@ make_sample() {
     convert sample.png -crop 800x800+400+200 +repage -depth 8 RGB:sample.rgb
 }
 
+# album/: photographs in folders, and what is none. empty/ holds nothing.
+make_album() {
+    mkdir -p album/2025/may album/2026 empty
+    cp photo6.jpg album/2025/may/beach.jpg
+    cp photo1.jpg album/2025/hill.JPG
+    cp plain.png album/2026/drawing.png
+    cp plain.png album/cover.png
+    echo 'Holidays' >album/notes.txt
+    echo 'no picture' >broken.jpg
+}
+
 make_fixtures() {
     make_photographs
     make_coloured
     make_transparent
     make_sample
+    make_album
 }
 
 # tag NAME FILE: what exiftool says; nothing where there is none.
@@ -186,4 +198,9 @@ def value(key):
     for name in names: found = found[name]
     return str(found)
 print(*map(value, sys.argv[1].split()))' "$keys"
+}
+
+# sizes FILE...: of each.
+sizes() {
+    identify -format '%wx%h ' "$@" | sed 's/ $//'
 }
