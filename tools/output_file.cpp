@@ -75,22 +75,22 @@ bool link_to(const std::string& from, const char* to) {
 // microseconds between the steps.
 int replace(const std::string& from, const std::string& hidden, const std::string& to) {
     const SignalsBlocked blocked;
-    volatile int failure = 0;     // written by the other process, whose memory this is
-    const pid_t child = vfork();  // NOLINT: it does nothing but system calls
+    // Were it ignored, the other process would end without a word.
+    static_cast<void>(signal(SIGCHLD, SIG_DFL));
+    const pid_t child = fork();
     if (child < 0) return errno;
     if (child == 0) {
         setsid();
-        if (!link_to(from, hidden.c_str())) {
-            failure = errno;
-        } else if (rename(hidden.c_str(), to.c_str()) != 0) {
-            failure = errno;
-            unlink(hidden.c_str());
-        }
-        _exit(0);
+        if (!link_to(from, hidden.c_str())) _exit(errno);
+        if (rename(hidden.c_str(), to.c_str()) == 0) _exit(0);
+        const int failure = errno;
+        unlink(hidden.c_str());
+        _exit(failure);
     }
-    while (waitpid(child, nullptr, 0) < 0 && errno == EINTR) {
+    int status = 0;
+    while (waitpid(child, &status, 0) < 0 && errno == EINTR) {
     }
-    return failure;
+    return WIFEXITED(status) ? WEXITSTATUS(status) : EINTR;
 }
 
 // Gives a file without a name one, whether that is taken or not. Throws Error.
