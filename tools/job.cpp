@@ -7,6 +7,7 @@
 
 #include "error.h"
 #include "file_kind.h"
+#include "message.h"
 #include "metadata.h"
 #include "output_file.h"
 #include "progress.h"
@@ -66,12 +67,19 @@ SinkSettings settings_of(const Options& options, const Source& source, const Pla
     return settings;
 }
 
+void judge_damage(const Options& options, const std::string& damage) {
+    if (damage.empty()) return;
+    if (options.strict) throw Error(options.in + ": " + damage);
+    if (!options.quiet) say((options.in + ": warning: " + damage).c_str());
+}
+
 }  // namespace
 
 void run(const Options& options) {
     std::optional<RawLayout> raw;
     if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
     const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
+    judge_damage(options, source->metadata().damage);
     const PixelFormat format = source->kind().format;
     const FileKind out_kind = concerning(options.out, [&] {
         if (options.output_type) return *options.output_type;

@@ -235,6 +235,8 @@ void declare(CLI::App* app, Options* options) {
     app->add_flag("--strip", options->strip,
                   "Drop colour profile, EXIF and all other metadata, which OUT keeps\n"
                   "where its type can hold them");
+    app->add_flag("--strict", options->strict,
+                  "Refuse a JPEG that ends early instead of showing what there is");
     app->add_flag("-v,--verbose", options->verbose,
                   "Say on standard error what was done and how long the resizing took");
     app->add_flag("--json", options->json,

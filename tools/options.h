@@ -40,6 +40,7 @@ struct Options {
     bool premultiply = true;
     bool rotate = true;
     bool strip = false;
+    bool strict = false;
     int64_t most_pixels = kMostPixels;
     bool quiet = false;
     bool verbose = false;

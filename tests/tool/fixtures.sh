@@ -79,6 +79,13 @@ make_sample() {
     convert sample.png -alpha set -channel A -evaluate set 60% +channel PNG32:sample_alpha.png
     convert sample.png -quality 95 sample.jpg
     convert -size 64x64 xc:white white.png
+    head -c $(($(stat -c %s photo1.jpg) * 7 / 10)) photo1.jpg >cut.jpg
+    head -c $(($(stat -c %s photo1.jpg) - 2)) photo1.jpg >no_end.jpg
+    head -c 300 photo1.jpg >head.jpg
+    # A few bytes of the middle are others.
+    cp photo1.jpg scratched.jpg
+    printf '\xff\xd9\x00\x00\xff\xc0' |
+        dd of=scratched.jpg bs=1 seek=$(($(stat -c %s photo1.jpg) * 3 / 4)) conv=notrunc status=none
     convert sample.png -crop 800x800+400+200 +repage -depth 8 RGB:sample.rgb
 }
 

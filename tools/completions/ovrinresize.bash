@@ -14,7 +14,7 @@ _ovrinresize() {
             -o | --output | -j | --jobs | --frames) return ;;
         *)
             [[ $word == -* ]] && words='--size --canvas --fit --gravity --engine --format --input-size
-                --quality --background --premultiply --no-premultiply --no-rotate --strip --max-pixels
+                --quality --background --premultiply --no-premultiply --no-rotate --strip --strict --max-pixels
                 --output --output-type --recursive --jobs --frames --json --quiet --verbose --help --version'
             ;;
     esac
