@@ -18,6 +18,7 @@ Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata);
 void encode_png(const Picture& picture, const Metadata& metadata, FILE* out);
 
 bool is_jpeg(const uint8_t* data, size_t size);
+// A file that ends early gives a picture all the same; the metadata says so.
 Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata);
 // quality: 1 to 100. Alpha is dropped.
 void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out);

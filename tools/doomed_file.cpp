@@ -10,14 +10,16 @@ namespace tool {
 namespace {
 
 // Signals come on any thread.
-std::atomic<const char*> doomed = nullptr;
+std::atomic<const char*> doomed[kMostDoomedFiles];
 static_assert(std::atomic<const char*>::is_always_lock_free);
 
-// Two signals may be handled at once, on two threads: each removes the file before it lets the
+// Two signals may be handled at once, on two threads: each removes the files before it lets the
 // program end, so none can end it too early.
 void remove_and_die(int signal_number) {
-    const char* const path = doomed;
-    if (path != nullptr) unlink(path);
+    for (const std::atomic<const char*>& file : doomed) {
+        const char* const path = file;
+        if (path != nullptr) unlink(path);
+    }
     static_cast<void>(signal(signal_number, SIG_DFL));
     static_cast<void>(raise(signal_number));
 }
@@ -35,7 +37,10 @@ SignalsBlocked::~SignalsBlocked() {
 }
 
 void doom_file(const std::string& path) {
-    doomed = path.c_str();
+    for (std::atomic<const char*>& file : doomed) {
+        const char* none = nullptr;
+        if (file.compare_exchange_strong(none, path.c_str())) break;
+    }
     struct sigaction removing = {};
     removing.sa_handler = remove_and_die;
     for (const int number : {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGPIPE}) {
@@ -46,8 +51,11 @@ void doom_file(const std::string& path) {
     }
 }
 
-void spare_file() {
-    doomed = nullptr;
+void spare_file(const std::string& path) {
+    for (std::atomic<const char*>& file : doomed) {
+        const char* own = path.c_str();
+        if (file.compare_exchange_strong(own, nullptr)) return;
+    }
 }
 
 }  // namespace tool

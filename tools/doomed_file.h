@@ -18,9 +18,11 @@ private:
     sigset_t previous_;
 };
 
-// From now on a signal that ends the program removes that file first. One file at a time; the
-// string must live until spare_file().
+constexpr int kMostDoomedFiles = 256;
+
+// From now on a signal that ends the program removes that file first. The string must live until
+// spare_file(), and stay where it is. At most kMostDoomedFiles at a time, on any threads.
 void doom_file(const std::string& path);
-void spare_file();
+void spare_file(const std::string& path);
 
 }  // namespace tool

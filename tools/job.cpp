@@ -7,6 +7,7 @@
 
 #include "error.h"
 #include "file_kind.h"
+#include "message.h"
 #include "metadata.h"
 #include "output_file.h"
 #include "progress.h"
@@ -66,15 +67,22 @@ SinkSettings settings_of(const Options& options, const Source& source, const Pla
     return settings;
 }
 
+void judge_damage(const Options& options, const std::string& damage) {
+    if (damage.empty()) return;
+    if (options.strict) throw Error(options.in + ": " + damage);
+    if (!options.quiet) say((options.in + ": warning: " + damage).c_str());
+}
+
 }  // namespace
 
 void run(const Options& options) {
-    set_most_pixels(options.most_pixels);
     std::optional<RawLayout> raw;
     if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
     const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
+    judge_damage(options, source->metadata().damage);
     const PixelFormat format = source->kind().format;
     const FileKind out_kind = concerning(options.out, [&] {
+        if (options.output_type) return *options.output_type;
         return options.out == "-" ? source->kind() : kind_of_name(options.out);
     });
     check_conversion(source->kind(), out_kind);
@@ -99,14 +107,20 @@ void run(const Options& options) {
     Stopwatch resizing;
     int64_t frames = 0;
     {
-        Progress progress(!options.quiet);
-        while (concerning(options.in, [&] { return source->next(&frame); })) {
+        Progress progress(options.shows_progress && !options.quiet, "frames");
+        const auto next = [&] { return source->next(&frame); };
+        for (int64_t number = 1; number <= options.frames.last && concerning(options.in, next);
+             ++number) {
+            if (number < options.frames.first) continue;
             concerning(options.in, [&] { resizing.time([&] { resize(how, &frame, &result); }); });
             concerning(options.out, [&] { sink.write(result); });
             progress.update(++frames, source->part_read());
         }
     }
-    if (frames == 0) throw Error(options.in + ": holds no frame");
+    if (frames == 0) {
+        throw Error(options.in +
+                    (options.frames.first > 1 ? ": holds no such frame" : ": holds no frame"));
+    }
     file.commit();
     const Report report = {options.in, options.out, format, upright,
                            placement,  engine,      frames, resizing.milliseconds()};

@@ -31,7 +31,7 @@ constexpr double kInchesPerMeter = 1 / 0.0254;
 struct ErrorState {
     jpeg_error_mgr manager;  // first: the library hands back a pointer to it
     jmp_buf jump;
-    bool data_lost;  // some pixels were made up
+    int lost;  // the message of what made the first pixels up; 0: none were
     char message[JMSG_LENGTH_MAX];
 };
 
@@ -45,7 +45,7 @@ ErrorState* state_of(j_common_ptr codec) {
     longjmp(state->jump, 1);  // NOLINT(cert-err52-cpp): the only way out of libjpeg
 }
 
-// Warnings (level -1) that stand for lost pixels count as failures. Others, such as stray bytes
+// Warnings (level -1) that stand for lost pixels are kept. Others, such as stray bytes
 // between segments, occur in files of real cameras and harm nothing.
 void on_message(j_common_ptr codec, int level) {
     if (level >= 0) return;
@@ -55,9 +55,9 @@ void on_message(j_common_ptr codec, int level) {
         case JWRN_HUFF_BAD_CODE:
         case JWRN_MUST_RESYNC:
             // Only the first: later ones are its consequences.
-            if (!state_of(codec)->data_lost)
-                codec->err->format_message(codec, state_of(codec)->message);
-            state_of(codec)->data_lost = true;
+            if (state_of(codec)->lost != 0) break;
+            codec->err->format_message(codec, state_of(codec)->message);
+            state_of(codec)->lost = codec->err->msg_code;
             break;
         default:
             break;
@@ -71,7 +71,7 @@ jpeg_error_mgr* init_errors(ErrorState* state) {
     state->manager.error_exit = on_error;
     state->manager.emit_message = on_message;
     state->manager.output_message = ignore_output;
-    state->data_lost = false;
+    state->lost = 0;
     state->message[0] = '\0';
     return &state->manager;
 }
@@ -237,9 +237,11 @@ Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata) {
     Picture picture(checked_size(decoder.codec.image_width, decoder.codec.image_height));
     picture.is_gray = colors == JCS_GRAYSCALE;
     *metadata = read_metadata(decoder);
-    if (!read_rows(&decoder, picture.bytes()) || decoder.errors.data_lost) {
+    const bool is_read = read_rows(&decoder, picture.bytes());
+    const int lost = decoder.errors.lost;
+    if (!is_read || (lost != 0 && lost != JWRN_JPEG_EOF))
         throw error("damaged JPEG", decoder.errors);
-    }
+    if (lost == JWRN_JPEG_EOF) metadata->damage = "the JPEG ends early, and the rest is made up";
     return picture;
 }
 

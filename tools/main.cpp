@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: Apache-2.0
 // The ovrinresize command: reads pictures, resizes them with the library, writes them.
-#include <cstdio>
 #include <exception>
 #include <iostream>
 #include <new>
 
+#include "batch.h"
 #include "job.h"
+#include "message.h"
 #include "options.h"
 
 namespace {
@@ -14,15 +15,8 @@ using namespace tool;
 
 enum ExitCode { kDone = 0, kFailed = 1, kWrongUsage = 2 };
 
-// One line whatever the message holds: it may quote names and arguments.
 ExitCode fail(ExitCode code, const char* message) {
-    static_cast<void>(fputs("ovrinresize: ", stderr));
-    for (; *message != '\0'; ++message) {
-        const auto letter = static_cast<unsigned char>(*message);
-        const bool is_control = letter < ' ' || letter == 127;
-        static_cast<void>(fputc(is_control ? ' ' : letter, stderr));
-    }
-    static_cast<void>(fputc('\n', stderr));
+    say(message);
     return code;
 }
 
@@ -42,6 +36,11 @@ int command(int argc, char** argv) {
         return checked_output();
     } catch (const CLI::Error& error) {
         return fail(kWrongUsage, error.what());
+    }
+    set_most_pixels(options.most_pixels);
+    if (options.output) {
+        const bool all_done = run_batch(options) == 0;
+        return all_done ? checked_output() : kFailed;
     }
     run(options);
     return checked_output();

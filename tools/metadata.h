@@ -5,6 +5,7 @@
 #include <array>
 #include <cstdint>
 #include <optional>
+#include <string>
 #include <vector>
 
 #include "orientation.h"
@@ -34,6 +35,7 @@ struct Metadata {
     std::optional<int> srgb_intent;  // the file claims sRGB
     std::optional<Density> density;
     PngColors png_colors;
+    std::string damage;  // what the file lacks, though there is a picture; empty: nothing
 };
 
 // Of a picture that was resized to `size`, as it is stored, and turned upright if is_turned.

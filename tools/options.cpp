@@ -1,12 +1,17 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "options.h"
 
+#include <algorithm>
+#include <charconv>
 #include <initializer_list>
 #include <memory>
+#include <thread>
 #include <utility>
 #include <vector>
 
+#include "doomed_file.h"
 #include "error.h"
+#include "template.h"
 #include "version.h"
 
 namespace tool {
@@ -22,7 +27,8 @@ public:
     }
 
     std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
-        return "Usage: ovrinresize IN OUT --size SIZE [OPTION]...\n";
+        return "Usage: ovrinresize IN OUT --size SIZE [OPTION]...\n"
+               "       ovrinresize IN... --output TEMPLATE --size SIZE [OPTION]...\n";
     }
 
     std::string make_option_name(const CLI::Option* option, bool is_positional) const override {
@@ -89,18 +95,74 @@ void add_switch_off(CLI::App* app, const std::string& name, bool* value, const s
         name, [value] { *value = false; }, help);
 }
 
+FileKind read_type(const std::string& text) {
+    try {
+        return kind_of_name("x." + text);
+    } catch (const Error&) {
+        throw Error("'" + text + "' is none of: png jpg ppm y4m nv21 i420 rgba rgb");
+    }
+}
+
+// "A:B", "A:", ":B" or "A".
+FrameRange read_frames(const std::string& text) {
+    FrameRange range;
+    const size_t colon = text.find(':');
+    const auto read = [&](const std::string& digits, int64_t* number) {
+        if (digits.empty()) return true;
+        const char* const end = digits.data() + digits.size();
+        const auto [stop, status] = std::from_chars(digits.data(), end, *number);
+        return status == std::errc() && stop == end && *number >= 1;
+    };
+    bool is_right = text.size() > (colon == std::string::npos ? 0U : 1U);
+    is_right = is_right && read(text.substr(0, colon), &range.first);
+    if (colon == std::string::npos) {
+        range.last = range.first;
+    } else {
+        is_right = is_right && read(text.substr(colon + 1), &range.last);
+    }
+    if (!is_right || range.first > range.last) {
+        throw Error("'" + text + "' are no frames; write them like 10:20, 10: or :20");
+    }
+    return range;
+}
+
+void add_frames(CLI::App* app, Options* options) {
+    const auto parse = [options](const std::string& text) {
+        try {
+            options->frames = read_frames(text);
+        } catch (const Error& error) {
+            reject("--frames", error.what());
+        }
+    };
+    app->add_option_function<std::string>("--frames", parse,
+                                          "Only these frames of IN, the first being 1")
+        ->type_name("A:B");
+}
+
 void declare_files(CLI::App* app, Options* options) {
-    app->add_option(
-           "IN", options->in,
-           "PNG, JPEG, binary PPM, Y4M or, with --format, raw frames;\n- is standard input")
-        ->required()
+    app->add_option("IN OUT", options->files,
+                    "IN is PNG, JPEG, binary PPM, Y4M or, with --format, raw frames;\n"
+                    "- is standard input. OUT ends in .png, .jpg, .jpeg, .ppm, .y4m, or\n"
+                    "for raw frames in .nv21, .i420, .yuv, .rgba, .rgb; - is standard\n"
+                    "output, with the type of IN. With --output all are IN")
         ->type_name("");
-    app->add_option("OUT", options->out,
-                    "Its name ends in .png, .jpg, .jpeg, .ppm, .y4m, or for raw frames\n"
-                    "in .nv21, .i420, .yuv, .rgba, .rgb; - is standard output, with\n"
-                    "the type of IN")
-        ->required()
-        ->type_name("");
+    app->add_option_function<std::string>(
+           "-o,--output", [options](const std::string& text) { options->output = text; },
+           "Name of the results of many files, where %s is that of the source\n"
+           "without folder and ending, like thumbs/%s.jpg")
+        ->type_name("TEMPLATE");
+    add_value(app, "-t,--output-type", "TYPE", &options->output_type, read_type,
+              "Type of OUT whatever its name: png, jpg, ppm, y4m, nv21, i420, rgba\n"
+              "or rgb");
+    app->add_flag("-r,--recursive", options->recursive, "Take pictures in folders, too")
+        ->needs("--output");
+    app->add_option("-j,--jobs", options->jobs,
+                    "How many pictures at a time; as many as there are processors by\n"
+                    "default")
+        ->type_name("N")
+        ->check(CLI::Range(1, kMostDoomedFiles).description(""))
+        ->needs("--output");
+    add_frames(app, options);
     add_choice<std::optional<PixelFormat>, PixelFormat>(
         app, "--format", "FORMAT", &options->raw_format,
         {{"nv21", PixelFormat::kNv21},
@@ -173,6 +235,8 @@ void declare(CLI::App* app, Options* options) {
     app->add_flag("--strip", options->strip,
                   "Drop colour profile, EXIF and all other metadata, which OUT keeps\n"
                   "where its type can hold them");
+    app->add_flag("--strict", options->strict,
+                  "Refuse a JPEG that ends early instead of showing what there is");
     app->add_flag("-v,--verbose", options->verbose,
                   "Say on standard error what was done and how long the resizing took");
     app->add_flag("--json", options->json,
@@ -194,19 +258,51 @@ void declare(CLI::App* app, Options* options) {
         "Examples:\n"
         "  ovrinresize photo.jpg small.jpg --size 1024x768\n"
         "  ovrinresize photo.jpg screen.png --canvas 1920x1080\n"
+        "  ovrinresize *.jpg --size 200 --output thumbs/%s_small.jpg\n"
         "  ovrinresize camera.nv21 small.nv21 --format nv21 --input-size 4000x3000 -s 1000x750\n"
         "  ffmpeg -i film.mp4 -f yuv4mpegpipe - | ovrinresize - - -s 640x360 | ffplay -");
+}
+
+void check_template(const Options& options) {
+    try {
+        const bool tells_apart =
+            filled_template(*options.output, "a") != filled_template(*options.output, "b");
+        const bool are_many = options.files.size() > 1 || options.recursive;
+        if (!options.output_type) kind_of_name(filled_template(*options.output, "a"));
+        if (are_many && !tells_apart) throw Error("many results need a %s in their name");
+    } catch (const Error& error) {
+        reject("--output", error.what());
+    }
+}
+
+// One job's files, unless there is a template for many.
+void take_files(Options* options) {
+    const size_t count = options->files.size();
+    if (count == 0) throw CLI::RequiredError("IN");
+    if (options->output) {
+        check_template(*options);
+        return;
+    }
+    if (count == 1) throw CLI::RequiredError("OUT");
+    if (count > 2) {
+        throw CLI::ValidationError("more than IN and OUT: " + options->files[2],
+                                   "--output names the results of many");
+    }
+    options->in = options->files[0];
+    options->out = options->files[1];
 }
 
 }  // namespace
 
 void parse(int argc, char** argv, CLI::App* app, Options* options) {
     declare(app, options);
+    options->jobs = std::clamp<int64_t>(std::thread::hardware_concurrency(), 1, kMostDoomedFiles);
     app->parse(argc, argv);
+    take_files(options);
     if (!options->wish.size && !options->wish.canvas) {
         throw CLI::RequiredError("--size or --canvas");
     }
-    if (options->json && options->out == "-") {
+    if (options->json && (options->out == "-" || options->output == "-")) {
         throw CLI::ValidationError("--json", "standard output is taken by OUT");
     }
 }

@@ -5,17 +5,32 @@
 #include <CLI/CLI.hpp>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "color.h"
 #include "engine.h"
+#include "file_kind.h"
 #include "picture.h"
 #include "placement.h"
 
 namespace tool {
 
+// Counted from 1, the last included.
+struct FrameRange {
+    int64_t first = 1;
+    int64_t last = INT64_MAX;
+};
+
 struct Options {
-    std::string in;
+    std::vector<std::string> files;     // as given: inputs, and OUT where there is no template
+    std::optional<std::string> output;  // the template for names of many results
+    std::string in;                     // of one job
     std::string out;
+    std::optional<FileKind> output_type;
+    FrameRange frames;
+    bool recursive = false;
+    int64_t jobs = 1;
+    bool shows_progress = true;
     Wish wish;
     std::optional<Engine> engine;  // without one, what suits the job
     int quality = 90;
@@ -25,6 +40,7 @@ struct Options {
     bool premultiply = true;
     bool rotate = true;
     bool strip = false;
+    bool strict = false;
     int64_t most_pixels = kMostPixels;
     bool quiet = false;
     bool verbose = false;

@@ -29,10 +29,15 @@ std::string real_path(const std::string& path) {
     return none ? path : real.string();
 }
 
+// Asking for the mask means to change it for a moment, in all threads: it is done once, before any
+// of them makes a file.
 mode_t default_mode() {
-    const mode_t mask = umask(0);
-    umask(mask);
-    return 0666 & ~mask;
+    static const mode_t mode = [] {
+        const mode_t mask = umask(0);
+        umask(mask);
+        return 0666 & ~mask;
+    }();
+    return mode;
 }
 
 std::string in_folder_of(const std::string& path, const std::string& name) {
@@ -70,22 +75,22 @@ bool link_to(const std::string& from, const char* to) {
 // microseconds between the steps.
 int replace(const std::string& from, const std::string& hidden, const std::string& to) {
     const SignalsBlocked blocked;
-    volatile int failure = 0;     // written by the other process, whose memory this is
-    const pid_t child = vfork();  // NOLINT: it does nothing but system calls
+    // Were it ignored, the other process would end without a word.
+    static_cast<void>(signal(SIGCHLD, SIG_DFL));
+    const pid_t child = fork();
     if (child < 0) return errno;
     if (child == 0) {
         setsid();
-        if (!link_to(from, hidden.c_str())) {
-            failure = errno;
-        } else if (rename(hidden.c_str(), to.c_str()) != 0) {
-            failure = errno;
-            unlink(hidden.c_str());
-        }
-        _exit(0);
+        if (!link_to(from, hidden.c_str())) _exit(errno);
+        if (rename(hidden.c_str(), to.c_str()) == 0) _exit(0);
+        const int failure = errno;
+        unlink(hidden.c_str());
+        _exit(failure);
     }
-    while (waitpid(child, nullptr, 0) < 0 && errno == EINTR) {
+    int status = 0;
+    while (waitpid(child, &status, 0) < 0 && errno == EINTR) {
     }
-    return failure;
+    return WIFEXITED(status) ? WEXITSTATUS(status) : EINTR;
 }
 
 // Gives a file without a name one, whether that is taken or not. Throws Error.
@@ -135,6 +140,7 @@ void OutputFile::open() {
 }
 
 int OutputFile::open_new() {
+    const mode_t mode = default_mode();
     const int nameless = open_nameless(folder_of(path_));
     is_nameless_ = nameless >= 0;
     if (is_nameless_) return nameless;
@@ -144,14 +150,14 @@ int OutputFile::open_new() {
     const int descriptor = mkstemp(temporary_.data());
     if (descriptor < 0) throw Error(std::string("cannot be written: ") + strerror(errno));
     doom_file(temporary_);
-    static_cast<void>(fchmod(descriptor, default_mode()));
+    static_cast<void>(fchmod(descriptor, mode));
     return descriptor;
 }
 
 void OutputFile::discard() {
     if (temporary_.empty()) return;
     unlink(temporary_.c_str());
-    spare_file();
+    spare_file(temporary_);
 }
 
 OutputFile::~OutputFile() {
@@ -165,7 +171,7 @@ void OutputFile::publish() {
     if (temporary_.empty()) return;
     const SignalsBlocked blocked;
     if (rename(temporary_.c_str(), path_.c_str()) != 0) throw Error(strerror(errno));
-    spare_file();
+    spare_file(temporary_);
 }
 
 void OutputFile::commit() {

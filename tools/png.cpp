@@ -102,7 +102,7 @@ bool read_header(Decoder* decoder) {
 
 bool read_rows(Decoder* decoder, uint8_t* rgba) {
     if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
-    png_structp const png = decoder->png;
+    png_structp png = decoder->png;
     png_fixed_point gamma = 0;
     if (is_converted(*decoder) && png_get_gAMA_fixed(png, decoder->info, &gamma) != 0) {
         png_set_gamma_fixed(png, PNG_DEFAULT_sRGB, gamma);
@@ -183,7 +183,7 @@ Metadata read_metadata(const Decoder& decoder) {
 // ---- Writing ----
 
 void write_colors(const Encoder& encoder, const Picture& picture, const Metadata& metadata) {
-    png_structp const png = encoder.png;
+    png_structp png = encoder.png;
     if (has_fitting_profile(picture, metadata)) {
         png_set_iCCP(png, encoder.info, "ICC profile", PNG_COMPRESSION_TYPE_BASE,
                      metadata.icc.data(), static_cast<png_uint_32>(metadata.icc.size()));
@@ -232,7 +232,7 @@ void pack_row(const uint8_t* rgba, size_t width, int colors, uint8_t* packed) {
 bool write_picture(Encoder* encoder, const Picture& picture, const Metadata& metadata, uint8_t* row,
                    FILE* out) {
     if (setjmp(encoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
-    png_structp const png = encoder->png;
+    png_structp png = encoder->png;
     png_init_io(png, out);
     // A profile that libpng finds fault with is left out.
     png_set_benign_errors(png, 1);

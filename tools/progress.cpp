@@ -28,24 +28,30 @@ std::string bar(double part) {
 
 }  // namespace
 
-Progress::Progress(bool is_wanted)
+Progress::Progress(bool is_wanted, const char* things)
     : is_wanted_(is_wanted && isatty(STDERR_FILENO) == 1),
+      things_(things),
       start_(Clock::now()),
       next_update_(start_ + kPatience) {}
 
 Progress::~Progress() {
-    if (is_visible_) std::cerr << '\r' << kEraseToEnd << std::flush;
+    hide();
 }
 
-void Progress::update(int64_t frames, double part) {
+void Progress::hide() {
+    if (is_visible_) std::cerr << '\r' << kEraseToEnd << std::flush;
+    is_visible_ = false;
+}
+
+void Progress::update(int64_t count, double part) {
     const Clock::time_point now = Clock::now();
     if (!is_wanted_ || now < next_update_) return;
     next_update_ = now + kInterval;
     is_visible_ = true;
     const double seconds = std::chrono::duration<double>(now - start_).count();
-    std::cerr << '\r' << bar(part) << frames << " frames, " << std::fixed << std::setprecision(1)
-              << static_cast<double>(frames) / seconds << " per second" << kEraseToEnd
-              << std::flush;
+    std::cerr << '\r' << bar(part) << count << " " << things_ << ", " << std::fixed
+              << std::setprecision(1) << static_cast<double>(count) / seconds << " per second"
+              << kEraseToEnd << std::flush;
 }
 
 }  // namespace tool

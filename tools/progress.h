@@ -10,19 +10,23 @@ namespace tool {
 // only when standard error is a terminal, and is wiped at the end.
 class Progress {
 public:
-    // is_wanted: otherwise nothing appears.
-    explicit Progress(bool is_wanted);
+    // is_wanted: otherwise nothing appears. things: what is counted.
+    Progress(bool is_wanted, const char* things);
     ~Progress();
     Progress(const Progress&) = delete;
     Progress& operator=(const Progress&) = delete;
 
     // part: of the work that is done, 0 to 1; negative when not known.
-    void update(int64_t frames, double part);
+    void update(int64_t count, double part);
+
+    // Until the next update, to make room for a message.
+    void hide();
 
 private:
     using Clock = std::chrono::steady_clock;
 
     bool is_wanted_;
+    const char* things_;
     bool is_visible_ = false;
     Clock::time_point start_;
     Clock::time_point next_update_;

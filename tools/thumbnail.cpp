@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "thumbnail.h"
 
+#include <algorithm>
+#include <cstring>
 #include <utility>
 
 #include "engine.h"
@@ -36,6 +38,35 @@ Picture halved(Picture source, Size size) {
     return result;
 }
 
+// Strip by strip, each into the room of those before it, so that a large picture needs no second
+// one beside it, and strips stay in the cache. RGBA and RGB.
+void halve_in_strips(Picture* picture, Size half) {
+    constexpr int32_t kStripRows = 16;  // of the result
+    const Size size = picture->size;
+    const size_t row_bytes = picture_bytes(picture->format, {size.width, 1});
+    const size_t half_row_bytes = picture_bytes(picture->format, {half.width, 1});
+    uint8_t* const bytes = picture->bytes();
+    int32_t rows = 0;
+    for (int32_t done = 0; done < half.height; done += rows) {
+        rows = std::min(kStripRows, half.height - done);
+        // The last takes the row that an odd height leaves.
+        const bool is_last = done + rows == half.height;
+        Picture strip({size.width, is_last ? size.height - 2 * done : 2 * rows}, picture->format);
+        memcpy(strip.bytes(), bytes + static_cast<size_t>(2 * done) * row_bytes,
+               strip.byte_count());
+        const Picture half_strip = halved(std::move(strip), {half.width, rows});
+        memcpy(bytes + static_cast<size_t>(done) * half_row_bytes, half_strip.bytes(),
+               half_strip.byte_count());
+    }
+    picture->size = half;
+    picture->words.resize((picture->byte_count() + 3) / 4);
+}
+
+void halve(Picture* picture, Size half) {
+    if (!has_chroma_planes(picture->format)) return halve_in_strips(picture, half);
+    *picture = halved(std::move(*picture), half);
+}
+
 }  // namespace
 
 void resize_thumbnail(Picture* source, Picture* result) {
@@ -44,7 +75,7 @@ void resize_thumbnail(Picture* source, Picture* result) {
     for (;;) {
         half = {half_side(half.width, source->format), half_side(half.height, source->format)};
         if (!is_at_least(half, 2, target)) break;
-        *source = halved(std::move(*source), half);
+        halve(source, half);
     }
     if (!is_at_least(source->size, 2, target)) return resize(Engine::kLanczos, source, result);
 
@@ -54,7 +85,8 @@ void resize_thumbnail(Picture* source, Picture* result) {
         resize(Engine::kLanczos, source, &rest);
         *source = std::move(rest);
     }
-    *result = halved(std::move(*source), target);
+    halve(source, target);
+    *result = *source;
 }
 
 }  // namespace tool

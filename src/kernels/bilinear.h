@@ -24,13 +24,16 @@ struct BilinearColumns {
 
 // How kernels find the samples of a strip: made once, used for every row of it. The columns that it
 // was made for must stay as they are. Vector kernels gather four bytes, a quad, at a time, or
-// groups of bytes to be copied.
+// groups of more.
 constexpr int32_t kBilinearQuads = kBilinearColumns;
 struct BilinearPlan {
     const BilinearColumns* columns;
     int32_t windows[kBilinearQuads];  // where in a row the bytes of a quad or a group lie
     alignas(64) uint8_t shuffles[kBilinearQuads][16];
-    alignas(64) int32_t weights[kBilinearQuads][4];
+    union {
+        alignas(64) int32_t weight_pairs[kBilinearQuads][4];
+        int16_t right_weights[kBilinearColumns * 4];
+    };
 
     int32_t bytes() const { return columns->count * columns->sample_bytes; }
 };

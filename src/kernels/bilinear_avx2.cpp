@@ -32,7 +32,7 @@ __m256i load_windows(const uint8_t* row, const BilinearPlan& plan, ptrdiff_t qua
 template <int kWindowQuads>
 void blend_quads(uint32_t* sums, const uint8_t* row, const BilinearPlan& plan, ptrdiff_t quad) {
     const auto* shuffle = reinterpret_cast<const __m256i*>(plan.shuffles[quad]);
-    const auto* weights = reinterpret_cast<const __m256i*>(plan.weights[quad]);
+    const auto* weights = reinterpret_cast<const __m256i*>(plan.weight_pairs[quad]);
     const __m256i samples = _mm256_shuffle_epi8(load_windows<kWindowQuads>(row, plan, quad),
                                                 _mm256_load_si256(shuffle));
     _mm256_store_si256(reinterpret_cast<__m256i*>(sums + quad * kQuadBytes),

@@ -31,7 +31,7 @@ void across(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
         const int32_t quad = i / kQuadBytes;
         const __m512i window = load_window<kWindowBytes>(row + plan.windows[quad]);
         const __m512i shuffle = _mm512_load_si512(plan.shuffles[quad]);
-        const __m512i weights = _mm512_load_si512(plan.weights[quad]);
+        const __m512i weights = _mm512_load_si512(plan.weight_pairs[quad]);
         const __m512i samples = _mm512_maskz_permutexvar_epi8(low_bytes, shuffle, window);
         _mm512_store_si512(sums.values + i, _mm512_madd_epi16(samples, weights));
     }

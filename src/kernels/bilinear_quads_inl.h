@@ -27,6 +27,34 @@ int32_t rounded_up(int32_t bytes, int32_t step) {
     return (bytes + step - 1) / step * step;
 }
 
+// Where the windows of a strip begin. They stay between the first and the last byte that the
+// columns name, whose right samples lie `to_right` samples after their left ones.
+template <int N>
+class WindowBases {
+public:
+    WindowBases(const BilinearColumns& columns, int32_t to_right, int32_t window_bytes)
+        : columns_(columns) {
+        if (columns.count < 1) return;
+        const int64_t end = N * (int64_t{columns.index[columns.count - 1]} + to_right + 1);
+        last_ = end - window_bytes;
+    }
+
+    bool fit() const {
+        return last_ <= INT32_MAX && columns_.count > 0 && last_ >= int64_t{N} * columns_.index[0];
+    }
+
+    // For a window whose first sample is that of `column`; columns past the last one take the last.
+    int64_t base(int32_t column) const {
+        if (column >= columns_.count) return last_;
+        const int64_t first = int64_t{N} * columns_.index[column];
+        return first < last_ ? first : last_;
+    }
+
+private:
+    const BilinearColumns& columns_;
+    int64_t last_ = 0;
+};
+
 // How a strip is to be cut: the size of a window, how many quads share it, and how many quads the
 // kernel takes in one step.
 struct QuadShape {
@@ -50,7 +78,7 @@ bool plan_quad(BilinearPlan& plan, int32_t quad, int64_t base, int32_t window_by
         shuffle[1] = kZeroByte;
         shuffle[2] = static_cast<uint8_t>(left + to_right);
         shuffle[3] = kZeroByte;
-        plan.weights[quad][i] = weight_pair(columns.weight[byte / N]);
+        plan.weight_pairs[quad][i] = weight_pair(columns.weight[byte / N]);
     }
     plan.windows[quad] = static_cast<int32_t>(base);
     return true;
@@ -59,66 +87,35 @@ bool plan_quad(BilinearPlan& plan, int32_t quad, int64_t base, int32_t window_by
 template <int N>
 bool plan_quads_of(BilinearPlan& plan, const BilinearColumns& columns, const QuadShape& shape) {
     plan.columns = &columns;
-    if (columns.count < 1) return false;
-    const int64_t begin = int64_t{N} * columns.index[0];
-    const int64_t end = N * (int64_t{columns.index[columns.count - 1]} + columns.to_right + 1);
-    const int64_t last_base = end - shape.window_bytes;
-    if (last_base < begin || last_base > INT32_MAX) return false;
+    const WindowBases<N> windows(columns, columns.to_right, shape.window_bytes);
+    if (!windows.fit()) return false;
     const int32_t quads = rounded_up(columns.count * N, shape.step_quads * kQuadBytes) / kQuadBytes;
     for (int32_t quad = 0; quad < quads; ++quad) {
         const int32_t first_quad = quad - quad % shape.window_quads;
-        const int32_t column = first_quad * kQuadBytes / N;
-        const int64_t first =
-            column < columns.count ? int64_t{N} * columns.index[column] : last_base;
-        const int64_t base = first < last_base ? first : last_base;
+        const int64_t base = windows.base(first_quad * kQuadBytes / N);
         if (!plan_quad<N>(plan, quad, base, shape.window_bytes)) return false;
     }
     return true;
 }
 
-// Plans whole steps; quads past the last byte repeat it. Windows stay between the first and the
-// last byte that the columns name. False: windows do not fit there, or quads do not fit into them,
-// and there is no plan.
+// Plans whole steps; quads past the last byte repeat it. False: windows do not fit into the row, or
+// quads do not fit into them, and there is no plan.
 bool plan_quads(BilinearPlan& plan, const BilinearColumns& columns, const QuadShape& shape) {
     if (columns.sample_bytes == 1) return plan_quads_of<1>(plan, columns, shape);
     if (columns.sample_bytes == 2) return plan_quads_of<2>(plan, columns, shape);
     return plan_quads_of<4>(plan, columns, shape);
 }
 
-// Fetches rows line by line while something else goes on in so many steps: asked for all at once,
-// lines would wait for each other, and the processor for them.
-class SteadyFetch {
-public:
-    SteadyFetch(const BilinearNext& next, int32_t steps)
-        : next_(next), step_bytes_(next.bytes / (steps > 0 ? steps : 1)) {}
-
-    OVRIN_ALWAYS_INLINE void step() {
-        wanted_ += step_bytes_;
-        for (; fetched_ < wanted_; fetched_ += kCacheLine) {
-            for (const uint8_t* row : next_.rows) __builtin_prefetch(row + fetched_);
-        }
-    }
-
-private:
-    const BilinearNext next_;
-    const int64_t step_bytes_;
-    int64_t wanted_ = 0;
-    int64_t fetched_ = 0;
-};
-
 template <int N>
 bool plan_groups_of(BilinearPlan& plan, const BilinearColumns& columns, int32_t group_bytes,
                     int32_t window_bytes) {
     plan.columns = &columns;
-    if (columns.count < 1) return false;
-    const int64_t begin = int64_t{N} * columns.index[0];
-    const int64_t last_base = N * (int64_t{columns.index[columns.count - 1]} + 1) - window_bytes;
-    if (last_base < begin || last_base > INT32_MAX) return false;
+    const WindowBases<N> windows(columns, 0, window_bytes);
+    if (!windows.fit()) return false;
     const int32_t bytes = columns.count * N;
     uint8_t* shuffle = plan.shuffles[0];
     for (int32_t i = 0; i < bytes; i += group_bytes) {
-        const int64_t first = int64_t{N} * columns.index[i / N];
-        const int64_t base = first < last_base ? first : last_base;
+        const int64_t base = windows.base(i / N);
         plan.windows[i / group_bytes] = static_cast<int32_t>(base);
         for (int32_t k = i; k < i + group_bytes; ++k) {
             const int32_t byte = k < bytes ? k : bytes - 1;
@@ -131,9 +128,8 @@ bool plan_groups_of(BilinearPlan& plan, const BilinearColumns& columns, int32_t 
 }
 
 // Plans copies of groups of bytes by a byte shuffle of a window each, the shuffles one after the
-// other; bytes past the last one repeat it. Windows stay between the first and the last byte that
-// the columns name. False: windows do not fit there, or groups do not fit into them, and there is
-// no plan.
+// other; bytes past the last one repeat it. False: windows do not fit into the row, or groups do
+// not fit into them, and there is no plan.
 bool plan_groups(BilinearPlan& plan, const BilinearColumns& columns, int32_t group_bytes,
                  int32_t window_bytes) {
     if (columns.sample_bytes == 1) {
@@ -163,6 +159,27 @@ void copy_groups(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan,
         memcpy(dst + i, last, static_cast<size_t>(bytes - i));
     }
 }
+
+// Fetches rows line by line while something else goes on in so many steps: asked for all at once,
+// lines would wait for each other, and the processor for them.
+class SteadyFetch {
+public:
+    SteadyFetch(const BilinearNext& next, int32_t steps)
+        : next_(next), step_bytes_(next.bytes / (steps > 0 ? steps : 1)) {}
+
+    OVRIN_ALWAYS_INLINE void step() {
+        wanted_ += step_bytes_;
+        for (; fetched_ < wanted_; fetched_ += kCacheLine) {
+            for (const uint8_t* row : next_.rows) __builtin_prefetch(row + fetched_);
+        }
+    }
+
+private:
+    const BilinearNext next_;
+    const int64_t step_bytes_;
+    int64_t wanted_ = 0;
+    int64_t fetched_ = 0;
+};
 
 }  // namespace
 

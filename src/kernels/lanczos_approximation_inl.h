@@ -196,7 +196,7 @@ void run_narrow_chains(const LanczosColumns& columns, const LanczosRow& row, int
 // less components, four neighbouring bytes take their place.
 template <class Rows>
 int32_t add_rows(const LanczosColumns& columns, const LanczosRow& row, const Rows& rows,
-                 int32_t* uncertain) {
+                 uint8_t* uncertain) {
     const int32_t bytes = columns.count * columns.dst_components;
     int32_t found = 0;
     for (int32_t x = 0; x * kPixel < bytes; x += kBlock) {
@@ -212,7 +212,7 @@ int32_t add_rows(const LanczosColumns& columns, const LanczosRow& row, const Row
         }
         if (near == 0) continue;
         for (int32_t i = x; i < x + kBlock; ++i, near >>= kPixel) {
-            uncertain[found] = i;
+            uncertain[found] = static_cast<uint8_t>(i);
             found += (near & 0xF) != 0 ? 1 : 0;
         }
     }
@@ -243,7 +243,8 @@ void filter_row(const LanczosRow& row, const LanczosStripPlan& plan, LanczosSums
     const LanczosColumns& columns = *plan.columns;
     const typename Set::WeightedRows weighted(rows, row.weights,
                                               uncertain_distance(row_weights, plan.max_weights));
-    int32_t uncertain[kLanczosColumns];
+    uint8_t uncertain[kLanczosColumns];
+    static_assert(kLanczosColumns <= 256, "a byte numbers a pixel of a strip");
     const int32_t count = add_rows(columns, row, weighted, uncertain);
     if (count == 0) return;
     if (columns.dst_components == kPixel) {

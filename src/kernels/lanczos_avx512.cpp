@@ -71,7 +71,7 @@ struct Avx512 {
     }
 
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const int32_t* pixels, int32_t count) {
+                           const uint8_t* pixels, int32_t count) {
         run_chains_x86(columns, row, pixels, count);
     }
 };

@@ -189,7 +189,7 @@ struct Neon {
 
     // The last pixel may be computed twice.
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const int32_t* pixels, int32_t count) {
+                           const uint8_t* pixels, int32_t count) {
         for (int32_t i = 0; i < count; i += 2) {
             run_two_chains(columns, row, pixels[i], pixels[i + 1 < count ? i + 1 : i]);
         }

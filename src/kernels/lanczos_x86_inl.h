@@ -109,7 +109,7 @@ void run_some_chains(const LanczosColumns& columns, const LanczosRow& row,
 }
 
 // The last pixel may be computed several times.
-void run_chains_x86(const LanczosColumns& columns, const LanczosRow& row, const int32_t* pixels,
+void run_chains_x86(const LanczosColumns& columns, const LanczosRow& row, const uint8_t* pixels,
                     int32_t count) {
     for (int32_t i = 0; i < count; i += kChains) {
         int32_t some[kChains];

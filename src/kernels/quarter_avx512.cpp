@@ -2,6 +2,7 @@
 // Quarter-point rows with AVX-512, on processors whose byte permutations cross lanes (VBMI): one
 // permutation picks from two windows.
 #include <immintrin.h>
+#include <stddef.h>
 
 #include "kernels/inline.h"
 #include "kernels/quarter_windows_inl.h"

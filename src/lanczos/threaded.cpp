@@ -32,12 +32,19 @@ bool is_empty(const LanczosCall& call) {
 void fill_bands(ovrin_lanczos_band* bands, int32_t count, int32_t height, const LanczosCall& call,
                 const LanczosPlan& plan) {
     for (int32_t i = 0; i < count; ++i) {
-        const int32_t first_row = i * height;
-        uint8_t* dst = call.dst + int64_t{call.dst_w} * first_row * kPlacedBytes;
-        const int32_t rows = i == count - 1 ? call.dst_h - first_row : height;
-        bands[i] = {call.src_w, call.src_h, call.dst_w,           call.dst_h,
-                    call.src,   dst,        call.bytes_per_pixel, first_row,
-                    rows,       plan.table, plan.columns.data(),  plan.rows.data()};
+        ovrin_lanczos_band& band = bands[i];
+        band.src_w = call.src_w;
+        band.src_h = call.src_h;
+        band.dst_w = call.dst_w;
+        band.dst_h = call.dst_h;
+        band.src = call.src;
+        band.first_row = i * height;
+        band.dst = call.dst + int64_t{call.dst_w} * band.first_row * kPlacedBytes;
+        band.bytes_per_pixel = call.bytes_per_pixel;
+        band.rows = i == count - 1 ? call.dst_h - band.first_row : height;
+        band.table = plan.table;
+        band.column_weights = plan.columns.data();
+        band.row_weights = plan.rows.data();
     }
 }
 
@@ -71,19 +78,19 @@ void _resize_lanczos_tp(void* band) {
     if (record.dst == nullptr || record.src == nullptr || record.table == nullptr) return;
     if (record.src_w < 1 || record.src_h < 1 || record.dst_w < 1 || record.dst_h < 1) return;
     if (record.bytes_per_pixel < 1 || record.rows < 1) return;
-    const ptrdiff_t pixel = record.bytes_per_pixel;
-    const LanczosPicture picture = {record.src,
-                                    record.src_w,
-                                    record.src_h,
-                                    record.src_w * pixel,
-                                    record.bytes_per_pixel,
-                                    record.dst,
-                                    record.dst_w,
-                                    record.dst_h,
-                                    record.dst_w * pixel,
-                                    record.bytes_per_pixel,
-                                    record.column_weights,
-                                    record.row_weights};
+    LanczosPicture picture = {};
+    picture.src = record.src;
+    picture.src_w = record.src_w;
+    picture.src_h = record.src_h;
+    picture.src_pitch = ptrdiff_t{record.src_w} * record.bytes_per_pixel;
+    picture.src_components = record.bytes_per_pixel;
+    picture.dst = record.dst;
+    picture.dst_w = record.dst_w;
+    picture.dst_h = record.dst_h;
+    picture.dst_pitch = ptrdiff_t{record.dst_w} * record.bytes_per_pixel;
+    picture.dst_components = record.bytes_per_pixel;
+    picture.column_weights = record.column_weights;
+    picture.row_weights = record.row_weights;
     LanczosCache cache(picture);
     if (!cache.ready()) return;
     filter_rows(kernels().plan_lanczos, picture, cache, record.first_row,

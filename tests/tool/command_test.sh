@@ -58,7 +58,7 @@ fails 2 '--canvas.*at least 1' in.ppm no.png --canvas 0x3
 fails 2 '--fit' in.ppm no.png --size 3x3 --fit tightly
 fails 2 'IN is required'
 fails 2 'OUT is required' in.ppm --size 3x3
-fails 2 'not expected' in.ppm no.png more.png --size 3x3
+fails 2 'more than IN and OUT: more.png' in.ppm no.png more.png --size 3x3
 fails 2 'not expected' in.ppm no.png --size 3x3 --frobnicate
 fails 2 '--engine' in.ppm no.png --size 3x3 --engine sharpest
 fails 2 '--quality' in.ppm no.jpg --size 3x3 --quality 0
@@ -76,7 +76,7 @@ for type in png jpg ppm; do
     bytes=$(stat -c %s "in.$type")
     for part in 5 25 50 75 90; do
         head -c $((bytes * part / 100)) "in.$type" >"cut.$type"
-        fails 1 "cut.$type: " "cut.$type" no.png --size 3x3
+        fails 1 "cut.$type: " "cut.$type" no.png --size 3x3 --strict
     done
 done
 # A damaged checksum; data that is not what the compressed stream should hold.
@@ -171,7 +171,7 @@ for flag in --help -h; do
     [ ! -s stderr ] || complain "$flag writes to standard error"
     awk 'length > 100 { exit 1 }' help || complain "$flag has lines over 100 columns"
 done
-for option in --size --canvas --fit --gravity --engine --format --input-size --quality --background --premultiply --no-rotate --strip --max-pixels --quiet --json --verbose --help --version; do
+for option in --size --canvas --fit --gravity --engine --output --output-type --recursive --jobs --frames --format --input-size --quality --background --premultiply --no-rotate --strip --strict --max-pixels --quiet --json --verbose --help --version; do
     grep -q -e " ${option}[ ,]" help || complain "no $option in --help"
 done
 for flag in --help --version; do

@@ -79,7 +79,25 @@ make_sample() {
     convert sample.png -alpha set -channel A -evaluate set 60% +channel PNG32:sample_alpha.png
     convert sample.png -quality 95 sample.jpg
     convert -size 64x64 xc:white white.png
+    head -c $(($(stat -c %s photo1.jpg) * 7 / 10)) photo1.jpg >cut.jpg
+    head -c $(($(stat -c %s photo1.jpg) - 2)) photo1.jpg >no_end.jpg
+    head -c 300 photo1.jpg >head.jpg
+    # A few bytes of the middle are others.
+    cp photo1.jpg scratched.jpg
+    printf '\xff\xd9\x00\x00\xff\xc0' |
+        dd of=scratched.jpg bs=1 seek=$(($(stat -c %s photo1.jpg) * 3 / 4)) conv=notrunc status=none
     convert sample.png -crop 800x800+400+200 +repage -depth 8 RGB:sample.rgb
+}
+
+# album/: photographs in folders, and what is none. empty/ holds nothing.
+make_album() {
+    mkdir -p album/2025/may album/2026 empty
+    cp photo6.jpg album/2025/may/beach.jpg
+    cp photo1.jpg album/2025/hill.JPG
+    cp plain.png album/2026/drawing.png
+    cp plain.png album/cover.png
+    echo 'Holidays' >album/notes.txt
+    echo 'no picture' >broken.jpg
 }
 
 make_fixtures() {
@@ -87,6 +105,7 @@ make_fixtures() {
     make_coloured
     make_transparent
     make_sample
+    make_album
 }
 
 # tag NAME FILE: what exiftool says; nothing where there is none.
@@ -186,4 +205,9 @@ def value(key):
     for name in names: found = found[name]
     return str(found)
 print(*map(value, sys.argv[1].split()))' "$keys"
+}
+
+# sizes FILE...: of each.
+sizes() {
+    identify -format '%wx%h ' "$@" | sed 's/ $//'
 }

@@ -77,6 +77,27 @@ fails 2 '--input-size requires --format' in.i420 no.i420 -s 9x9 --input-size 32x
 fails 2 "--format: 'yv12' is none of: nv21 i420 rgba rgb" in.i420 no.i420 -s 9x9 --format yv12
 fails 2 '--input-size: .*at least 1' in.i420 no.i420 -s 9x9 --format i420 --input-size 0x16
 
+# Some of the frames.
+frames_are() {
+    local range=$1 n
+    shift
+    rm -f chosen.i420
+    for n in "$@"; do tail -c +$((n * 192 + 1)) out.i420 | head -c 192 >>chosen.i420; done
+    works in.i420 some.i420 "${raw[@]}" --size 16x8 --frames "$range"
+    cmp -s chosen.i420 some.i420 || complain "--frames $range gives others"
+}
+frames_are 1:3 0 1 2
+frames_are 2:3 1 2
+frames_are 2: 1 2
+frames_are :2 0 1
+frames_are 2 1
+frames_are 3:99 2
+works in.i420 one.png "${raw[@]}" -s 9x9 --frames 2
+fails 1 'in.i420: holds no such frame' in.i420 no.i420 "${raw[@]}" -s 9x9 --frames 4
+for range in : 0 0:2 3:2 a 1:b 1:2:3 -1:2; do
+    fails 2 "--frames: '$range' are no frames" in.i420 no.i420 "${raw[@]}" -s 9x9 "--frames=$range"
+done
+
 # ---- Y4M ----
 
 works in.y4m out.y4m --size 16x8

@@ -9,11 +9,13 @@ _ovrinresize() {
         -g | --gravity) words='center north northeast east southeast south southwest west northwest' ;;
         --format) words='nv21 i420 rgba rgb' ;;
         --background) words='black white gray red green blue yellow cyan magenta' ;;
-        -s | --size | -c | --canvas | --input-size | -q | --quality | --max-pixels) return ;;
+        -t | --output-type) words='png jpg ppm y4m nv21 i420 rgba rgb' ;;
+        -s | --size | -c | --canvas | --input-size | -q | --quality | --max-pixels | \
+            -o | --output | -j | --jobs | --frames) return ;;
         *)
             [[ $word == -* ]] && words='--size --canvas --fit --gravity --engine --format --input-size
-                --quality --background --premultiply --no-premultiply --no-rotate --strip --max-pixels
-                --json --quiet --verbose --help --version'
+                --quality --background --premultiply --no-premultiply --no-rotate --strip --strict --max-pixels
+                --output --output-type --recursive --jobs --frames --json --quiet --verbose --help --version'
             ;;
     esac
     if [[ $words ]]; then
