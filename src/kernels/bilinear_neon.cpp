@@ -189,12 +189,22 @@ void across_groups(BilinearSums& sums, const uint8_t* row, const BilinearPlan& p
     }
 }
 
+// WebAssembly looks samples up in one vector at a time: its groups would take up to four times as
+// long as quads do.
+#if defined(__wasm__)
+constexpr bool kPlansGroups = false;
+#else
+constexpr bool kPlansGroups = true;
+#endif
+
 template <int N>
 BilinearAcross* plan_across(BilinearPlan& plan, const BilinearColumns& columns) {
-    constexpr BilinearAcross* kAcross[] = {across_groups<N, 16>, across_groups<N, 32>,
-                                           across_groups<N, 48>, across_groups<N, 64>};
-    for (int32_t i = 0; i < 4; ++i) {
-        if (plan_groups_in_windows<N>(plan, columns, 16 * (i + 1))) return kAcross[i];
+    if constexpr (kPlansGroups) {
+        constexpr BilinearAcross* kAcross[] = {across_groups<N, 16>, across_groups<N, 32>,
+                                               across_groups<N, 48>, across_groups<N, 64>};
+        for (int32_t i = 0; i < 4; ++i) {
+            if (plan_groups_in_windows<N>(plan, columns, 16 * (i + 1))) return kAcross[i];
+        }
     }
     if (plan_quads(plan, columns, {16, 1, kStepQuads})) return across_quads;
     return plan_bilinear_scalar(plan, columns).across;
