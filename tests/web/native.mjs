@@ -10,10 +10,16 @@ export const root = process.env.OVRIN_ROOT;
 const tool = join(root, 'build/release/tools/ovrinresize');
 export const folder = mkdtempSync(join(tmpdir(), 'ovrinresize-'));
 
+// A size is meant exactly, whatever the ratio.
+function run(input, output, options) {
+    const fit = options.includes('--size') && !options.includes('--fit') ? ['--fit', 'exact'] : [];
+    execFileSync(tool, [input, output, ...options, ...fit]);
+}
+
 /** The bytes of the picture file, resized and in the raw format. */
 export function nativePixels(file, format, ...options) {
     const output = join(folder, `result.${format}`);
-    execFileSync(tool, [file, output, ...options]);
+    run(file, output, options);
     return new Uint8Array(readFileSync(output));
 }
 
@@ -27,7 +33,7 @@ export function nativeFrame(bytes, format, width, height, ...options) {
 /** A file that the tool writes. */
 export function nativeFile(file, name, ...options) {
     const output = join(folder, name);
-    execFileSync(tool, [file, output, ...options]);
+    run(file, output, options);
     return output;
 }
 
