@@ -4,6 +4,7 @@
 #include <immintrin.h>
 
 #include "kernels/inline.h"
+#include "kernels/quarter_averages_x86_inl.h"
 #include "kernels/quarter_windows_inl.h"
 #include "kernels/sets.h"
 
@@ -78,30 +79,28 @@ __m256i load_lanes(const uint8_t* row, LanesEntry entry, int32_t window) {
                                    _mm_loadu_si128(high), 1);
 }
 
-__m256i quarter(__m256i samples) {
-    return _mm256_and_si256(_mm256_srli_epi16(samples, 2), _mm256_set1_epi8(0x3F));
-}
-
-// Two lanes: the rows' quarters are summed first, then gathered for both taps. A cache line holds
-// four windows, so only every fourth one has its line fetched for the next rows.
+// Two lanes: twice the sums of the rows' quarters, then what is gathered for either tap. A cache
+// line holds four windows, so only every fourth one has its line fetched for the next rows.
 template <int kWindows, bool kPair>
 OVRIN_ALWAYS_INLINE __m256i gather(const QuarterRows& rows, const QuarterPlan& plan,
                                    LanesEntry entry) {
     const uint8_t* masks = plan.bytes + entry.masks;
-    __m256i result = _mm256_setzero_si256();
+    __m256i left = _mm256_setzero_si256();
+    __m256i right = _mm256_setzero_si256();
     for (int w = 0; w < kWindows; ++w) {
-        __m256i sums = quarter(load_lanes(rows.top, entry, w));
-        if (kPair) sums = _mm256_add_epi8(sums, quarter(load_lanes(rows.bottom, entry, w)));
+        const __m256i top = clear_low_bits(load_lanes(rows.top, entry, w));
+        const __m256i sums =
+            kPair ? _mm256_avg_epu8(top, clear_low_bits(load_lanes(rows.bottom, entry, w)))
+                  : halve(top);
         if (kWindows > 1 && w % 4 == 0) {
             fetch_lanes(rows.next_top, entry, w);
             if (kPair) fetch_lanes(rows.next_bottom, entry, w);
         }
         const auto* mask = reinterpret_cast<const __m256i*>(masks + w * 2 * kVector);
-        const __m256i left = _mm256_shuffle_epi8(sums, _mm256_load_si256(mask));
-        const __m256i right = _mm256_shuffle_epi8(sums, _mm256_load_si256(mask + 1));
-        result = _mm256_add_epi8(result, _mm256_add_epi8(left, right));
+        left = _mm256_or_si256(left, _mm256_shuffle_epi8(sums, _mm256_load_si256(mask)));
+        right = _mm256_or_si256(right, _mm256_shuffle_epi8(sums, _mm256_load_si256(mask + 1)));
     }
-    return result;
+    return _mm256_avg_epu8(left, right);
 }
 
 template <bool kAdd>
