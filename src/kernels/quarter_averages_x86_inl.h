@@ -16,6 +16,10 @@ OVRIN_ALWAYS_INLINE __m256i clear_low_bits(__m256i samples) {
     return _mm256_and_si256(samples, _mm256_set1_epi8(static_cast<char>(0xFC)));
 }
 
+OVRIN_ALWAYS_INLINE __m128i clear_low_bits(__m128i samples) {
+    return _mm_and_si128(samples, _mm_set1_epi8(static_cast<char>(0xFC)));
+}
+
 // Twice the quarters of one row alone.
 OVRIN_ALWAYS_INLINE __m256i halve(__m256i cleared) {
     return _mm256_srli_epi16(cleared, 1);

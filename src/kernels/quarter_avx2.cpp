@@ -158,12 +158,47 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
     quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>(),
     quarter_kernels<5>(), quarter_kernels<6>(), quarter_kernels<7>(), quarter_kernels<8>()};
 
+// From this reduction on, windows hold so few taps of samples of four bytes that these are loaded
+// one by one, with the scalar kernels' plan. Nothing is fetched for the next rows: so little lies
+// between two loads that the processor finds those to come by itself.
+constexpr int32_t kMinWordReduction = 7;
+
+OVRIN_ALWAYS_INLINE __m128i load_word(const uint8_t* sample) {
+    return clear_low_bits(_mm_loadu_si32(sample));
+}
+
+// Twice the quarters of both taps in a row.
+OVRIN_ALWAYS_INLINE __m128i average_taps(const uint8_t* row, ptrdiff_t left, ptrdiff_t right) {
+    return _mm_avg_epu8(load_word(row + left), load_word(row + right));
+}
+
+template <bool kPair, bool kAdd>
+void run_words(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+    const QuarterRows rows = source;
+    for (int32_t i = 0; i < plan.samples; ++i, dst += sizeof(int32_t)) {
+        const ptrdiff_t left = ptrdiff_t{4} * plan.taps[i].left;
+        const ptrdiff_t right = ptrdiff_t{4} * plan.taps[i].right;
+        const __m128i top = average_taps(rows.top, left, right);
+        __m128i sums = kPair ? _mm_avg_epu8(top, average_taps(rows.bottom, left, right))
+                             : _mm_srli_epi16(top, 1);
+        if (kAdd) sums = _mm_add_epi8(sums, _mm_loadu_si32(dst));
+        _mm_storeu_si32(dst, sums);
+    }
+}
+
+constexpr QuarterKernels kWordKernels = {run_words<true, false>, run_words<true, true>,
+                                         run_words<false, true>};
+
 }  // namespace
 
 const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
     const QuarterKernels* simple = plan_simple_quarters_avx2(plan, shape, columns, samples);
     if (simple != nullptr) return *simple;
+    if (shape.sample_bytes == 4 && shape.src_columns / kMinWordReduction >= shape.dst_columns) {
+        plan_quarters_scalar(plan, shape, columns, samples);
+        return kWordKernels;
+    }
     const WindowShape lane = window_shape(shape, kLane, kMaxWindows);
     if (lane.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
     plan.sample_bytes = shape.sample_bytes;
