@@ -1,7 +1,7 @@
 # SPDX-License-Identifier: Apache-2.0
 # The library itself: the objects, which white-box tests link too, and the shared object.
-if(ANDROID)
-  set(OVRINRESIZE_THREADS "") # a part of Android's libc
+if(ANDROID OR CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
+  set(OVRINRESIZE_THREADS "") # a part of Android's libc; WebAssembly has none
 else()
   find_package(Threads REQUIRED)
   set(OVRINRESIZE_THREADS Threads::Threads)
@@ -17,7 +17,6 @@ add_library(ovrinresize_objects OBJECT
   src/bilinear/threaded.cpp
   src/canvas/paint.cpp
   src/canvas/placement.cpp
-  src/dispatch/records.cpp
   src/dispatch/wrappers.cpp
   src/kernels/bilinear_scalar.cpp
   src/kernels/cpu.cpp
@@ -46,6 +45,15 @@ add_library(ovrinresize_objects OBJECT
   src/yuv420/place.cpp
   src/yuv420/resize.cpp
   src/yuv420/work_buffer.cpp)
+if(CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
+  target_sources(ovrinresize_objects PRIVATE src/kernels/lanczos_wasm.cpp)
+  if(OVRINRESIZE_SIMD128)
+    target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
+      src/kernels/quarter_neon.cpp src/kernels/quarter_ratios_wasm.cpp)
+  endif()
+else()
+  target_sources(ovrinresize_objects PRIVATE src/dispatch/records.cpp) # for 64-bit platforms
+endif()
 if(CMAKE_SYSTEM_PROCESSOR MATCHES "aarch64|arm64")
   target_sources(ovrinresize_objects PRIVATE src/kernels/bilinear_neon.cpp
     src/kernels/copy_neon.cpp src/kernels/lanczos_neon.cpp src/kernels/quarter_neon.cpp
@@ -92,10 +100,15 @@ set(OVRINRESIZE_HEADER ${PROJECT_SOURCE_DIR}/include/ovrinresize.h)
 set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${OVRINRESIZE_HEADER})
 file(STRINGS ${OVRINRESIZE_HEADER} declarations REGEX "^OVRIN_API .*\\(")
 set(OVRINRESIZE_EXPORTS "")
+set(OVRINRESIZE_FUNCTIONS "")
 foreach(declaration IN LISTS declarations)
   string(REGEX MATCH "([A-Za-z_0-9]+)\\(" ignored "${declaration}")
   string(APPEND OVRINRESIZE_EXPORTS "        ${CMAKE_MATCH_1};\n")
+  list(APPEND OVRINRESIZE_FUNCTIONS ${CMAKE_MATCH_1})
 endforeach()
+if(CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
+  return() # cmake/Wasm.cmake makes a module of it instead
+endif()
 # Android's loader knows symbol versions only from API 23 on, and installs no file whose name does not
 # end in .so: there, neither the functions nor the file have a version.
 if(ANDROID)

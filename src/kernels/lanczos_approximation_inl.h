@@ -102,6 +102,16 @@ bool plan_approximation(LanczosStripPlan& plan, const LanczosColumns& columns) {
     return spans_hold_groups(plan);
 }
 
+// Rounded once or twice: a sum whose first product is rounded anyway goes through as many roundings
+// either way.
+float add_product(float sum, float weight, float tap) {
+#if defined(__wasm__)
+    return sum + weight * tap;
+#else
+    return fmaf(weight, tap, sum);
+#endif
+}
+
 // Sums of one source row of pixels with less than four components.
 template <int N>
 void sum_narrow_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src) {
@@ -120,8 +130,9 @@ void sum_narrow_row(float* sums, const LanczosStripPlan& plan, const uint8_t* sr
                 float even = weights[0] * taps[0];
                 float odd = weights[1] * taps[N];
                 for (int32_t i = 2; i < kLanczosTaps; i += 2) {
-                    even = fmaf(weights[i], taps[i * N], even);
-                    if (i + 1 < kLanczosTaps) odd = fmaf(weights[i + 1], taps[(i + 1) * N], odd);
+                    even = add_product(even, weights[i], taps[i * N]);
+                    if (i + 1 < kLanczosTaps)
+                        odd = add_product(odd, weights[i + 1], taps[(i + 1) * N]);
                 }
                 sums[x * N + c] = even + odd;
             }

@@ -7,6 +7,10 @@
 
 #include "kernels/lanczos.h"
 
+#if defined(__wasm__)
+#include "kernels/exact_fma.h"
+#endif
+
 namespace ovrin {
 
 namespace {
@@ -17,6 +21,14 @@ uint8_t rounded(double value) {
     return shifted > 255.0 ? uint8_t{255} : static_cast<uint8_t>(shifted);
 }
 
+double add_tap(double acc, double weight, uint8_t byte) {
+#if defined(__wasm__)
+    return exact_fma(weight, byte, acc);
+#else
+    return fma(weight, byte, acc);
+#endif
+}
+
 // Sum of all taps, which start at byte `first` of the source rows and lie `step` bytes apart.
 double sum_of_taps(const LanczosRow& row, const double* column_weights, int64_t first,
                    int64_t step) {
@@ -24,7 +36,7 @@ double sum_of_taps(const LanczosRow& row, const double* column_weights, int64_t 
     for (int32_t r = 0; r < kLanczosTaps; ++r) {
         for (int32_t i = 0; i < kLanczosTaps; ++i) {
             const double weight = row.weights[r] * column_weights[i];
-            acc = fma(weight, row.taps[r][first + i * step], acc);
+            acc = add_tap(acc, weight, row.taps[r][first + i * step]);
         }
     }
     return acc;

@@ -22,6 +22,14 @@ constexpr Kernels kAvx512Kernels = {plan_quarters_avx512, plan_bilinear_avx512,
 #elif defined(__aarch64__)
 constexpr Kernels kNeonKernels = {plan_quarters_neon, plan_bilinear_neon, plan_bilinear_copy_neon,
                                   plan_lanczos_neon, copy_every_neon};
+#elif defined(__wasm_simd128__)
+// The NEON kernels, in WebAssembly's instructions. Those have no fused multiply-add, and no loads
+// that part interleaved words.
+constexpr Kernels kSimd128Kernels = {plan_quarters_neon, plan_bilinear_neon,
+                                     plan_bilinear_copy_neon, plan_lanczos_wasm, copy_every_scalar};
+#elif defined(__wasm__)
+constexpr Kernels kWasmKernels = {plan_quarters_scalar, plan_bilinear_scalar,
+                                  plan_bilinear_copy_scalar, plan_lanczos_wasm, copy_every_scalar};
 #endif
 
 const Kernels* best_kernels() {
@@ -64,6 +72,10 @@ int32_t available_kernels(NamedKernels sets[kMaxSets]) {
     if (cpu.avx512_vbmi) sets[count++] = {"avx512", &kAvx512Kernels};
 #elif defined(__aarch64__)
     sets[count++] = {"neon", &kNeonKernels};
+#elif defined(__wasm_simd128__)
+    sets[count++] = {"simd128", &kSimd128Kernels};
+#elif defined(__wasm__)
+    sets[count++] = {"wasm", &kWasmKernels};
 #endif
     return count;
 }

@@ -27,6 +27,7 @@ PlanLanczos plan_lanczos_scalar;
 PlanLanczos plan_lanczos_avx2;
 PlanLanczos plan_lanczos_avx512;
 PlanLanczos plan_lanczos_neon;
+PlanLanczos plan_lanczos_wasm;
 
 CopyEvery copy_every_scalar;
 CopyEvery copy_every_avx2;

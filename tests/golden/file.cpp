@@ -16,6 +16,18 @@ std::string hex(uint64_t hash) {
     return digits;
 }
 
+using Hashes = std::map<std::string, std::string>;
+
+// A later file's hash takes the place of an earlier one's.
+Hashes read(const std::vector<std::string>& paths) {
+    Hashes hashes;
+    for (const std::string& path : paths) {
+        std::ifstream file(path);
+        for (std::string name, hash; file >> name >> hash;) hashes[name] = hash;
+    }
+    return hashes;
+}
+
 }  // namespace
 
 void print(const std::vector<Result>& results) {
@@ -24,10 +36,8 @@ void print(const std::vector<Result>& results) {
     }
 }
 
-bool equal_file(const std::vector<Result>& results, const std::string& path) {
-    std::ifstream file(path);
-    std::map<std::string, std::string> wanted;
-    for (std::string name, hash; file >> name >> hash;) wanted[name] = hash;
+bool equal_files(const std::vector<Result>& results, const std::vector<std::string>& paths) {
+    Hashes wanted = read(paths);
     size_t differences = 0;
     for (const Result& result : results) {
         const auto found = wanted.find(result.name);
@@ -46,8 +56,12 @@ bool equal_file(const std::vector<Result>& results, const std::string& path) {
     }
     for (const auto& [name, hash] : wanted) printf("DIFFERS %s was not run\n", name.c_str());
     differences += wanted.size();
-    printf("%zu cases, %zu differ from %s\n", results.size(), differences, path.c_str());
+    printf("%zu cases, %zu differ from %s\n", results.size(), differences, paths.back().c_str());
     return differences == 0 && !results.empty();
+}
+
+bool equal_file(const std::vector<Result>& results, const std::string& path) {
+    return equal_files(results, {path});
 }
 
 }  // namespace golden

@@ -16,4 +16,7 @@ void print(const std::vector<Result>& results);
 // does. Cases that only one side has are differences too.
 bool equal_file(const std::vector<Result>& results, const std::string& path);
 
+// The same with several files; a later one's hash takes the place of an earlier one's.
+bool equal_files(const std::vector<Result>& results, const std::vector<std::string>& paths);
+
 }  // namespace golden
