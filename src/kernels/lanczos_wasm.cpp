@@ -100,7 +100,7 @@ struct Wasm {
     }
 
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const int32_t* pixels, int32_t count) {
+                           const uint8_t* pixels, int32_t count) {
         for (int32_t i = 0; i < count; ++i) {
             const int32_t x = pixels[i];
             const double* weights = columns.weights + int64_t{x} * kLanczosTaps;
