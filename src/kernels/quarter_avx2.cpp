@@ -4,6 +4,7 @@
 #include <immintrin.h>
 
 #include "kernels/inline.h"
+#include "kernels/quarter_averages_x86_inl.h"
 #include "kernels/quarter_windows_inl.h"
 #include "kernels/sets.h"
 
@@ -78,30 +79,28 @@ __m256i load_lanes(const uint8_t* row, LanesEntry entry, int32_t window) {
                                    _mm_loadu_si128(high), 1);
 }
 
-__m256i quarter(__m256i samples) {
-    return _mm256_and_si256(_mm256_srli_epi16(samples, 2), _mm256_set1_epi8(0x3F));
-}
-
-// Two lanes: the rows' quarters are summed first, then gathered for both taps. A cache line holds
-// four windows, so only every fourth one has its line fetched for the next rows.
+// Two lanes: twice the sums of the rows' quarters, then what is gathered for either tap. A cache
+// line holds four windows, so only every fourth one has its line fetched for the next rows.
 template <int kWindows, bool kPair>
 OVRIN_ALWAYS_INLINE __m256i gather(const QuarterRows& rows, const QuarterPlan& plan,
                                    LanesEntry entry) {
     const uint8_t* masks = plan.bytes + entry.masks;
-    __m256i result = _mm256_setzero_si256();
+    __m256i left = _mm256_setzero_si256();
+    __m256i right = _mm256_setzero_si256();
     for (int w = 0; w < kWindows; ++w) {
-        __m256i sums = quarter(load_lanes(rows.top, entry, w));
-        if (kPair) sums = _mm256_add_epi8(sums, quarter(load_lanes(rows.bottom, entry, w)));
+        const __m256i top = clear_low_bits(load_lanes(rows.top, entry, w));
+        const __m256i sums =
+            kPair ? _mm256_avg_epu8(top, clear_low_bits(load_lanes(rows.bottom, entry, w)))
+                  : halve(top);
         if (kWindows > 1 && w % 4 == 0) {
             fetch_lanes(rows.next_top, entry, w);
             if (kPair) fetch_lanes(rows.next_bottom, entry, w);
         }
         const auto* mask = reinterpret_cast<const __m256i*>(masks + w * 2 * kVector);
-        const __m256i left = _mm256_shuffle_epi8(sums, _mm256_load_si256(mask));
-        const __m256i right = _mm256_shuffle_epi8(sums, _mm256_load_si256(mask + 1));
-        result = _mm256_add_epi8(result, _mm256_add_epi8(left, right));
+        left = _mm256_or_si256(left, _mm256_shuffle_epi8(sums, _mm256_load_si256(mask)));
+        right = _mm256_or_si256(right, _mm256_shuffle_epi8(sums, _mm256_load_si256(mask + 1)));
     }
-    return result;
+    return _mm256_avg_epu8(left, right);
 }
 
 template <bool kAdd>
@@ -159,12 +158,47 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
     quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>(),
     quarter_kernels<5>(), quarter_kernels<6>(), quarter_kernels<7>(), quarter_kernels<8>()};
 
+// From this reduction on, windows hold so few taps of samples of four bytes that these are loaded
+// one by one, with the scalar kernels' plan. Nothing is fetched for the next rows: so little lies
+// between two loads that the processor finds those to come by itself.
+constexpr int32_t kMinWordReduction = 7;
+
+OVRIN_ALWAYS_INLINE __m128i load_word(const uint8_t* sample) {
+    return clear_low_bits(_mm_loadu_si32(sample));
+}
+
+// Twice the quarters of both taps in a row.
+OVRIN_ALWAYS_INLINE __m128i average_taps(const uint8_t* row, ptrdiff_t left, ptrdiff_t right) {
+    return _mm_avg_epu8(load_word(row + left), load_word(row + right));
+}
+
+template <bool kPair, bool kAdd>
+void run_words(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+    const QuarterRows rows = source;
+    for (int32_t i = 0; i < plan.samples; ++i, dst += sizeof(int32_t)) {
+        const ptrdiff_t left = ptrdiff_t{4} * plan.taps[i].left;
+        const ptrdiff_t right = ptrdiff_t{4} * plan.taps[i].right;
+        const __m128i top = average_taps(rows.top, left, right);
+        __m128i sums = kPair ? _mm_avg_epu8(top, average_taps(rows.bottom, left, right))
+                             : _mm_srli_epi16(top, 1);
+        if (kAdd) sums = _mm_add_epi8(sums, _mm_loadu_si32(dst));
+        _mm_storeu_si32(dst, sums);
+    }
+}
+
+constexpr QuarterKernels kWordKernels = {run_words<true, false>, run_words<true, true>,
+                                         run_words<false, true>};
+
 }  // namespace
 
 const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
     const QuarterKernels* simple = plan_simple_quarters_avx2(plan, shape, columns, samples);
     if (simple != nullptr) return *simple;
+    if (shape.sample_bytes == 4 && shape.src_columns / kMinWordReduction >= shape.dst_columns) {
+        plan_quarters_scalar(plan, shape, columns, samples);
+        return kWordKernels;
+    }
     const WindowShape lane = window_shape(shape, kLane, kMaxWindows);
     if (lane.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
     plan.sample_bytes = shape.sample_bytes;

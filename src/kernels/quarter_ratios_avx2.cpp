@@ -1,11 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 // The simple ratios with AVX2, 32 destination bytes at a time.
-//
-// Averages are exact here: where the two low bits of a and b are zero, avg_epu8(a, b) is twice the
-// sum of their quarters. It is even and at most 252, so that the average of two such sums is the
-// sum of all four quarters.
 #include <immintrin.h>
 
+#include "kernels/quarter_averages_x86_inl.h"
 #include "kernels/quarter_ratios_inl.h"
 #include "kernels/sets.h"
 
@@ -13,24 +10,22 @@ namespace ovrin {
 
 namespace {
 
-OVRIN_ALWAYS_INLINE __m256i load_quarters(const uint8_t* bytes) {
-    return _mm256_and_si256(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(bytes)),
-                            _mm256_set1_epi8(static_cast<char>(0xFC)));
+OVRIN_ALWAYS_INLINE __m256i load_cleared(const uint8_t* bytes) {
+    return clear_low_bits(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(bytes)));
 }
 
-OVRIN_ALWAYS_INLINE __m256i load_quarters(const uint8_t* low, const uint8_t* high) {
+OVRIN_ALWAYS_INLINE __m256i load_cleared(const uint8_t* low, const uint8_t* high) {
     const __m256i lanes = _mm256_inserti128_si256(
         _mm256_castsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(low))),
         _mm_loadu_si128(reinterpret_cast<const __m128i*>(high)), 1);
-    return _mm256_and_si256(lanes, _mm256_set1_epi8(static_cast<char>(0xFC)));
+    return clear_low_bits(lanes);
 }
 
 // Twice the quarters of both rows, or of the top one, from bytes `offset` on, or of two lanes.
 template <bool kPair, class... Offsets>
 OVRIN_ALWAYS_INLINE __m256i twice(const uint8_t* top, const uint8_t* bottom, Offsets... offset) {
-    const __m256i quarters = load_quarters(top + offset...);
-    return kPair ? _mm256_avg_epu8(quarters, load_quarters(bottom + offset...))
-                 : _mm256_srli_epi16(quarters, 1);
+    const __m256i cleared = load_cleared(top + offset...);
+    return kPair ? _mm256_avg_epu8(cleared, load_cleared(bottom + offset...)) : halve(cleared);
 }
 
 // Sums of bytes and their right neighbours, halved, in 16 bits each.
@@ -125,13 +120,12 @@ struct FourToOne {
     // Of words 0 to 15: 1, 9, 3, 11, 5, 13, 7, 15.
     template <bool kPair>
     static OVRIN_ALWAYS_INLINE __m256i twice_odd_words(const uint8_t* top, const uint8_t* bottom) {
-        const __m256i quarters = odd_words(top);
-        return kPair ? _mm256_avg_epu8(quarters, odd_words(bottom))
-                     : _mm256_srli_epi16(quarters, 1);
+        const __m256i cleared = odd_words(top);
+        return kPair ? _mm256_avg_epu8(cleared, odd_words(bottom)) : halve(cleared);
     }
 
     static OVRIN_ALWAYS_INLINE __m256i odd_words(const uint8_t* row) {
-        return _mm256_blend_epi32(load_quarters(row + 4), load_quarters(row + 32), 0xAA);
+        return _mm256_blend_epi32(load_cleared(row + 4), load_cleared(row + 32), 0xAA);
     }
 };
 

@@ -200,6 +200,25 @@ TEST_F(VectorQuarterKernels, SimpleRatiosHaveKernelsOfTheirOwn) {
     }
 }
 
+// Pixels that lie far apart are loaded one by one.
+TEST_F(VectorQuarterKernels, StrongReductionsHaveKernelsOfTheirOwn) {
+    for (const NamedKernels& set : vector_sets_) {
+        if (std::string_view(set.name) != "avx2") continue;
+        Random random(36);
+        const auto kernels_of = [](const Kernels& kernels, const Row& row) {
+            return plan_with(kernels, row, 0, row.dst_columns)->kernels;
+        };
+        const QuarterKernels* own = kernels_of(*set.kernels, {4, 4000, 224});
+        EXPECT_EQ(own, kernels_of(*set.kernels, {4, 1400, 200}));
+        EXPECT_NE(own, kernels_of(*set.kernels, {4, 1399, 200}));
+        EXPECT_NE(own, kernels_of(*set.kernels, {1, 4000, 224}));
+        EXPECT_NE(own, kernels_of(scalar_kernels, {4, 4000, 224}));
+        for (int32_t samples = 1; samples <= 70; ++samples) {
+            check_row(set, {4, samples * random.between(7, 40), samples}, random);
+        }
+    }
+}
+
 TEST_F(VectorQuarterKernels, SimpleRatiosOfAllLengths) {
     for (const NamedKernels& set : vector_sets_) {
         Random random(34);
