@@ -189,8 +189,8 @@ void across_groups(BilinearSums& sums, const uint8_t* row, const BilinearPlan& p
     }
 }
 
-// WebAssembly looks samples up in one vector at a time: its groups would take up to four times as
-// long as quads do.
+// WebAssembly looks up in one vector at a time: groups would take it up to six times as long as
+// quads.
 #if defined(__wasm__)
 constexpr bool kPlansGroups = false;
 #else
