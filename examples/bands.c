@@ -39,7 +39,7 @@ static void run_every_second(void (*run)(void*), void* bands, size_t size, size_
     Tasks tasks[THREADS];
     pthread_t threads[THREADS];
     for (size_t i = 0; i < THREADS; ++i) {
-        tasks[i] = (Tasks){run, bands, size, first + 2 * i, 2 * THREADS};
+        tasks[i] = (Tasks){run, bands, size, first + 2 * i, (size_t)2 * THREADS};
         if (pthread_create(&threads[i], NULL, run_tasks, &tasks[i]) != 0) abort();
     }
     for (size_t i = 0; i < THREADS; ++i) pthread_join(threads[i], NULL);
@@ -50,10 +50,17 @@ static void run_bands(void (*run)(void*), void* bands, size_t size) {
     run_every_second(run, bands, size, 1);
 }
 
+/* Zeros: a walk starts at the first row. */
+static void* new_records(size_t size) {
+    void* records = calloc(BANDS, size);
+    if (records == NULL) abort();
+    return records;
+}
+
 /* ---- RGBA8888 ---- */
 
 static void resize_rgba(const uint8_t* src, uint32_t* dst) {
-    static ovrin_rgba_band bands[BANDS]; /* zeros: the walk starts at the first row */
+    ovrin_rgba_band* bands = new_records(sizeof *bands);
     bands[0].src_w = W;
     bands[0].src_h = H;
     bands[0].dst_w = SMALL_W;
@@ -69,21 +76,24 @@ static void resize_rgba(const uint8_t* src, uint32_t* dst) {
     bands[BANDS - 1].rows_to_do = H - bands[BANDS - 1].start_row;
 
     memset(dst, 0, sizeof(uint32_t) * SMALL_W * SMALL_H);
-    run_bands(_resize_rgba8888_tp, bands, sizeof bands[0]);
+    run_bands(_resize_rgba8888_tp, bands, sizeof *bands);
+    free(bands);
 }
 
 /* ---- NV21 ---- */
 
 enum { GRID_W = (SMALL_W + 3) / 4 * 4, GRID_H = (SMALL_H + 3) / 4 * 4 };
+enum { GRID_LUMA = GRID_W * GRID_H, SMALL_LUMA = SMALL_W * SMALL_H };
+enum { SMALL_VU_BYTES = (SMALL_W + 1) / 2 * 2, SMALL_VU_ROWS = (SMALL_H + 1) / 2 };
 
-static uint8_t work[GRID_W * GRID_H * 3 / 2]; /* cleared, as tasks add to it */
+static uint8_t work[GRID_LUMA * 3 / 2]; /* cleared, as tasks add to it */
 
-static void copy_rows(uint8_t* dst, int dst_bytes, const uint8_t* src, int rows) {
-    for (int y = 0; y < rows; ++y) memcpy(dst + y * dst_bytes, src + y * GRID_W, (size_t)dst_bytes);
+static void copy_rows(uint8_t* dst, size_t dst_bytes, const uint8_t* src, int rows) {
+    for (; rows > 0; --rows, dst += dst_bytes, src += GRID_W) memcpy(dst, src, dst_bytes);
 }
 
 static void resize_nv21(const uint8_t* src, uint8_t* dst) {
-    static ovrin_nv21_band bands[BANDS];
+    ovrin_nv21_band* bands = new_records(sizeof *bands);
     bands[0].src_width = W;
     bands[0].src_height = H;
     bands[0].src_row_bytes = W;
@@ -104,10 +114,10 @@ static void resize_nv21(const uint8_t* src, uint8_t* dst) {
     last->y_rows = H - last->y_start_row;
     last->vu_rows = vu_left > 0 ? vu_left : 0;
 
-    run_bands(_resize_nv21_tp, bands, sizeof bands[0]);
+    run_bands(_resize_nv21_tp, bands, sizeof *bands);
+    free(bands);
     copy_rows(dst, SMALL_W, work, SMALL_H);
-    copy_rows(dst + SMALL_W * SMALL_H, (SMALL_W + 1) / 2 * 2, work + GRID_W * GRID_H,
-              (SMALL_H + 1) / 2);
+    copy_rows(dst + SMALL_LUMA, SMALL_VU_BYTES, work + GRID_LUMA, SMALL_VU_ROWS);
 }
 
 /* ---- Both beside the library's own functions ---- */

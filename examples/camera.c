@@ -9,6 +9,7 @@
 #include <string.h>
 
 enum { W = 1600, H = 1200, STRIDE = 1664, PREVIEW_W = 400, PREVIEW_H = 300 };
+enum { PREVIEW_LUMA = PREVIEW_W * PREVIEW_H };
 
 /* As a camera might fill them: NV21, which has a V and a U for every four pixels. Rows of chroma
    are as long as those of luma, because src_stride says both. */
@@ -16,7 +17,7 @@ static uint8_t luma[STRIDE * H];
 static uint8_t chroma[STRIDE * H / 2];
 
 /* NV21 again, packed: a plane of luma, then one of pairs. */
-static uint8_t preview[PREVIEW_W * PREVIEW_H * 3 / 2];
+static uint8_t preview[PREVIEW_LUMA * 3 / 2];
 
 /* Luma grows to the right and V downwards, U is the same everywhere; 255 behind each row's pixels.
  */
@@ -34,9 +35,9 @@ static void expose(void) {
     }
 }
 
-static void print_row(const char* name, const uint8_t* first, int step) {
+static void print_five(const char* name, const uint8_t* sample, int step) {
     printf("%s", name);
-    for (int i = 0; i < 5; ++i) printf(" %3d", first[i * step]);
+    for (int i = 0; i < 5; ++i, sample += step) printf(" %3d", *sample);
     putchar('\n');
 }
 
@@ -52,9 +53,9 @@ int main(void) {
     expose();
     ovrin_resize_y_nv21_keep_ratio(luma, chroma, W, H, &target);
 
-    const uint8_t* pairs = preview + PREVIEW_W * PREVIEW_H;
-    print_row("luma, to the right", preview + PREVIEW_W * (PREVIEW_H / 2), (PREVIEW_W - 1) / 4);
-    print_row("V, downwards      ", pairs, PREVIEW_W * ((PREVIEW_H / 2 - 1) / 4));
-    print_row("U, downwards      ", pairs + 1, PREVIEW_W * ((PREVIEW_H / 2 - 1) / 4));
+    const uint8_t* pairs = preview + PREVIEW_LUMA;
+    print_five("luma, to the right", preview, (PREVIEW_W - 1) / 4);
+    print_five("V, downwards      ", pairs, PREVIEW_W * ((PREVIEW_H / 2 - 1) / 4));
+    print_five("U, downwards      ", pairs + 1, PREVIEW_W * ((PREVIEW_H / 2 - 1) / 4));
     return 0;
 }

@@ -11,10 +11,10 @@ static uint32_t canvas[CANVAS_W * CANVAS_H];
 
 /* A bright disc on a darker ground. */
 static void draw_picture(void) {
+    uint8_t* pixel = picture;
     for (int y = 0; y < H; ++y) {
-        for (int x = 0; x < W; ++x) {
+        for (int x = 0; x < W; ++x, pixel += 4) {
             const int dx = x - W / 2, dy = y - H / 2;
-            uint8_t* pixel = &picture[(y * W + x) * 4];
             pixel[0] = pixel[1] = pixel[2] = dx * dx + dy * dy < 100 * 100 ? 240 : 80;
             pixel[3] = 255;
         }
