@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
 # install.sh BUILD_DIR LIBDIR TREE: programs find, link and run the library in an installed tree,
-# shared and static, through the CMake package, through pkg-config, by the compiler alone and by the
+# shared and static, through the CMake package, through pkg-config and Meson, by the compiler alone and by the
 # dynamic loader, also after the tree has been moved; then all of it is removed again.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
@@ -43,6 +43,24 @@ through_pkg_config() {
     needs_none "$program"
 }
 
+# Meson would want a file of its own to compile for another machine.
+through_meson() {
+    local prefix=$1 build=$tree/meson-consumer kind
+    [[ ! $TOOLCHAIN ]] || return 0
+    if ! command -v meson >/dev/null; then
+        echo "not tested: no Meson here"
+        return 0
+    fi
+    for kind in shared static; do
+        rm -rf "$build"
+        PKG_CONFIG_LIBDIR=$prefix/$libdir/pkgconfig CC=$CC \
+            meson setup "$build" "$here/consumer" -Dkind="$kind" >"$tree/meson.log"
+        meson compile -C "$build" >>"$tree/meson.log"
+        run "$build/consumer"
+        if [[ $kind == shared ]]; then needs_library "$build/consumer"; else needs_none "$build/consumer"; fi
+    done
+}
+
 by_compiler() {
     local prefix=$1 program=$tree/compiler-consumer
     "${compile[@]}" "$here/consumer/consumer.c" -o "$program" -I "$prefix/include" \
@@ -71,6 +89,7 @@ check() {
     echo "in $1"
     through_cmake "$1"
     through_pkg_config "$1"
+    through_meson "$1"
     by_compiler "$1"
     by_loader "$1"
     installed_tool "$1"
