@@ -1,15 +1,23 @@
 # SPDX-License-Identifier: Apache-2.0
-# Header, library, CMake package and pkg-config file.
+# Header, libraries, CMake package, pkg-config file, licence and documents.
 include(CMakePackageConfigHelpers)
 
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/ovrinresize)
 
-install(TARGETS ovrinresize EXPORT ovrinresizeTargets
-  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
+set(libraries "")
+foreach(target ovrinresize ovrinresize_static)
+  if(TARGET ${target})
+    list(APPEND libraries ${target})
+  endif()
+endforeach()
+install(TARGETS ${libraries} EXPORT ovrinresizeTargets
+  LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT runtime NAMELINK_COMPONENT development
+  ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development
+  INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(FILES ${PROJECT_SOURCE_DIR}/include/ovrinresize.h
-  DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+  DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT development)
 install(EXPORT ovrinresizeTargets NAMESPACE ovrinresize:: DESTINATION ${package_dir}
-  FILE ovrinresizeTargets.cmake)
+  FILE ovrinresizeTargets.cmake COMPONENT development)
 
 configure_package_config_file(cmake/ovrinresizeConfig.cmake.in
   ${PROJECT_BINARY_DIR}/ovrinresizeConfig.cmake INSTALL_DESTINATION ${package_dir})
@@ -18,11 +26,45 @@ write_basic_package_version_file(${PROJECT_BINARY_DIR}/ovrinresizeConfigVersion.
 install(FILES
   ${PROJECT_BINARY_DIR}/ovrinresizeConfig.cmake
   ${PROJECT_BINARY_DIR}/ovrinresizeConfigVersion.cmake
-  DESTINATION ${package_dir})
+  DESTINATION ${package_dir} COMPONENT development)
 
-# The prefix is found from where the file lies, so that an installed tree can be moved.
-file(RELATIVE_PATH pc_to_prefix
-  ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
+# Relative folders are found from where the pkg-config file lies, so that an installed tree can be
+# moved; absolute ones stay where they are.
+if(IS_ABSOLUTE ${CMAKE_INSTALL_LIBDIR})
+  set(pc_prefix ${CMAKE_INSTALL_PREFIX})
+else()
+  file(RELATIVE_PATH pc_to_prefix
+    ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
+  set(pc_prefix "\${pcfiledir}/${pc_to_prefix}")
+endif()
+foreach(folder LIBDIR INCLUDEDIR)
+  if(IS_ABSOLUTE ${CMAKE_INSTALL_${folder}})
+    set(pc_${folder} ${CMAKE_INSTALL_${folder}})
+  else()
+    set(pc_${folder} "\${prefix}/${CMAKE_INSTALL_${folder}}")
+  endif()
+endforeach()
+# What a static library needs, everybody must be told when there is no other.
+if(TARGET ovrinresize)
+  set(pc_libs "")
+  set(pc_libs_private "-pthread -lm")
+else()
+  set(pc_libs " -pthread -lm")
+  set(pc_libs_private "")
+endif()
 configure_file(cmake/ovrinresize.pc.in ${PROJECT_BINARY_DIR}/ovrinresize.pc @ONLY)
 install(FILES ${PROJECT_BINARY_DIR}/ovrinresize.pc
-  DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+  DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)
+
+install(FILES LICENSE README.md CHANGELOG.md SECURITY.md
+  DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT development)
+install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT development)
+install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT development
+  FILES_MATCHING PATTERN "*.c")
+
+if(OVRINRESIZE_IS_TOP)
+  add_custom_target(uninstall
+    COMMAND ${CMAKE_COMMAND} -DMANIFEST=${PROJECT_BINARY_DIR}/install_manifest.txt
+      -P ${PROJECT_SOURCE_DIR}/cmake/Uninstall.cmake
+    VERBATIM)
+endif()

@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-# The library itself: the objects, which white-box tests link too, and the shared object.
+# The library itself: the objects, which white-box tests link too, the shared and the static library.
 if(ANDROID OR CMAKE_SYSTEM_PROCESSOR STREQUAL "wasm32")
   set(OVRINRESIZE_THREADS "") # a part of Android's libc; WebAssembly has none
 else()
@@ -79,6 +79,7 @@ if(OVRINRESIZE_KERNELS)
 endif()
 set_target_properties(ovrinresize_objects PROPERTIES
   POSITION_INDEPENDENT_CODE ON
+  UNITY_BUILD OFF # files have internal names in common
   CXX_VISIBILITY_PRESET hidden
   VISIBILITY_INLINES_HIDDEN ON)
 target_include_directories(ovrinresize_objects
@@ -94,6 +95,26 @@ set(OVRINRESIZE_PREFIX_MAPS
 target_compile_options(ovrinresize_objects PRIVATE
   "$<$<NOT:$<CONFIG:Debug>>:${OVRINRESIZE_PREFIX_MAPS}>")
 target_link_libraries(ovrinresize_objects PRIVATE ovrinresize_warnings ${OVRINRESIZE_THREADS})
+
+# BUILD_SHARED_LIBS chooses one of the two libraries; without it there are both. ovrinresize::ovrinresize
+# is the shared one, where there is one.
+if(NOT DEFINED BUILD_SHARED_LIBS OR NOT BUILD_SHARED_LIBS)
+  # Names that are not the interface's are hidden, and in namespace ovrin: what links the library does
+  # not export them.
+  add_library(ovrinresize_static STATIC $<TARGET_OBJECTS:ovrinresize_objects>)
+  add_library(ovrinresize::ovrinresize_static ALIAS ovrinresize_static)
+  set_target_properties(ovrinresize_static PROPERTIES
+    LINKER_LANGUAGE CXX
+    OUTPUT_NAME ovrinresize
+    ARCHIVE_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR})
+  target_include_directories(ovrinresize_static INTERFACE
+    $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>)
+  target_link_libraries(ovrinresize_static PRIVATE ${OVRINRESIZE_THREADS} m)
+endif()
+if(DEFINED BUILD_SHARED_LIBS AND NOT BUILD_SHARED_LIBS)
+  add_library(ovrinresize::ovrinresize ALIAS ovrinresize_static)
+  return()
+endif()
 
 # The version script lists the functions that the public header declares, and nothing else.
 set(OVRINRESIZE_HEADER ${PROJECT_SOURCE_DIR}/include/ovrinresize.h)
@@ -130,8 +151,7 @@ if(NOT ANDROID)
     SOVERSION ${PROJECT_VERSION_MAJOR})
 endif()
 target_include_directories(ovrinresize INTERFACE
-  $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>
-  $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+  $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include>)
 # as-needed leaves out the C++ run-time library that the compiler driver would add. 16 KB pages:
 # current Android devices refuse smaller alignment.
 target_link_options(ovrinresize PRIVATE

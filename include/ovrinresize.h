@@ -14,8 +14,9 @@
  *    global state, and nothing that a call makes outlives it.
  *  - The library does not know how long a buffer is. It reads and writes as much as sizes and row
  *    lengths say. A size of 0 or less means that there is no picture and no buffer.
- *  - Band records come from a walk that starts at the first band, as below; other values are not
- *    checked. The source height, and band_rows, each times the destination height, fit 32 bits.
+ *  - Band records come from a walk that starts at the first band, as "Bands" below says; other
+ *    values are not checked. The source height, and band_rows, each times the destination height,
+ *    fit 32 bits.
  *  - No byte outside the pictures is read or written. Buffers need no alignment beyond that of
  *    their type.
  */
@@ -24,6 +25,12 @@
 
 #include <pthread.h>
 #include <stdint.h>
+
+/* The version of the library that this header belongs to. */
+#define OVRINRESIZE_VERSION_MAJOR 1
+#define OVRINRESIZE_VERSION_MINOR 0
+#define OVRINRESIZE_VERSION_PATCH 0
+#define OVRINRESIZE_VERSION "1.0.0"
 
 #if defined(__GNUC__)
 #define OVRIN_API __attribute__((visibility("default")))
@@ -42,19 +49,44 @@ extern "C" {
 /*
  * Where the keep-ratio functions and the bilinear engine find their source rows and put the scaled
  * picture. The caller fills it. Only ovrin_resize_rgba8888_keep_ratio and the two functions that it
- * calls ever write it.
+ * calls ever write it. Each function reads (r), writes (w) or ignores (-) a field:
+ *
+ *     field                       RGBA8888   planes   bilinear   _ov_bilinear_tp
+ *     reserved_head               -          -        -          -
+ *     src_vu_plane                -          -        r (1)      r (1)
+ *     src_u_plane, src_v_plane    -          -        r (2)      r (2)
+ *     src_width, src_height       r w (3)    - (4)    r          -
+ *     src_stride                  r          r        r          r
+ *     src_buffer_height           -          -        -          -
+ *     format                      -          -        r          r
+ *     dst                         r          r        - (5)      - (5)
+ *     dst_width, dst_height       r w (3)    r        - (5)      - (5)
+ *     canvas_width                r          r        r          r
+ *     canvas_height               r          r        r          r
+ *     dst_x, dst_y                r          r        r          r
+ *
+ *     RGBA8888   ovrin_resize_rgba8888_keep_ratio, ovrin_resize_rgba_keep_ratio_sg and _tps
+ *     planes     ovrin_resize_y_u_v_keep_ratio, ovrin_resize_y_nv21_keep_ratio, and with a target
+ *                ovrin_resize_y_u_v_sg, ovrin_resize_y_nv_sg and their _tps
+ *     bilinear   ov_bilinear, ov_bilinear_sg, ov_bilinear_ex
+ *     (1)        for the semi-planar format codes
+ *     (2)        for the planar format code
+ *     (3)        src_width and dst_width are written when the picture is cut at the right, the
+ *                heights when it is cut at the bottom; the source's size is read only then
+ *     (4)        the arguments src_w and src_h are the source's size
+ *     (5)        an argument or a field of the band record takes its place
  *
  * dst_x and dst_y must not be negative.
  */
 typedef struct ovrin_resize_target {
-    void* reserved_head;         /* the caller's; neither read nor written */
+    void* reserved_head;         /* the caller's */
     const uint8_t* src_vu_plane; /* source chroma pairs: bilinear engine, semi-planar formats */
     const uint8_t* src_u_plane;  /* source U plane: bilinear engine, planar format */
     const uint8_t* src_v_plane;  /* source V plane: bilinear engine, planar format */
     int32_t src_width; /* source size, pixels; rewritten when an RGBA picture is clipped */
     int32_t src_height;
     int32_t src_stride;        /* source row length: pixels (RGBA8888), bytes (planes) */
-    int32_t src_buffer_height; /* rows in the source buffer */
+    int32_t src_buffer_height; /* rows in the source buffer; not used */
     int32_t format;            /* bilinear engine: an OVRIN_FORMAT_ code */
     void* dst;                 /* the canvas: 32-bit pixels or planes */
     int32_t dst_width;         /* size of the scaled picture, pixels; rewritten when an RGBA */
@@ -64,6 +96,34 @@ typedef struct ovrin_resize_target {
     int32_t dst_x; /* canvas position of the picture's top left pixel */
     int32_t dst_y;
 } ovrin_resize_target;
+
+/*
+ * ---- Bands: parts of a picture for a scheduler of the caller's own -----------------------------
+ *
+ * A band is a number of source rows. A record (ovrin_rgba_band, ovrin_yuv_band, ovrin_nv21_band)
+ * says where sampling stands before the first of them, a walker (..._get_pos) moves a record from
+ * one band to the next, and a task (..._tp) adds the samples of one band to the destination:
+ *
+ *  1. Clear the destination, or the work buffer where one is used: tasks add to what it holds.
+ *  2. Make the first record: sizes, row lengths, pointers and band_rows (at least 1) are set, and
+ *     all else is 0, above all the running state in front of src_w (src_width), the offsets and
+ *     done. A start row of 0 is what starts a walk.
+ *  3. For each band but the first copy the record before it and let the walker move the copy. What
+ *     the walker counts in rows_to_do (y_rows with uv_rows or vu_rows) are the rows of the band it
+ *     has left: copy them back into the record before.
+ *  4. No walk counts the last band's rows, and one that passes the end of the source gives 0 rows
+ *     of pixels or luma. Set what is left: rows_to_do = src_h - start_row; for 4:2:0 y_rows =
+ *     src_height - y_start_row, and (src_height + 1) / 2 - uv_start_row (vu_start_row) rows of
+ *     chroma, or 0 when that is negative.
+ *  5. When all records are made, run each one's task once. Its last act is to set done; read that
+ *     with acquire, or wait for the threads.
+ *
+ * Bands that add into one destination row must not run at the same time. With band_rows of at
+ * least src_h / dst_h, rounded up, these are neighbours at most: all bands with an even number may
+ * run side by side, and when they are done, all with an odd one. Where band_rows * dst_h is a
+ * multiple of src_h no row is shared, and all bands may run at once. Bands never share chroma rows.
+ * The order of the bands does not matter.
+ */
 
 /*
  * ---- RGBA8888: four bytes per pixel, in any channel order ------------------------------------
@@ -121,8 +181,8 @@ typedef struct ovrin_rgba_band {
     int32_t di_33;     /* ... for (three-quarter row, three-quarter column) */
     int32_t src_w;     /* source size, pixels */
     int32_t src_h;
-    int32_t src_stride; /* source row length, pixels */
-    int32_t src_rows;   /* rows in the source buffer */
+    int32_t src_stride; /* source row length, pixels; not used without a canvas */
+    int32_t src_rows;   /* rows in the source buffer; not used */
     int32_t dst_w;      /* destination size, pixels */
     int32_t dst_h;
     int32_t dst_x;      /* picture's left edge inside a canvas row, pixels; 0 without a canvas */
@@ -137,16 +197,17 @@ typedef struct ovrin_rgba_band {
 
 /*
  * Moves a band record to the following band without touching pixels: advances the running state by
- * band->band_rows source rows, sets rows_to_do to the rows walked (0 when that passes src_h), and
- * adds their bytes to src_offset. Writes no other field.
+ * band->band_rows source rows, adds their bytes to src_offset, and sets rows_to_do to the rows of
+ * the band that it leaves: band_rows, or 0 when these pass src_h. Writes no other field, and of the
+ * record's reads these and band_rows only.
  */
 OVRIN_API void ovrin_resize_rgba8888_get_pos(int32_t src_w, int32_t src_h, int32_t dst_w,
                                              int32_t dst_h, ovrin_rgba_band* band);
 
 /*
  * Band task; band points to an ovrin_rgba_band. Adds the samples of rows_to_do source rows to what
- * the destination holds (the caller clears it beforehand), then sets done. Bands that add into one
- * destination row must not run at the same time.
+ * the destination holds (the caller clears it beforehand), then sets done. "Bands" above says which
+ * may run at the same time.
  */
 OVRIN_API void _resize_rgba8888_tp(void* band);
 
@@ -168,7 +229,9 @@ OVRIN_API void _resize_rgba8888_tp(void* band);
  * Returns without touching anything if canvas_width < dst_x, or canvas_height < dst_height (not
  * dst_y), or dst_height is 0. From 1024 source rows on as ovrin_resize_rgba_keep_ratio_tps, below
  * that as ovrin_resize_rgba_keep_ratio_sg: they differ for a src_stride of 0 or less, and for a
- * rectangle that begins at canvas row canvas_height.
+ * rectangle that begins at canvas row canvas_height. Set src_stride, also where rows are packed:
+ * with 0 every row of a picture below 1024 rows is its first one. From there on 0 stands for the
+ * source width, except where the calling thread does the work alone.
  */
 OVRIN_API void ovrin_resize_rgba8888_keep_ratio(const uint8_t* src, int32_t src_w, int32_t src_h,
                                                 ovrin_resize_target* target);
@@ -270,7 +333,9 @@ OVRIN_API void ovrin_resize_y_u_v(const uint8_t* src_y, const uint8_t* src_u, co
 /*
  * Three source planes into an I420 canvas: as ovrin_resize_y_u_v_sg below 1024 source rows, as
  * ovrin_resize_y_u_v_tps from there on. They differ for a src_stride of 0 or less, and in which
- * placements they turn down.
+ * placements they turn down. Set src_stride, also where rows are packed: with 0 every row of a
+ * picture below 1024 rows is its first one, in all planes. From there on 0 stands for src_w, except
+ * where the calling thread does the work alone.
  */
 OVRIN_API void ovrin_resize_y_u_v_keep_ratio(const uint8_t* src_y, const uint8_t* src_u,
                                              const uint8_t* src_v, int32_t src_w, int32_t src_h,
@@ -303,6 +368,15 @@ OVRIN_API void ovrin_resize_y_u_v_tps(const uint8_t* src_y, const uint8_t* src_u
  * once for the two chroma planes together; indices count bytes from the start of the plane in the
  * work buffer or destination. "Top" is the quarter point of a destination row, "left" that of a
  * column.
+ *
+ * The work buffer is a picture of W x H, the destination's size rounded up to multiples of 4:
+ *
+ *     luma     H rows of W bytes
+ *     chroma   U, then V, each H / 2 rows of W / 2 bytes; in NV21 H / 2 rows of W / 2 pairs
+ *
+ * 3 * W * H / 2 bytes in all. When all bands are done, the caller copies the result out of it: of
+ * the first dst_height luma rows the first dst_width bytes, and of each chroma plane's first
+ * (dst_height + 1) / 2 rows the first (dst_width + 1) / 2 samples.
  */
 typedef struct ovrin_yuv_band {
     int32_t y_start_row; /* luma rows before this band; 0: the points below are not set yet */
@@ -323,8 +397,8 @@ typedef struct ovrin_yuv_band {
     int32_t uv_bottom_right;
     int32_t src_width; /* source size, pixels */
     int32_t src_height;
-    int32_t src_row_bytes; /* from one source luma row to the next */
-    int32_t src_rows;      /* rows in the source buffer */
+    int32_t src_row_bytes; /* from one source luma row to the next; contiguous: src_width */
+    int32_t src_rows;      /* rows in the source buffer; not used */
     int32_t dst_width;     /* size of the scaled picture, pixels */
     int32_t dst_height;
     int32_t band_rows;     /* luma rows in a band */
@@ -341,18 +415,23 @@ typedef struct ovrin_yuv_band {
 } ovrin_yuv_band;
 
 /*
- * Moves a band record to the following band without touching pixels, and sets y_rows and uv_rows to
- * the rows of the band just walked. A band has band_rows luma rows; its chroma is a quarter of
- * that, rounded up, and then as many rows more as it takes to complete a destination row. Luma rows
- * beyond the source give y_rows 0, chroma rows beyond it are cut off. src_width is not used.
+ * Moves a band record to the following band without touching pixels: advances the running state,
+ * adds the bytes of the rows walked to src_y_offset and src_uv_offset, and sets y_rows and uv_rows
+ * to the rows of the band that it leaves. Writes no other field, and of the record's reads these,
+ * band_rows and src_row_bytes only. src_width is not used.
+ *
+ * A band has band_rows luma rows; its chroma is a quarter of that, rounded up, and then as many
+ * rows more as it takes to complete a destination row. Luma rows beyond the source give y_rows 0,
+ * chroma rows beyond it are cut off. As luma goes ahead of chroma, about half of the chroma is left
+ * for the last band.
  */
 OVRIN_API void ovrin_resize_yuv420_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
                                            int32_t dst_height, ovrin_yuv_band* band);
 
 /*
  * Band task for a source in three planes; band points to an ovrin_yuv_band. Adds to what the work
- * buffer holds or, without one, the destination, then sets done. Where a work buffer is needed and
- * missing it only sets done.
+ * buffer holds or, without one, the destination, then sets done. A work buffer is needed where the
+ * destination's width or height is not a multiple of 4; without it the task then only sets done.
  */
 OVRIN_API void _resize_y_u_v_tp(void* band);
 
@@ -378,7 +457,10 @@ OVRIN_API void ovrin_resize_nv21_tps(const uint8_t* src, uint8_t* dst, int32_t s
 OVRIN_API void ovrin_resize_y_nv21(const uint8_t* src_y, const uint8_t* src_vu, uint8_t* dst,
                                    int32_t src_w, int32_t src_h, int32_t dst_w, int32_t dst_h);
 
-/* Luma and chroma plane apart, into an NV21 canvas. As ovrin_resize_y_u_v_keep_ratio. */
+/*
+ * Luma and chroma plane apart, into an NV21 canvas. As ovrin_resize_y_u_v_keep_ratio, also for a
+ * src_stride of 0.
+ */
 OVRIN_API void ovrin_resize_y_nv21_keep_ratio(const uint8_t* src_y, const uint8_t* src_vu,
                                               int32_t src_w, int32_t src_h,
                                               const ovrin_resize_target* target);
@@ -431,7 +513,9 @@ typedef struct ovrin_nv21_band {
 
 /*
  * As ovrin_resize_yuv420_get_pos, except that a chroma band which does not end on a destination row
- * takes all chroma rows that are left, and the bands after it get none.
+ * takes all chroma rows that are left, and the bands after it get none. src_vu_offset moves by
+ * src_width, not src_row_bytes, for each of those rows: the chroma of rows that are longer than
+ * their pixels asks for src_row_bytes as the argument src_width.
  */
 OVRIN_API void ovrin_resize_nv21_get_pos(int32_t src_width, int32_t src_height, int32_t dst_width,
                                          int32_t dst_height, ovrin_nv21_band* band);

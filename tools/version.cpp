@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "version.h"
 
+#include <ovrinresize.h>
+
 // The library's own look at the processor, compiled in: it does not tell its choice.
 #include "kernels/cpu.h"
 

@@ -18,6 +18,6 @@ expected='ANDROID_ABI=arm64-v8a
 ANDROID_PLATFORM=android-21
 ANDROID_STL=none'
 diff <(echo "$expected") "$build/ndk-settings.txt"
-[[ $(find "$build" -maxdepth 1 -name 'libovrinresize*') == "$build/libovrinresize.so" ]]
+[[ $(find "$build" -maxdepth 1 -name 'libovrinresize.so*') == "$build/libovrinresize.so" ]]
 DESTDIR=$directory/installed cmake --install "$build" --prefix /
 [[ $(cd "$directory/installed" && find . -name '*.so*') == ./lib/libovrinresize.so ]]

@@ -1,13 +1,15 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
 # install.sh BUILD_DIR LIBDIR TREE: programs find, link and run the library in an installed tree,
-# through the CMake package and through pkg-config, also after the tree has been moved.
+# shared and static, through the CMake package, through pkg-config and Meson, by the compiler alone and by the
+# dynamic loader, also after the tree has been moved; then all of it is removed again.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 source "$here/skip.sh"
 build_dir=$1
 libdir=$2
 tree=$3
+compile=("$CC" -std=c99 -Wall -Wextra -Werror)
 
 run() {
     # shellcheck disable=SC2086 # the emulator's own arguments
@@ -21,18 +23,61 @@ through_cmake() {
         ${TOOLCHAIN:+-DCMAKE_TOOLCHAIN_FILE="$TOOLCHAIN"} >"$tree/configure.log"
     "$CMAKE" --build "$build" >"$tree/build.log"
     run "$build/consumer"
+    run "$build/static_consumer"
+    needs_library "$build/consumer"
+    needs_none "$build/static_consumer"
 }
 
-# through_pkg_config PREFIX SOURCE
+# through_pkg_config PREFIX
 through_pkg_config() {
-    local prefix=$1 flags
+    local prefix=$1 program=$tree/pkg-config-consumer flags
     export PKG_CONFIG_LIBDIR=$prefix/$libdir/pkgconfig
     flags=$(pkg-config --cflags --libs ovrinresize)
     # shellcheck disable=SC2086 # a list of flags
-    "$CC" -std=c99 -Wall -Wextra -Werror "$2" -o "$tree/pkg-config-consumer" \
-        $flags -Wl,-rpath,"$prefix/$libdir"
-    run "$tree/pkg-config-consumer"
+    "${compile[@]}" "$here/consumer/consumer.c" -o "$program" $flags -Wl,-rpath,"$prefix/$libdir"
+    run "$program"
+    flags=$(pkg-config --static --cflags --libs ovrinresize)
+    # shellcheck disable=SC2086 # a list of flags
+    "${compile[@]}" -static "$here/consumer/consumer.c" -o "$program" $flags
+    run "$program"
+    needs_none "$program"
 }
+
+# Meson would want a file of its own to compile for another machine.
+through_meson() {
+    local prefix=$1 build=$tree/meson-consumer kind
+    [[ ! $TOOLCHAIN ]] || return 0
+    if ! command -v meson >/dev/null; then
+        echo "not tested: no Meson here"
+        return 0
+    fi
+    for kind in shared static; do
+        rm -rf "$build"
+        PKG_CONFIG_LIBDIR=$prefix/$libdir/pkgconfig CC=$CC \
+            meson setup "$build" "$here/consumer" -Dkind="$kind" >"$tree/meson.log"
+        meson compile -C "$build" >>"$tree/meson.log"
+        run "$build/consumer"
+        if [[ $kind == shared ]]; then needs_library "$build/consumer"; else needs_none "$build/consumer"; fi
+    done
+}
+
+by_compiler() {
+    local prefix=$1 program=$tree/compiler-consumer
+    "${compile[@]}" "$here/consumer/consumer.c" -o "$program" -I "$prefix/include" \
+        -L "$prefix/$libdir" -lovrinresize -Wl,-rpath,"$prefix/$libdir"
+    run "$program"
+}
+
+by_loader() {
+    local names
+    names=$("$CC" -E "$1/include/ovrinresize.h" | awk -f "$here/declared.awk")
+    "${compile[@]}" "$here/load.c" -o "$tree/load" -ldl
+    # shellcheck disable=SC2086 # a list of names
+    run "$tree/load" "$1/$libdir/libovrinresize.so" $names
+}
+
+needs_library() { "$READELF" -dW "$1" | grep -q 'NEEDED.*libovrinresize'; }
+needs_none() { ! "$READELF" -dW "$1" | grep -E 'NEEDED.*(libovrinresize|libstdc)'; }
 
 # Cross builds have no tool.
 installed_tool() {
@@ -43,14 +88,27 @@ installed_tool() {
 check() {
     echo "in $1"
     through_cmake "$1"
-    through_pkg_config "$1" "$here/consumer/consumer.c"
-    through_pkg_config "$1" "$SOURCE_DIR/examples/shrink.c"
+    through_pkg_config "$1"
+    through_meson "$1"
+    by_compiler "$1"
+    by_loader "$1"
     installed_tool "$1"
 }
 
 rm -rf "$tree"
 mkdir -p "$tree"
 "$CMAKE" --install "$build_dir" --prefix "$tree/first" >"$tree/install.log"
+for file in LICENSE README.md docs/testing.md examples/shrink.c; do
+    cmp "$SOURCE_DIR/$file" "$tree/first/share/doc/ovrinresize/$file"
+done
 check "$tree/first"
 mv "$tree/first" "$tree/moved"
 check "$tree/moved"
+
+mv "$tree/moved" "$tree/first"
+"$CMAKE" --build "$build_dir" --target uninstall >"$tree/uninstall.log"
+left=$(find "$tree/first" -type f -o -type l -o -name '*ovrinresize*')
+if [[ $left ]]; then
+    printf 'FAIL: left after uninstalling:\n%s\n' "$left"
+    exit 1
+fi

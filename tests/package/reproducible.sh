@@ -10,8 +10,7 @@ build=$1
 # copy TREE: the sources in a folder of their own.
 copy() {
     mkdir -p "$1"
-    cp -R "$source_dir/CMakeLists.txt" "$source_dir/cmake" "$source_dir/include" \
-        "$source_dir/src" "$1"
+    cp -R "$source_dir"/{*.md,CMakeLists.txt,LICENSE,cmake,docs,examples,include,src} "$1"
 }
 
 # make TREE FOLDER JOBS: builds and installs, as it is and stripped.

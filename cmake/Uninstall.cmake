@@ -1,0 +1,21 @@
+# SPDX-License-Identifier: Apache-2.0
+# cmake -DMANIFEST=install_manifest.txt -P Uninstall.cmake: removes the files that the last installation
+# wrote, and then the folders of the library's own name that are empty.
+if(NOT EXISTS ${MANIFEST})
+  message(FATAL_ERROR "Nothing has been installed from here: there is no ${MANIFEST}")
+endif()
+file(STRINGS ${MANIFEST} files)
+foreach(file IN LISTS files)
+  set(path $ENV{DESTDIR}${file})
+  message(STATUS "Removing: ${path}")
+  file(REMOVE ${path})
+  get_filename_component(folder ${path} DIRECTORY)
+  while(folder MATCHES "/ovrinresize(/|$)" AND EXISTS ${folder})
+    file(GLOB rest ${folder}/*)
+    if(rest)
+      break()
+    endif()
+    file(REMOVE_RECURSE ${folder})
+    get_filename_component(folder ${folder} DIRECTORY)
+  endwhile()
+endforeach()
