@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-# Header, library, CMake package and pkg-config file.
+# Headers, library, CMake package and pkg-config file.
 include(CMakePackageConfigHelpers)
 
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/ovrinresize)
@@ -7,6 +7,7 @@ set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/ovrinresize)
 install(TARGETS ovrinresize EXPORT ovrinresizeTargets
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
 install(FILES ${PROJECT_SOURCE_DIR}/include/ovrinresize.h
+  ${PROJECT_SOURCE_DIR}/include/ovrinresize.hpp
   DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(EXPORT ovrinresizeTargets NAMESPACE ovrinresize:: DESTINATION ${package_dir}
   FILE ovrinresizeTargets.cmake)

@@ -25,6 +25,12 @@
 #include <pthread.h>
 #include <stdint.h>
 
+/* The version of the library that this header belongs to. */
+#define OVRINRESIZE_VERSION_MAJOR 1
+#define OVRINRESIZE_VERSION_MINOR 0
+#define OVRINRESIZE_VERSION_PATCH 0
+#define OVRINRESIZE_VERSION "1.0.0"
+
 #if defined(__GNUC__)
 #define OVRIN_API __attribute__((visibility("default")))
 #else
