@@ -334,47 +334,45 @@ Status check_one_buffer(const BasicView<Byte>& view, const char* name) {
     return {};
 }
 
-// The name of a plane in messages: nothing where the format has only one.
-inline const char* plane_name(const Layout& layout, int i) {
-    return layout.planes == 1 ? "" : layout.plane[i].name;
+// The sentence begins "src: U plane of I420 8x6", without a plane where the format has only one.
+template <class Byte, class... Parts>
+Status fail_plane(ErrorCode code, const BasicView<Byte>& view, int i, const char* name,
+                  Parts... parts) {
+    const Layout& layout = layout_of(view.format);
+    const bool only_one = layout.planes == 1;
+    return fail(code, name, ": ", only_one ? "" : layout.plane[i].name,
+                only_one ? "" : " plane of ", layout.name, " ", Size{view.width, view.height},
+                parts...);
 }
 
 template <class Byte>
 Status check_plane(const BasicView<Byte>& view, int i, const char* name) {
-    const Layout& layout = layout_of(view.format);
-    const Size picture = {view.width, view.height};
-    const auto wrong = [&](ErrorCode code, const char* what, int64_t needed, const char* but,
-                           int64_t has) {
-        const char* of = layout.planes == 1 ? "" : " plane of ";
-        return fail(code, name, ": ", plane_name(layout, i), of, layout.name, " ", picture, what,
-                    needed, but, has);
-    };
     const BasicPlane<Byte> plane = view.planes[i];
+    const PlaneLayout& layout = layout_of(view.format).plane[i];
     if (plane.data == nullptr) {
-        const char* of = layout.planes == 1 ? "" : " plane of ";
-        return fail(ErrorCode::kNull, name, ": ", plane_name(layout, i), of, layout.name, " ",
-                    picture, " is at null");
+        return fail_plane(ErrorCode::kNull, view, i, name, " is at null");
     }
-    const int64_t sample = layout.plane[i].sample;
+    const int64_t sample = layout.sample;
     const int64_t pixel = plane.pixel_stride == 0 ? sample : plane.pixel_stride;
     if (pixel < sample) {
-        return wrong(ErrorCode::kStrideTooSmall, " needs a pixel stride of ", sample,
-                     " bytes, has ", pixel);
+        return fail_plane(ErrorCode::kStrideTooSmall, view, i, name, " needs a pixel stride of ",
+                          sample, " bytes, has ", pixel);
     }
-    const Size size = plane_size(layout.plane[i], view.width, view.height);
+    const Size size = plane_size(layout, view.width, view.height);
     const int64_t row = (size.width - 1) * pixel + sample;
     const int64_t stride = plane.row_stride == 0 ? size.width * pixel : plane.row_stride;
     if (stride < row) {
-        return wrong(ErrorCode::kStrideTooSmall, " needs a row stride of ", row, " bytes, has ",
-                     stride);
+        return fail_plane(ErrorCode::kStrideTooSmall, view, i, name, " needs a row stride of ", row,
+                          " bytes, has ", stride);
     }
     if (stride > INT32_MAX) {
-        return wrong(ErrorCode::kTooLarge, " has rows of ", stride, " bytes, limit ", INT32_MAX);
+        return fail_plane(ErrorCode::kTooLarge, view, i, name, " has rows of ", stride,
+                          " bytes, limit ", int64_t{INT32_MAX});
     }
     const int64_t needed = (size.height - 1) * stride + row;
     if (count(plane.bytes) < needed) {
-        return wrong(ErrorCode::kBufferTooSmall, " needs ", needed, " bytes, has ",
-                     count(plane.bytes));
+        return fail_plane(ErrorCode::kBufferTooSmall, view, i, name, " needs ", needed,
+                          " bytes, has ", count(plane.bytes));
     }
     return {};
 }
