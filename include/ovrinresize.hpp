@@ -433,16 +433,28 @@ inline Status check_overlap(const ConstView& src, const View& dst, const char* d
     return {};
 }
 
-// Planes of a destination may interleave, as U and V of a camera do, but not share a sample.
+// Planes whose samples take turns, as U and V of a camera do, share bytes but no sample.
+inline bool interleave(const Plane& a, int32_t sample_a, const Plane& b, int32_t sample_b) {
+    if (a.pixel_stride != b.pixel_stride || a.row_stride != b.row_stride ||
+        a.row_stride % a.pixel_stride != 0) {
+        return false;
+    }
+    const auto turn = static_cast<uintptr_t>(a.pixel_stride);
+    const uintptr_t first_a = reinterpret_cast<uintptr_t>(a.data) % turn;
+    const uintptr_t first_b = reinterpret_cast<uintptr_t>(b.data) % turn;
+    const uintptr_t offset = (first_a + turn - first_b) % turn;
+    return offset >= static_cast<uintptr_t>(sample_b) &&
+           turn - offset >= static_cast<uintptr_t>(sample_a);
+}
+
 inline Status check_shared_planes(const View& dst, const char* name) {
     const Layout& layout = layout_of(dst.format);
     const Planes<uint8_t> planes(dst);
     const Size size = {dst.width, dst.height};
     for (int i = 0; i < layout.planes; ++i) {
         for (int k = 0; k < i; ++k) {
-            const bool interleaved = planes.at[i].data != planes.at[k].data &&
-                                     planes.at[i].pixel_stride > layout.plane[i].sample &&
-                                     planes.at[k].pixel_stride == planes.at[i].pixel_stride;
+            const bool interleaved = interleave(planes.at[i], layout.plane[i].sample, planes.at[k],
+                                                layout.plane[k].sample);
             if (interleaved || !meet(span_of(planes.at[i], layout.plane[i], size),
                                      span_of(planes.at[k], layout.plane[k], size))) {
                 continue;

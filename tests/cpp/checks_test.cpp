@@ -246,6 +246,18 @@ TEST(CppChecks, PlanesOfOneDestination) {
     EXPECT_TRUE(resize(pair.source(), ovrin::i420_view(y, odd, even, 8, 6)).ok());
     EXPECT_EQ(resize(pair.source(), ovrin::i420_view(y, even, even, 8, 6)).code,
               ErrorCode::kOverlap);
+    // Not taking turns: other steps from sample to sample, from row to row, or steps that do not
+    // fit the rows, so that one plane's row ends on the next one's first sample.
+    Bytes more(60);
+    const auto code = [&](const Plane& first, const Plane& second) {
+        return resize(pair.source(), ovrin::i420_view(y, first, second, 8, 6)).code;
+    };
+    uint8_t* const at = more.data();
+    EXPECT_EQ(code({at, 50, 12, 2}, {at + 1, 50, 12, 3}), ErrorCode::kOverlap);
+    EXPECT_EQ(code({at, 50, 12, 2}, {at + 1, 50, 14, 2}), ErrorCode::kOverlap);
+    EXPECT_EQ(code({at, 50, 7, 2}, {at + 1, 50, 7, 2}), ErrorCode::kOverlap);
+    EXPECT_EQ(code({at, 50, 12, 2}, {at + 2, 50, 12, 2}), ErrorCode::kOverlap);
+    EXPECT_EQ(code({at, 50, 12, 3}, {at + 2, 50, 12, 3}), ErrorCode::kOk);
 }
 
 TEST(CppChecks, UnknownFormats) {
