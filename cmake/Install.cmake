@@ -1,5 +1,5 @@
 # SPDX-License-Identifier: Apache-2.0
-# Header, libraries, CMake package, pkg-config file, licence and documents.
+# Headers, libraries, CMake package, pkg-config file, licence and documents.
 include(CMakePackageConfigHelpers)
 
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/ovrinresize)
@@ -15,6 +15,7 @@ install(TARGETS ${libraries} EXPORT ovrinresizeTargets
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development
   INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(FILES ${PROJECT_SOURCE_DIR}/include/ovrinresize.h
+  ${PROJECT_SOURCE_DIR}/include/ovrinresize.hpp
   DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} COMPONENT development)
 install(EXPORT ovrinresizeTargets NAMESPACE ovrinresize:: DESTINATION ${package_dir}
   FILE ovrinresizeTargets.cmake COMPONENT development)
