@@ -45,9 +45,10 @@ split_loops() {
 # set different costs for one and the same access: on the A55 an ldr takes one cycle, an ld1 two, as
 # the processor's path of 64 bits does, and an ldp six; on the N1 an str costs twice as much as an
 # st1. The choice is the compiler's, and would hide what the kernels do. An offset's register stands
-# for the address.
+# for the address. A prefetch below its address is a prfum; g++ leaves it to its assembler to say so.
 even_out() {
     awk '
+        /^\tprfm\t.*, -[0-9]+\]/ { sub("prfm", "prfum") }
         !/^\t(ldr|ldur|ldp|ldnp|str|stur|stp|stnp)\tq/ { print; next }
         {
             count = split($0, part, /[][, \t]+/)
