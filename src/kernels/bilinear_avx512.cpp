@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 // Blended bilinear rows with AVX-512: one window and one shuffle for four quads.
 #include "kernels/bilinear_quads_inl.h"
-#include "kernels/intrinsics_avx512.h"
+#include "kernels/intrinsics_avx512_inl.h"
 #include "kernels/sets.h"
 
 namespace ovrin {

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 // Lanczos rows with AVX-512; see lanczos_approximation_inl.h for how the byte is decided.
-#include "kernels/intrinsics_avx512.h"
+#include "kernels/intrinsics_avx512_inl.h"
 #include "kernels/lanczos_approximation_inl.h"
 #include "kernels/lanczos_x86_inl.h"
 #include "kernels/sets.h"
