@@ -179,17 +179,23 @@ std::vector<Case> all_cases() {
     return list.take();
 }
 
-std::vector<Contender> contenders_of(const Case& test) {
-    std::vector<Contender> all;
-    const auto add_ours = [&](Role role, const char* name, OurCall* call) {
+std::vector<Contender> contenders_of(const Case& test,
+                                     const std::vector<ovrin::NamedKernels>& sets) {
+    std::vector<Contender> all = limits_of(test.job, test.sampling);
+    const auto add_ours = [&](Role role, const char* name, OurCall* call,
+                              const ovrin::NamedKernels& set) {
         if (call == nullptr) return;
-        all.push_back({role, name, [call, job = test.job](const Picture& src, const Picture& dst) {
-                           call(job, src, dst);
-                       }});
+        const auto run = [call, job = test.job, kernels = set.kernels](const Picture& src,
+                                                                       const Picture& dst) {
+            ovrin::force_kernels(*kernels);
+            call(job, src, dst);
+        };
+        all.push_back({role, name, run, set.name});
     };
-    add_ours(Role::kSingle, "one thread", test.ours.single);
-    add_ours(Role::kWrapper, "wrapper", test.ours.wrapper);
-    all.push_back(limit_of(test.job, test.sampling));
+    for (const ovrin::NamedKernels& set : sets) {
+        add_ours(Role::kSingle, "one thread", test.ours.single, set);
+        add_ours(Role::kWrapper, "wrapper", test.ours.wrapper, set);
+    }
     for (const auto& peers : {libyuv_contenders, opencv_contenders, swscale_contenders}) {
         for (Contender& peer : peers(test.job, test.peer_filters)) {
             all.push_back(test.job.letterboxed() ? letterboxed(std::move(peer), test.job)

@@ -2,6 +2,7 @@
 // What is measured.
 #pragma once
 
+#include "kernels/kernels.h"
 #include "ours.h"
 
 namespace bench {
@@ -17,7 +18,8 @@ struct Case {
 
 std::vector<Case> all_cases();
 
-// Ours, the limit and the peers.
-std::vector<Contender> contenders_of(const Case& test);
+// Ours with each of these sets of kernels, the limits and the peers.
+std::vector<Contender> contenders_of(const Case& test,
+                                     const std::vector<ovrin::NamedKernels>& sets);
 
 }  // namespace bench

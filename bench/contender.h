@@ -18,12 +18,14 @@ enum class Role {
     kWrapper,  // our export that may use threads
     kLimit,    // what memory alone would cost
     kPeer,
+    kCopier,  // a peer whose filter copies single samples here: no work to compare a filter with
 };
 
 struct Contender {
     Role role;
     std::string name;
     Resize run;
+    std::string set = {};  // of our exports: the kernels
 };
 
 // Kinds of filters that peers offer, as bits.
@@ -59,8 +61,9 @@ struct Job {
 // Which source rows a rule touches for a target row.
 enum class Sampling { kQuarter, kPoint, kBilinear, kEveryRow };
 
-// Reads every cache line of the sampled rows once and writes the destination once.
-Contender limit_of(const Job& job, Sampling sampling);
+// Read every cache line of the sampled rows once and write the destination once: the rows one after
+// the other, or those of a destination row side by side. Which is faster depends on the job.
+std::vector<Contender> limits_of(const Job& job, Sampling sampling);
 
 // Luma pixels, or pixels, of the rows that are sampled.
 double sampled_pixels(const Job& job, Sampling sampling);

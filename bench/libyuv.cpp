@@ -59,12 +59,12 @@ bool is_odd_ratio(int32_t src, int32_t dst) {
 }
 
 // At odd whole ratios libyuv copies one sample of every cell, unless it averages boxes of a plane.
-// That is no work to compare a filter with.
-bool is_point_sampling(const Job& job, const Filter& filter) {
+Role role_of(const Job& job, const Filter& filter) {
     const bool has_planes = job.layout == Layout::kI420 || job.layout == Layout::kNv21;
-    return filter.kind != kPoint && !(filter.kind == kArea && has_planes) &&
-           is_odd_ratio(job.src.width, job.dst.width) &&
-           is_odd_ratio(job.src.height, job.dst.height);
+    const bool copies = filter.kind != kPoint && !(filter.kind == kArea && has_planes) &&
+                        is_odd_ratio(job.src.width, job.dst.width) &&
+                        is_odd_ratio(job.src.height, job.dst.height);
+    return copies ? Role::kCopier : Role::kPeer;
 }
 
 }  // namespace
@@ -72,10 +72,10 @@ bool is_point_sampling(const Job& job, const Filter& filter) {
 std::vector<Contender> libyuv_contenders(const Job& job, unsigned filters) {
     std::vector<Contender> contenders;
     for (const Filter& filter : kFilters) {
-        if ((filter.kind & filters) == 0 || is_point_sampling(job, filter)) continue;
+        if ((filter.kind & filters) == 0) continue;
         const libyuv::FilterMode mode = filter.mode;
         contenders.push_back(
-            {Role::kPeer, filter.name,
+            {role_of(job, filter), filter.name,
              [mode](const Picture& src, const Picture& dst) { scale(src, dst, mode); }});
     }
     return contenders;

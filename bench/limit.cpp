@@ -25,20 +25,45 @@ struct Line {
 #define WIDE_VECTORS
 #endif
 
-// Loads every cache line that holds bytes of the row, and has those of the next row fetched: the
-// processor's own prefetching, which stops at pages and misses short rows, gets half as far.
-WIDE_VECTORS void read_lines(const uint8_t* row, const uint8_t* next, size_t bytes) {
+// The cache lines that hold bytes of a row.
+struct Lines {
+    const Line* first;
+    size_t count;
+};
+
+Lines lines_of(const uint8_t* row, size_t bytes) {
     const uintptr_t inside = reinterpret_cast<uintptr_t>(row) % kLineBytes;
-    const size_t count = (inside + bytes + kLineBytes - 1) / kLineBytes;
-    const Line* lines = reinterpret_cast<const Line*>(row - inside);
+    return {reinterpret_cast<const Line*>(row - inside),
+            (inside + bytes + kLineBytes - 1) / kLineBytes};
+}
+
+// Loads a row's cache lines, and has those of the next row fetched: the processor's own
+// prefetching, which stops at pages and misses short rows, gets half as far.
+WIDE_VECTORS void read_lines(Lines row, const uint8_t* next) {
     Line::Half low = {}, high = {};
-    for (size_t i = 0; i < count; ++i) {
+    for (size_t i = 0; i < row.count; ++i) {
         __builtin_prefetch(next + i * kLineBytes);
-        low |= lines[i].low;
-        high |= lines[i].high;
+        low |= row.first[i].low;
+        high |= row.first[i].high;
     }
     const Line::Half all = low | high;
     // Somebody takes the value, so the compiler computes it.
+    __asm__ volatile("" : : "m"(all));
+}
+
+// The same for two rows side by side. Where one begins elsewhere in a line than the other, it may
+// take a line more, which is left out.
+WIDE_VECTORS void read_lines_of_two(Lines a, Lines b, const uint8_t* next_a,
+                                    const uint8_t* next_b) {
+    Line::Half low = {}, high = {};
+    const size_t count = a.count < b.count ? a.count : b.count;
+    for (size_t i = 0; i < count; ++i) {
+        __builtin_prefetch(next_a + i * kLineBytes);
+        __builtin_prefetch(next_b + i * kLineBytes);
+        low |= a.first[i].low | b.first[i].low;
+        high |= a.first[i].high | b.first[i].high;
+    }
+    const Line::Half all = low | high;
     __asm__ volatile("" : : "m"(all));
 }
 
@@ -80,22 +105,33 @@ PlaneRows sampled_rows(Sampling sampling, int32_t s, int32_t d) {
     return plane;
 }
 
+enum class Order { kOneByOne, kSideBySide };
+
+// Reads the rows from the `read`th to before the `until`th.
+void read_rows(const Plane& src, const std::vector<int32_t>& rows, size_t read, size_t until,
+               Order order) {
+    const auto row = [&](size_t i) { return src.row(rows[i < rows.size() ? i : rows.size() - 1]); };
+    const auto lines = [&](size_t i) { return lines_of(row(i), src.row_bytes()); };
+    for (; order == Order::kSideBySide && read + 2 <= until; read += 2) {
+        read_lines_of_two(lines(read), lines(read + 1), row(read + 2), row(read + 3));
+    }
+    for (; read < until; ++read) read_lines(lines(read), row(read + 1));
+}
+
 // Target rows are written in step with the reading; the rest of a canvas comes last.
-void stream_plane(const Plane& src, const Plane& canvas, const PlaneRows& plane) {
+void stream_plane(const Plane& src, const Plane& canvas, const PlaneRows& plane, Order order) {
     size_t read = 0;
     for (size_t y = 0; y < static_cast<size_t>(canvas.size.height); ++y) {
         const size_t until = y < plane.touched.size() ? plane.touched[y] : read;
-        for (; read < until; ++read) {
-            const size_t next = read + 1 < plane.rows.size() ? read + 1 : read;
-            read_lines(src.row(plane.rows[read]), src.row(plane.rows[next]), src.row_bytes());
-        }
+        read_rows(src, plane.rows, read, until, order);
+        read = until;
         memset(canvas.row(static_cast<int32_t>(y)), 0, canvas.row_bytes());
     }
 }
 
 }  // namespace
 
-Contender limit_of(const Job& job, Sampling sampling) {
+std::vector<Contender> limits_of(const Job& job, Sampling sampling) {
     const Picture src = picture_at(nullptr, job.layout, job.src);
     const Picture dst = picture_at(nullptr, job.layout, job.dst);
     std::vector<PlaneRows> rows;
@@ -103,11 +139,15 @@ Contender limit_of(const Job& job, Sampling sampling) {
         rows.push_back(
             sampled_rows(sampling, src.planes[p].size.height, dst.planes[p].size.height));
     }
-    return {Role::kLimit, "limit", [rows](const Picture& from, const Picture& canvas) {
-                for (size_t p = 0; p < rows.size(); ++p) {
-                    stream_plane(from.planes[p], canvas.planes[p], rows[p]);
-                }
-            }};
+    const auto limit = [&](const char* name, Order order) -> Contender {
+        return {Role::kLimit, name, [rows, order](const Picture& from, const Picture& canvas) {
+                    for (size_t p = 0; p < rows.size(); ++p) {
+                        stream_plane(from.planes[p], canvas.planes[p], rows[p], order);
+                    }
+                }};
+    };
+    return {limit("limit, row after row", Order::kOneByOne),
+            limit("limit, rows side by side", Order::kSideBySide)};
 }
 
 double sampled_pixels(const Job& job, Sampling sampling) {

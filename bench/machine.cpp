@@ -6,7 +6,6 @@
 #include <fstream>
 
 #include "contender.h"
-#include "kernels/kernels.h"
 
 namespace bench {
 
@@ -23,13 +22,11 @@ std::string processor() {
     return "unknown processor";
 }
 
-std::string kernels_in_use() {
-    ovrin::NamedKernels sets[ovrin::kMaxSets];
-    const int32_t count = ovrin::available_kernels(sets);
-    for (int32_t i = 0; i < count; ++i) {
-        if (sets[i].kernels == &ovrin::kernels()) return sets[i].name;
-    }
-    return "unknown";
+std::string names_of(const std::vector<ovrin::NamedKernels>& sets) {
+    std::string names;
+    for (const ovrin::NamedKernels& set : sets)
+        names += (names.empty() ? "" : ", ") + std::string(set.name);
+    return names;
 }
 
 std::string compiler() {
@@ -42,23 +39,17 @@ std::string compiler() {
 
 }  // namespace
 
-bool choose_kernels(const std::string& name) {
-    if (name.empty()) return true;
+std::vector<ovrin::NamedKernels> all_sets() {
     ovrin::NamedKernels sets[ovrin::kMaxSets];
     const int32_t count = ovrin::available_kernels(sets);
-    for (int32_t i = 0; i < count; ++i) {
-        if (name != sets[i].name) continue;
-        ovrin::force_kernels(*sets[i].kernels);
-        return true;
-    }
-    return false;
+    return {sets, sets + count};
 }
 
-std::vector<std::string> describe_machine() {
+std::vector<std::string> describe_machine(const std::vector<ovrin::NamedKernels>& sets) {
     return {
         "processor: " + processor() + ", " + std::to_string(sysconf(_SC_NPROCESSORS_ONLN)) +
             " cores",
-        "our kernels: " + kernels_in_use() + ", compiled by " + compiler(),
+        "our kernels: " + names_of(sets) + "; compiled by " + compiler(),
         "peers, one thread each: " + libyuv_version() + ", " + opencv_version() + ", " +
             swscale_version(),
     };

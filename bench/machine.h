@@ -4,13 +4,14 @@
 #include <string>
 #include <vector>
 
+#include "kernels/kernels.h"
+
 namespace bench {
 
-// Picks the library's kernels by the name of their set; an empty name leaves the library's choice.
-// False when this processor does not have them.
-bool choose_kernels(const std::string& name);
+// The sets of kernels that this processor has, the library's choice last.
+std::vector<ovrin::NamedKernels> all_sets();
 
-// What a measurement depends on, one fact a line.
-std::vector<std::string> describe_machine();
+// What a measurement with these sets depends on, one fact a line.
+std::vector<std::string> describe_machine(const std::vector<ovrin::NamedKernels>& sets);
 
 }  // namespace bench

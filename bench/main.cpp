@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
-#include <getopt.h>
-#include <stdlib.h>
-
+#include <CLI/CLI.hpp>
+#include <algorithm>
 #include <exception>
 #include <fstream>
 #include <iostream>
+#include <stdexcept>
 
 #include "chart.h"
 #include "kernel_bench.h"
@@ -17,25 +17,9 @@ using namespace bench;
 
 namespace {
 
-constexpr char kUsage[] =
-    "Measures the library beside its peers and prints one table; without a filter, another of "
-    "what\n"
-    "threads cost.\n"
-    "\n"
-    "  --filter TEXT   only cases whose family or name holds TEXT\n"
-    "  --isa SET       our kernels: scalar, avx2 or avx512 (default: the library's choice)\n"
-    "  --rounds N      samples of each contender in a case (default 31)\n"
-    "  --cold          before every call, drop both pictures from the caches\n"
-    "  --quick         few and short samples: a first impression\n"
-    "  --json FILE     write all numbers\n"
-    "  --chart FILE    write what bench/chart.gp draws\n"
-    "  --stack         measure instead how much stack our calls take\n"
-    "  --threads       measure instead what threads cost\n"
-    "  --kernels       measure instead each kernel of each set alone\n";
-
 struct Options {
     std::string filter;
-    std::string isa;
+    std::string isa = "best";
     std::string json;
     std::string chart;
     Effort effort = {Caches::kWarm, 31, 5e-4, 8};
@@ -44,73 +28,50 @@ struct Options {
     bool kernels = false;
 };
 
-[[noreturn]] void give_up(const std::string& why) {
-    std::cerr << "bench: " << why << '\n';
-    exit(2);
+std::vector<std::string> isa_names() {
+    std::vector<std::string> names = {"best", "all"};
+    for (const ovrin::NamedKernels& set : all_sets()) names.push_back(set.name);
+    return names;
 }
 
-int positive_number(const char* text) {
-    char* end = nullptr;
-    const long number = strtol(text, &end, 10);
-    if (*end != '\0' || number < 1 || number > 1000000) {
-        give_up(std::string("'") + text + "' is no number from 1 to 1000000");
-    }
-    return static_cast<int>(number);
+void declare(CLI::App* app, Options* options) {
+    app->add_option("--filter", options->filter, "Only cases whose family or name holds this text")
+        ->type_name("TEXT");
+    app->add_option("--isa", options->isa, "Our kernels: those of a set, the best, or of all sets")
+        ->type_name("SET")
+        ->check(CLI::IsMember(isa_names()))
+        ->capture_default_str();
+    app->add_option("--rounds", options->effort.rounds, "Samples of each contender in a case")
+        ->type_name("N")
+        ->check(CLI::Range(1, 1000000))
+        ->capture_default_str();
+    const auto be_cold = [=] { options->effort.caches = Caches::kCold; };
+    app->add_flag_callback("--cold", be_cold,
+                           "Before every call, drop both pictures from the caches");
+    const auto be_quick = [=] {
+        options->effort.rounds = 7;
+        options->effort.least_seconds = 1e-4;
+        options->effort.most_seconds = 1;
+    };
+    app->add_flag_callback("--quick", be_quick, "Few and short samples: a first impression")
+        ->excludes("--rounds");
+    app->add_option("--json", options->json, "Write all numbers")->type_name("FILE");
+    app->add_option("--chart", options->chart, "Write what bench/chart.gp draws")
+        ->type_name("FILE");
+    app->add_flag("--stack", options->stack, "Measure instead how much stack our calls take");
+    app->add_flag("--threads", options->threads, "Measure instead what threads cost");
+    app->add_flag("--kernels", options->kernels, "Measure instead each kernel of each set alone");
 }
 
-Options parse(int argc, char** argv) {
-    static const option kOptions[] = {
-        {"filter", required_argument, nullptr, 'f'}, {"isa", required_argument, nullptr, 'i'},
-        {"rounds", required_argument, nullptr, 'r'}, {"cold", no_argument, nullptr, 'C'},
-        {"quick", no_argument, nullptr, 'q'},        {"json", required_argument, nullptr, 'j'},
-        {"chart", required_argument, nullptr, 'c'},  {"stack", no_argument, nullptr, 's'},
-        {"threads", no_argument, nullptr, 't'},      {"kernels", no_argument, nullptr, 'k'},
-        {"help", no_argument, nullptr, 'h'},         {nullptr, 0, nullptr, 0}};
-    Options options;
-    for (int c; (c = getopt_long(argc, argv, "", kOptions, nullptr)) != -1;) {
-        switch (c) {
-            case 'f':
-                options.filter = optarg;
-                break;
-            case 'i':
-                options.isa = optarg;
-                break;
-            case 'r':
-                options.effort.rounds = positive_number(optarg);
-                break;
-            case 'C':
-                options.effort.caches = Caches::kCold;
-                break;
-            case 'q':
-                options.effort.rounds = 7;
-                options.effort.least_seconds = 1e-4;
-                options.effort.most_seconds = 1;
-                break;
-            case 'j':
-                options.json = optarg;
-                break;
-            case 'c':
-                options.chart = optarg;
-                break;
-            case 's':
-                options.stack = true;
-                break;
-            case 't':
-                options.threads = true;
-                break;
-            case 'k':
-                options.kernels = true;
-                break;
-            case 'h':
-                std::cout << kUsage;
-                exit(0);
-            default:
-                std::cerr << kUsage;
-                exit(2);
-        }
-    }
-    if (optind < argc) give_up(std::string("what is '") + argv[optind] + "'?");
-    return options;
+// The last one is the best.
+std::vector<ovrin::NamedKernels> wanted_sets(const std::string& isa) {
+    std::vector<ovrin::NamedKernels> sets = all_sets();
+    if (isa == "all") return sets;
+    if (isa == "best") return {sets.back()};
+    sets.erase(std::remove_if(sets.begin(), sets.end(),
+                              [&](const ovrin::NamedKernels& set) { return isa != set.name; }),
+               sets.end());
+    return sets;
 }
 
 std::vector<Case> wanted_cases(const std::string& filter) {
@@ -120,26 +81,28 @@ std::vector<Case> wanted_cases(const std::string& filter) {
             wanted.push_back(std::move(test));
         }
     }
-    if (wanted.empty()) give_up("no case holds '" + filter + "'");
+    if (wanted.empty()) throw std::runtime_error("no case holds '" + filter + "'");
     return wanted;
 }
 
-std::vector<Result> run(const std::vector<Case>& cases, const Effort& effort) {
+std::vector<Result> run(const std::vector<Case>& cases,
+                        const std::vector<ovrin::NamedKernels>& sets, const Effort& effort) {
     std::vector<Result> results;
     Table table = result_table(std::cout);
     for (const Case& test : cases) {
-        const std::vector<Contender> contenders = contenders_of(test);
+        const std::vector<Contender> contenders = contenders_of(test, sets);
         results.push_back({test, contenders, measure(test.job, contenders, effort)});
         print_result(table, results.back());
     }
     std::cout << '\n';
     print_means(std::cout, results);
+    print_copiers(std::cout, results);
     return results;
 }
 
 std::ofstream create(const std::string& path) {
     std::ofstream file(path);
-    if (!file) give_up("cannot write " + path);
+    if (!file) throw std::runtime_error("cannot write " + path);
     return file;
 }
 
@@ -149,18 +112,17 @@ void print_lines(const std::vector<std::string>& lines) {
 }
 
 void run_bench(const Options& options) {
-    if (!choose_kernels(options.isa)) {
-        give_up("this processor has no kernels '" + options.isa + "'");
-    }
+    const std::vector<ovrin::NamedKernels> sets = wanted_sets(options.isa);
+    ovrin::force_kernels(*sets.back().kernels);
     if (options.kernels) {
-        print_lines(describe_machine());
+        print_lines(describe_machine(all_sets()));
         if (!print_kernels(std::cout, options.filter, options.effort)) {
-            give_up("no kernel holds '" + options.filter + "'");
+            throw std::runtime_error("no kernel holds '" + options.filter + "'");
         }
         return;
     }
     const std::vector<Case> cases = wanted_cases(options.filter);
-    std::vector<std::string> machine = describe_machine();
+    std::vector<std::string> machine = describe_machine(sets);
     const bool cold = options.effort.caches == Caches::kCold;
     machine.push_back(cold ? "caches: cold" : "caches: warm");
     print_lines(machine);
@@ -172,7 +134,7 @@ void run_bench(const Options& options) {
         print_thread_costs(std::cout, options.effort);
         return;
     }
-    const std::vector<Result> results = run(cases, options.effort);
+    const std::vector<Result> results = run(cases, sets, options.effort);
     if (options.filter.empty()) {
         std::cout << '\n';
         print_thread_costs(std::cout, options.effort);
@@ -190,9 +152,19 @@ void run_bench(const Options& options) {
 }  // namespace
 
 int main(int argc, char** argv) {
+    CLI::App app(
+        "Measures the library beside its peers and prints one table; without a filter, "
+        "another of what threads cost.",
+        "bench");
+    Options options;
+    declare(&app, &options);
     try {
-        run_bench(parse(argc, argv));
+        app.parse(argc, argv);
+        run_bench(options);
+    } catch (const CLI::ParseError& error) {
+        return app.exit(error);
     } catch (const std::exception& error) {
-        give_up(error.what());
+        std::cerr << "bench: " << error.what() << '\n';
+        return 2;
     }
 }

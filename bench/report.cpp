@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <nlohmann/json.hpp>
 #include <ostream>
 
 namespace bench {
@@ -31,11 +32,16 @@ std::string spread(const Quartiles& q) {
     return fixed(50 * (q.high - q.low) / q.median, 0) + " %";
 }
 
-const Samples* samples_of(const Result& result, Role role) {
+const Samples* samples_of(const Result& result, Role role, const std::string& set) {
     for (size_t i = 0; i < result.contenders.size(); ++i) {
-        if (result.contenders[i].role == role) return &result.samples[i];
+        const Contender& contender = result.contenders[i];
+        if (contender.role == role && contender.set == set) return &result.samples[i];
     }
     return nullptr;
+}
+
+void add_new(std::vector<std::string>& names, const std::string& name) {
+    if (std::find(names.begin(), names.end(), name) == names.end()) names.push_back(name);
 }
 
 std::optional<Quartiles> optional_quartiles(const Samples* samples) {
@@ -48,11 +54,12 @@ std::optional<double> optional_ratio(const Samples* a, const Samples* b) {
     return paired_ratio(*a, *b).median;
 }
 
-size_t best_peer_of(const Result& result) {
+// The contender with the least median among those of a role.
+size_t fastest(const Result& result, Role role) {
     size_t best = result.contenders.size();
     double best_median = INFINITY;
     for (size_t i = 0; i < result.contenders.size(); ++i) {
-        if (result.contenders[i].role != Role::kPeer) continue;
+        if (result.contenders[i].role != role) continue;
         const double median = quartiles(result.samples[i]).median;
         if (median < best_median) {
             best = i;
@@ -89,55 +96,67 @@ const char* role_name(Role role) {
             return "wrapper";
         case Role::kLimit:
             return "limit";
+        case Role::kCopier:
+            return "peer that copies samples";
         case Role::kPeer:
             break;
     }
     return "peer";
 }
 
-// No name here holds a character that would need escaping.
-std::string quoted(const std::string& text) {
-    return '"' + text + '"';
-}
+using Json = nlohmann::ordered_json;
 
-void write_contender(std::ostream& out, const Contender& contender, const Samples& samples) {
+Json json_of(const Contender& contender, const Samples& samples) {
     const Quartiles q = quartiles(samples);
-    out << "{\"role\": " << quoted(role_name(contender.role))
-        << ", \"name\": " << quoted(contender.name) << ", \"rounds\": " << samples.size()
-        << ", \"median_us\": " << fixed(q.median * 1e6, 3)
-        << ", \"low_quartile_us\": " << fixed(q.low * 1e6, 3)
-        << ", \"high_quartile_us\": " << fixed(q.high * 1e6, 3) << '}';
+    Json json = {{"role", role_name(contender.role)}, {"name", contender.name}};
+    if (!contender.set.empty()) json["set"] = contender.set;
+    json["rounds"] = samples.size();
+    json["median_us"] = q.median * 1e6;
+    json["low_quartile_us"] = q.low * 1e6;
+    json["high_quartile_us"] = q.high * 1e6;
+    return json;
 }
 
-void write_result(std::ostream& out, const Result& result) {
-    const Figures figures = figures_of(result);
+Json json_of(const Result& result) {
     const Case& test = result.test;
-    out << "{\"family\": " << quoted(test.family) << ", \"case\": " << quoted(test.name)
-        << ", \"sampled_pixels\": " << fixed(sampled_pixels(test.job, test.sampling), 0);
-    out << ", \"over_limit\": " << fixed(figures.over_limit, 4);
-    if (figures.wrapper_gain) out << ", \"wrapper_gain\": " << fixed(*figures.wrapper_gain, 4);
-    out << ", \"best_peer\": " << quoted(figures.best_peer)
-        << ", \"faster\": " << fixed(figures.faster, 4) << ",\n \"contenders\": [";
-    for (size_t i = 0; i < result.contenders.size(); ++i) {
-        out << (i == 0 ? "\n  " : ",\n  ");
-        write_contender(out, result.contenders[i], result.samples[i]);
+    Json json = {{"family", test.family},
+                 {"case", test.name},
+                 {"sampled_pixels", sampled_pixels(test.job, test.sampling)}};
+    for (const std::string& set : sets_of(result)) {
+        const Figures figures = figures_of(result, set);
+        Json of_set = {{"set", set}, {"over_limit", figures.over_limit}};
+        if (figures.wrapper_gain) of_set["wrapper_gain"] = *figures.wrapper_gain;
+        of_set["best_peer"] = figures.best_peer;
+        of_set["faster"] = figures.faster;
+        json["sets"].push_back(of_set);
     }
-    out << "]}";
+    for (size_t i = 0; i < result.contenders.size(); ++i) {
+        json["contenders"].push_back(json_of(result.contenders[i], result.samples[i]));
+    }
+    return json;
 }
 
 }  // namespace
 
-Figures figures_of(const Result& result) {
-    const Samples* single = samples_of(result, Role::kSingle);
-    const Samples* wrapper = samples_of(result, Role::kWrapper);
-    const Samples* limit = samples_of(result, Role::kLimit);
-    const size_t peer = best_peer_of(result);
+std::vector<std::string> sets_of(const Result& result) {
+    std::vector<std::string> sets;
+    for (const Contender& contender : result.contenders) {
+        if (!contender.set.empty()) add_new(sets, contender.set);
+    }
+    return sets;
+}
+
+Figures figures_of(const Result& result, const std::string& set) {
+    const Samples* single = samples_of(result, Role::kSingle, set);
+    const Samples* wrapper = samples_of(result, Role::kWrapper, set);
+    const Samples& limit = result.samples[fastest(result, Role::kLimit)];
+    const size_t peer = fastest(result, Role::kPeer);
     const Samples* ours = single != nullptr ? single : wrapper;
-    return {quartiles(*limit),
+    return {quartiles(limit),
             optional_quartiles(single),
             optional_quartiles(wrapper),
             optional_ratio(single, wrapper),
-            paired_ratio(*ours, *limit).median,
+            paired_ratio(*ours, limit).median,
             result.contenders[peer].name,
             quartiles(result.samples[peer]).median,
             paired_ratio(result.samples[peer], *ours).median};
@@ -145,23 +164,21 @@ Figures figures_of(const Result& result) {
 
 std::vector<FamilyMeans> family_means(const std::vector<Result>& results) {
     std::vector<std::string> families;
-    for (const Result& result : results) {
-        const std::string& family = result.test.family;
-        if (std::find(families.begin(), families.end(), family) == families.end()) {
-            families.push_back(family);
-        }
-    }
+    for (const Result& result : results) add_new(families, result.test.family);
     std::vector<FamilyMeans> means;
     for (const std::string& family : families) {
-        Mean over_limit, wrapper_gain, faster;
-        for (const Result& result : results) {
-            if (result.test.family != family) continue;
-            const Figures figures = figures_of(result);
-            over_limit.add(figures.over_limit);
-            wrapper_gain.add(figures.wrapper_gain);
-            faster.add(figures.faster);
+        for (const std::string& set : sets_of(results.front())) {
+            Mean over_limit, wrapper_gain, faster;
+            for (const Result& result : results) {
+                if (result.test.family != family) continue;
+                const Figures figures = figures_of(result, set);
+                over_limit.add(figures.over_limit);
+                wrapper_gain.add(figures.wrapper_gain);
+                faster.add(figures.faster);
+            }
+            means.push_back(
+                {family, set, over_limit.value(), wrapper_gain.value(), faster.value()});
         }
-        means.push_back({family, over_limit.value(), wrapper_gain.value(), faster.value()});
     }
     return means;
 }
@@ -171,6 +188,8 @@ Table result_table(std::ostream& out) {
             {{"family", 13, true},
              {"case", 39, true},
              {"read MP", 7, false},
+             {"limit us", 8, false},
+             {"set", 6, true},
              {"ours us", 7, false},
              {"spread", 6, false},
              {"x limit", 7, false},
@@ -182,43 +201,49 @@ Table result_table(std::ostream& out) {
 }
 
 void print_result(Table& table, const Result& result) {
-    const Figures figures = figures_of(result);
     const Case& test = result.test;
-    const Quartiles& ours = figures.single ? *figures.single : *figures.wrapper;
-    table.print_row(
-        {test.family, test.name, fixed(sampled_pixels(test.job, test.sampling) / 1e6, 1),
-         or_dash(figures.single, median_microseconds), spread(ours), times(figures.over_limit),
-         or_dash(figures.wrapper, median_microseconds), or_dash(figures.wrapper_gain, times),
-         figures.best_peer, microseconds(figures.best_peer_seconds), times(figures.faster)});
+    const std::string read = fixed(sampled_pixels(test.job, test.sampling) / 1e6, 1);
+    for (const std::string& set : sets_of(result)) {
+        const Figures figures = figures_of(result, set);
+        const Quartiles& ours = figures.single ? *figures.single : *figures.wrapper;
+        table.print_row({test.family, test.name, read, median_microseconds(figures.limit), set,
+                         or_dash(figures.single, median_microseconds), spread(ours),
+                         times(figures.over_limit), or_dash(figures.wrapper, median_microseconds),
+                         or_dash(figures.wrapper_gain, times), figures.best_peer,
+                         microseconds(figures.best_peer_seconds), times(figures.faster)});
+    }
 }
 
 void print_means(std::ostream& out, const std::vector<Result>& results) {
     Table table(out, {{"geometric mean", 14, true},
+                      {"set", 6, true},
                       {"x limit", 7, false},
                       {"gain", 5, false},
                       {"faster", 6, false}});
     for (const FamilyMeans& means : family_means(results)) {
-        table.print_row({means.family, mean_text(means.over_limit), mean_text(means.wrapper_gain),
-                         mean_text(means.faster)});
+        table.print_row({means.family, means.set, mean_text(means.over_limit),
+                         mean_text(means.wrapper_gain), mean_text(means.faster)});
+    }
+}
+
+void print_copiers(std::ostream& out, const std::vector<Result>& results) {
+    const char* title = "\nNot compared with, because they copy single samples there:\n\n";
+    for (const Result& result : results) {
+        for (size_t i = 0; i < result.contenders.size(); ++i) {
+            const Contender& contender = result.contenders[i];
+            if (contender.role != Role::kCopier) continue;
+            out << title << result.test.family << ' ' << result.test.name << ": " << contender.name
+                << ", " << median_microseconds(quartiles(result.samples[i])) << " us\n";
+            title = "";
+        }
     }
 }
 
 void write_json(std::ostream& out, const std::vector<std::string>& machine,
                 const std::vector<Result>& results) {
-    const char* separator = "";
-    out << "{\"machine\": [";
-    for (const std::string& line : machine) {
-        out << separator << quoted(line);
-        separator = ", ";
-    }
-    out << "],\n\"cases\": [";
-    separator = "\n";
-    for (const Result& result : results) {
-        out << separator;
-        write_result(out, result);
-        separator = ",\n";
-    }
-    out << "\n]}\n";
+    Json json = {{"machine", machine}, {"cases", Json::array()}};
+    for (const Result& result : results) json["cases"].push_back(json_of(result));
+    out << json.dump(1) << '\n';
 }
 
 }  // namespace bench
