@@ -17,13 +17,11 @@
 
 #include <ovrinresize.h>
 
-#include <cstddef>
-#include <cstdint>
-#include <cstdlib>
-#include <cstring>
-#include <memory>
-#include <type_traits>
-#include <utility>
+// C's headers only: where an app has no C++ library, its headers are missing too.
+#include <stddef.h>
+#include <stdint.h>
+#include <stdlib.h>
+#include <string.h>
 #if defined(__cpp_exceptions)
 #include <stdexcept>
 #endif
@@ -56,7 +54,8 @@ enum class ErrorCode {
     kOverlap,           // source and destination share bytes
     kUnknownFormat,
     kDifferentFormats,
-    kUnsupported,  // a filter or a placement that the format has no function for
+    kDifferentSizes,  // of two pictures that are to be equal
+    kUnsupported,     // a filter or a placement that the format has no function for
     kNoMemory
 };
 
@@ -88,6 +87,18 @@ struct Rect {
     int32_t height;
 };
 
+namespace detail {
+
+// The type exists for bytes that may be written.
+template <class Byte>
+struct Writable {
+    using Type = void;
+};
+template <class Byte>
+struct Writable<const Byte> {};
+
+}  // namespace detail
+
 // Where the samples of one plane lie: pixels of RGBA and RGB, bytes of Y, U and V, pairs of VU.
 template <class Byte>
 struct BasicPlane {
@@ -100,7 +111,7 @@ struct BasicPlane {
     BasicPlane(Byte* first, size_t length, int32_t row = 0, int32_t pixel = 0)
         : data(first), bytes(length), row_stride(row), pixel_stride(pixel) {}
 
-    template <class Other, class = std::enable_if_t<!std::is_const_v<Other>>>
+    template <class Other, class = typename detail::Writable<Other>::Type>
     BasicPlane(const BasicPlane<Other>& other)
         : BasicPlane(other.data, other.bytes, other.row_stride, other.pixel_stride) {}
 };
@@ -123,7 +134,7 @@ struct BasicView {
               BasicPlane<Byte> second = {}, BasicPlane<Byte> third = {})
         : format(f), width(w), height(h), one_buffer(one), planes{first, second, third} {}
 
-    template <class Other, class = std::enable_if_t<!std::is_const_v<Other>>>
+    template <class Other, class = typename detail::Writable<Other>::Type>
     BasicView(const BasicView<Other>& other)
         : BasicView(other.format, other.width, other.height, other.one_buffer, other.planes[0],
                     other.planes[1], other.planes[2]) {}
@@ -168,6 +179,11 @@ template <class Byte>
 BasicView<Byte> nv21_view(BasicPlane<Byte> y, BasicPlane<Byte> vu, int32_t width, int32_t height) {
     return {Format::kNv21, width, height, false, y, vu};
 }
+
+// An NV21 buffer as three planes: what takes I420 then reads or writes NV21. A buffer that is too
+// short is noticed where the view is used, as one of its planes.
+template <class Byte>
+BasicView<Byte> nv21_as_i420_view(Byte* data, size_t bytes, int32_t width, int32_t height);
 
 namespace detail {
 
@@ -235,6 +251,24 @@ constexpr size_t picture_bytes(Format format, int32_t width, int32_t height) {
 // Chroma samples in a row, or chroma rows, of a 4:2:0 picture.
 constexpr int32_t chroma_side(int32_t luma_side) {
     return detail::half_rounded_up(luma_side);
+}
+
+template <class Byte>
+BasicView<Byte> nv21_as_i420_view(Byte* data, size_t bytes, int32_t width, int32_t height) {
+    const size_t needed = picture_bytes(Format::kNv21, width, height);
+    if (data == nullptr || needed == 0 || bytes < needed) {
+        return {Format::kI420, width, height, false, {data, bytes}};
+    }
+    const auto luma = static_cast<size_t>(int64_t{width} * height);
+    const size_t chroma = needed - luma;
+    const int32_t row = 2 * chroma_side(width);
+    return {Format::kI420,
+            width,
+            height,
+            false,
+            {data, luma},
+            {data + luma + 1, chroma - 1, row, 2},
+            {data + luma, chroma - 1, row, 2}};
 }
 
 // ---- Checks -------------------------------------------------------------------------------------
@@ -480,11 +514,29 @@ inline Status check_pair(const ConstView& src, const View& dst, const char* dst_
 
 // ---- Memory -------------------------------------------------------------------------------------
 
-struct Free {
-    void operator()(uint8_t* bytes) const { free(bytes); }
-};
+// What malloc gave, until it goes.
+class Memory {
+public:
+    Memory() = default;
+    ~Memory() { free(bytes_); }
+    Memory(Memory&& other) noexcept : bytes_(other.bytes_) { other.bytes_ = nullptr; }
+    Memory& operator=(Memory&& other) noexcept {
+        uint8_t* const taken = other.bytes_;
+        other.bytes_ = nullptr;
+        reset(taken);
+        return *this;
+    }
 
-using Memory = std::unique_ptr<uint8_t, Free>;
+    uint8_t* get() const { return bytes_; }
+    bool is_empty() const { return bytes_ == nullptr; }
+    void reset(void* bytes) {
+        free(bytes_);
+        bytes_ = static_cast<uint8_t*>(bytes);
+    }
+
+private:
+    uint8_t* bytes_ = nullptr;
+};
 
 inline Status no_memory(const char* name, int64_t bytes) {
     return fail(ErrorCode::kNoMemory, name, ": no memory for ", bytes, " bytes");
@@ -504,8 +556,8 @@ public:
         if (status.ok()) status = detail::check_size(format, {width, height}, "picture");
         if (!status.ok()) return status;
         const size_t bytes = picture_bytes(format, width, height);
-        memory_.reset(static_cast<uint8_t*>(calloc(bytes, 1)));
-        if (memory_ == nullptr) return detail::no_memory("picture", detail::count(bytes));
+        memory_.reset(calloc(bytes, 1));
+        if (memory_.is_empty()) return detail::no_memory("picture", detail::count(bytes));
         format_ = format;
         size_ = {width, height};
         return status;
@@ -596,16 +648,31 @@ inline bool is_aligned(const uint8_t* pixels) {
     return reinterpret_cast<uintptr_t>(pixels) % alignof(uint32_t) == 0;
 }
 
+// With distances that the compiler knows, it moves many bytes at once.
+template <int kPut, int kTake>
+void copy_bytes(uint8_t* put, const uint8_t* take, int32_t count) {
+    for (int64_t i = 0; i < count; ++i) put[i * kPut] = take[i * kTake];
+}
+
 template <class Byte>
 void copy_plane(const Plane& to, const BasicPlane<Byte>& from, Size size, int32_t sample) {
-    const bool rows_at_once = to.pixel_stride == sample && from.pixel_stride == sample;
+    const int32_t put_step = to.pixel_stride;
+    const int32_t take_step = from.pixel_stride;
+    const bool bytes = sample == 1 && put_step <= 2 && take_step <= 2;
     for (int64_t row = 0; row < size.height; ++row) {
         uint8_t* put = to.data + row * to.row_stride;
         const uint8_t* take = from.data + row * from.row_stride;
-        const int32_t pieces = rows_at_once ? 1 : size.width;
-        const auto piece = static_cast<size_t>(rows_at_once ? size.width * sample : sample);
-        for (int64_t i = 0; i < pieces; ++i) {
-            memcpy(put + i * to.pixel_stride, take + i * from.pixel_stride, piece);
+        if (put_step == sample && take_step == sample) {
+            memcpy(put, take, static_cast<size_t>(int64_t{size.width} * sample));
+        } else if (bytes) {
+            const auto copy = put_step == 1    ? copy_bytes<1, 2>
+                              : take_step == 1 ? copy_bytes<2, 1>
+                                               : copy_bytes<2, 2>;
+            copy(put, take, size.width);
+        } else {
+            for (int64_t i = 0; i < size.width; ++i) {
+                memcpy(put + i * put_step, take + i * take_step, static_cast<size_t>(sample));
+            }
         }
     }
 }
@@ -677,8 +744,8 @@ struct Source {
             point_to(own, lies_in_one_buffer(view));
             return true;
         }
-        memory.reset(static_cast<uint8_t*>(malloc(static_cast<size_t>(needed))));
-        if (memory == nullptr) return false;
+        memory.reset(malloc(static_cast<size_t>(needed)));
+        if (memory.is_empty()) return false;
         const View copy = {view.format,
                            view.width,
                            view.height,
@@ -729,8 +796,7 @@ struct Destination {
             data = dst.planes[0].data;
             return true;
         }
-        memory.reset(
-            static_cast<uint8_t*>(malloc(picture_bytes(dst.format, dst.width, dst.height))));
+        memory.reset(malloc(picture_bytes(dst.format, dst.width, dst.height)));
         data = memory.get();
         if (data == nullptr) return false;
         // The nearest filter, and a call that finds no memory, leave what was there.
@@ -739,7 +805,7 @@ struct Destination {
     }
 
     void finish() {
-        if (memory != nullptr) copy_picture(view, copy());
+        if (!memory.is_empty()) copy_picture(view, copy());
     }
 
 private:
@@ -776,18 +842,20 @@ inline const uint32_t* words(const uint8_t* pixels) {
     return static_cast<const uint32_t*>(static_cast<const void*>(pixels));
 }
 
-inline void quarter_planes(const Call& call, const uint8_t* const* src, uint8_t* dst) {
+// A target record is for rows that lie apart.
+inline void quarter_planes(const Call& call, const uint8_t* const* src, uint8_t* dst,
+                           const ovrin_resize_target* target = nullptr) {
     const Size from = call.src;
     const Size to = call.dst;
     if (call.format == Format::kI420) {
         const auto in_threads =
             call.threads == Threads::kOne ? ovrin_resize_y_u_v_sg : ovrin_resize_y_u_v_tps;
         in_threads(src[0], src[1], src[2], dst, from.width, from.height, to.width, to.height,
-                   nullptr);
+                   target);
     } else {
         const auto in_threads =
             call.threads == Threads::kOne ? ovrin_resize_y_nv_sg : ovrin_resize_y_nv_tps;
-        in_threads(src[0], src[1], dst, from.width, from.height, to.width, to.height, nullptr);
+        in_threads(src[0], src[1], dst, from.width, from.height, to.width, to.height, target);
     }
 }
 
@@ -854,14 +922,252 @@ inline void run(const Call& call, const Source& src, uint8_t* dst) {
     }
 }
 
+// ---- 4:2:0 pictures whose rows or samples lie apart ---------------------------------------------
+
+// How U and V lie to each other.
+enum class Chroma {
+    kPlanes,  // each by itself, byte after byte
+    kUv,      // bytes take turns, U first
+    kVu,      // V first, as in NV21
+    kOther
+};
+
+inline bool takes_turns(Chroma chroma) {
+    return chroma == Chroma::kUv || chroma == Chroma::kVu;
+}
+
+// Rows so far apart that a band record cannot say it count as kOther.
+template <class Byte>
+Chroma chroma_of(const BasicPlane<Byte>& u, const BasicPlane<Byte>& v) {
+    const bool alike = u.row_stride == v.row_stride && u.pixel_stride == v.pixel_stride;
+    if (!alike || u.row_stride > INT32_MAX / 2) return Chroma::kOther;
+    if (u.pixel_stride == 1) return Chroma::kPlanes;
+    if (u.pixel_stride != 2 || u.row_stride % 2 != 0) return Chroma::kOther;
+    const auto at_u = reinterpret_cast<uintptr_t>(u.data);
+    const auto at_v = reinterpret_cast<uintptr_t>(v.data);
+    if (at_v == at_u + 1) return Chroma::kUv;
+    return at_u == at_v + 1 ? Chroma::kVu : Chroma::kOther;
+}
+
+// A picture in I420 or NV21 as three planes. Of U and V that take turns in one memory, a row ends
+// with the last byte of either: neither plane's own length tells how far the pairs go.
+template <class Byte>
+struct Yuv {
+    BasicPlane<Byte> y;
+    BasicPlane<Byte> u;
+    BasicPlane<Byte> v;
+    Chroma chroma;
+
+    explicit Yuv(const BasicView<Byte>& view) {
+        const Planes<Byte> planes(view);
+        y = planes.at[0];
+        u = planes.at[1];
+        v = planes.at[view.format == Format::kNv21 ? 1 : 2];
+        if (view.format == Format::kNv21) ++u.data;
+        chroma = chroma_of(u, v);
+    }
+
+    Byte* first_chroma() const { return chroma == Chroma::kVu ? v.data : u.data; }
+};
+
+inline void copy_yuv(const Yuv<uint8_t>& to, const Yuv<const uint8_t>& from, Size size) {
+    const Size chroma = {half_rounded_up(size.width), half_rounded_up(size.height)};
+    copy_plane(to.y, from.y, size, 1);
+    copy_plane(to.u, from.u, chroma, 1);
+    copy_plane(to.v, from.v, chroma, 1);
+}
+
+// A packed picture whose chroma lies as said; for kUv, too, V is named first. Its sides may be 1
+// above kLargestSide, where those of a result are rounded up.
+inline View packed_yuv(Chroma chroma, uint8_t* data, Size size) {
+    const Format format = chroma == Chroma::kPlanes ? Format::kI420 : Format::kNv21;
+    const int64_t bytes = packed_bytes(layout_of(format), size.width, size.height);
+    return {format, size.width, size.height, true, {data, static_cast<size_t>(bytes)}};
+}
+
+// Whether this is a packed picture whose chroma lies so, but for the order of U and V in a pair.
+inline bool is_packed_as(const Yuv<uint8_t>& yuv, Size size, Chroma chroma) {
+    if (takes_turns(yuv.chroma) != takes_turns(chroma) || yuv.chroma == Chroma::kOther) {
+        return false;
+    }
+    const Yuv<uint8_t> packed(packed_yuv(chroma, yuv.y.data, size));
+    return yuv.y.pixel_stride == 1 && yuv.y.row_stride == packed.y.row_stride &&
+           yuv.u.row_stride == packed.u.row_stride && yuv.first_chroma() == packed.first_chroma() &&
+           (takes_turns(chroma) || yuv.v.data == packed.v.data);
+}
+
+inline void swap_pairs(uint8_t* pairs, int64_t count) {
+    for (int64_t i = 0; i < count; ++i) {
+        const uint8_t first = pairs[2 * i];
+        pairs[2 * i] = pairs[2 * i + 1];
+        pairs[2 * i + 1] = first;
+    }
+}
+
+// One resize whose rows the quarter filter reads where they lie.
+struct RowCall {
+    Call call;
+    Yuv<const uint8_t> src;
+
+    bool has_pairs() const { return takes_turns(src.chroma); }
+
+    // A target record has one row length, which that of chroma follows from.
+    bool fits_record() const {
+        const int64_t row = (int64_t{src.y.row_stride} + 1) / 2;
+        return src.u.row_stride == (has_pairs() ? 2 * row : row);
+    }
+
+    // The picture that the samples make: bands make one whose sides are multiples of 4.
+    View result(uint8_t* data) const {
+        const auto side = [&](int32_t length) {
+            return fits_record() ? length : (length + 3) / 4 * 4;
+        };
+        return packed_yuv(src.chroma, data, {side(call.dst.width), side(call.dst.height)});
+    }
+};
+
+// By a target record: on threads, where there are many rows.
+inline void quarter_by_record(const RowCall& rows, uint8_t* dst) {
+    Call call = rows.call;
+    call.format = rows.has_pairs() ? Format::kNv21 : Format::kI420;
+    ovrin_resize_target target = {};
+    target.src_width = call.src.width;
+    target.src_height = call.src.height;
+    target.src_stride = rows.src.y.row_stride;
+    target.src_buffer_height = call.src.height;
+    target.dst = dst;
+    target.dst_width = target.canvas_width = call.dst.width;
+    target.dst_height = target.canvas_height = call.dst.height;
+    const uint8_t* const planes[] = {rows.src.y.data, rows.src.first_chroma(), rows.src.v.data};
+    quarter_planes(call, planes, nullptr, &target);
+}
+
+// Luma and chroma as a band each, of which either can have any row length. The samples are added to
+// what dst holds.
+template <class Band>
+void quarter_by_bands(const RowCall& rows, uint8_t* dst, Band& band, int32_t& chroma_rows,
+                      int32_t chroma_stride, void (*task)(void*)) {
+    const Size from = rows.call.src;
+    band.src_width = from.width;
+    band.src_height = band.band_rows = from.height;
+    band.dst_width = rows.call.dst.width;
+    band.dst_height = rows.call.dst.height;
+    band.src = rows.src.y.data;
+    band.work = dst;
+    band.src_row_bytes = rows.src.y.row_stride;
+    band.y_rows = from.height;
+    task(&band);
+    band.src_row_bytes = chroma_stride;
+    band.y_rows = 0;
+    chroma_rows = half_rounded_up(from.height);
+    task(&band);
+}
+
+inline void quarter_by_bands(const RowCall& rows, uint8_t* dst) {
+    const int32_t stride = rows.src.u.row_stride;
+    if (rows.has_pairs()) {
+        ovrin_nv21_band band = {};
+        band.src_vu = rows.src.first_chroma();
+        quarter_by_bands(rows, dst, band, band.vu_rows, stride, _resize_y_nv21_tp);
+    } else {
+        ovrin_yuv_band band = {};
+        band.src_u = rows.src.u.data;
+        band.src_v = rows.src.v.data;
+        quarter_by_bands(rows, dst, band, band.uv_rows, 2 * stride, _resize_y_u_v_tp);
+    }
+}
+
+inline void sample_rows(const RowCall& rows, const View& result) {
+    uint8_t* const bytes = result.planes[0].data;
+    if (rows.fits_record()) {
+        quarter_by_record(rows, bytes);
+    } else {
+        memset(bytes, 0, result.planes[0].bytes);
+        quarter_by_bands(rows, bytes);
+    }
+}
+
+// Into memory of the result's size, and from there into dst.
+inline Status sample_rows_and_copy(const RowCall& rows, const Yuv<uint8_t>& dst) {
+    const size_t bytes = rows.result(nullptr).planes[0].bytes;
+    Memory memory;
+    memory.reset(calloc(bytes, 1));
+    if (memory.is_empty()) return no_memory("dst", count(bytes));
+    const View result = rows.result(memory.get());
+    sample_rows(rows, result);
+    Yuv<const uint8_t> samples{ConstView(result)};
+    if (rows.src.chroma == Chroma::kUv) {
+        const ConstPlane first = samples.v;
+        samples.v = samples.u;
+        samples.u = first;
+    }
+    copy_yuv(dst, samples, rows.call.dst);
+    return {};
+}
+
+inline Status quarter_rows(const RowCall& rows, const View& dst) {
+    const Yuv<uint8_t> to(dst);
+    const Size size = rows.call.dst;
+    const View result = rows.result(to.y.data);
+    const bool same_size = result.width == size.width && result.height == size.height;
+    if (!same_size || !is_packed_as(to, size, rows.src.chroma)) {
+        return sample_rows_and_copy(rows, to);
+    }
+    sample_rows(rows, result);
+    if (to.chroma != rows.src.chroma) {
+        swap_pairs(to.first_chroma(),
+                   int64_t{half_rounded_up(size.width)} * half_rounded_up(size.height));
+    }
+    return {};
+}
+
+// U and V that lie in no way the C functions can read are copied, each into a plane of its own.
+struct ChromaCopy {
+    Memory memory;
+
+    Status make(Yuv<const uint8_t>& yuv, Size size) {
+        const Size chroma = {half_rounded_up(size.width), half_rounded_up(size.height)};
+        const size_t plane = static_cast<size_t>(int64_t{chroma.width} * chroma.height);
+        memory.reset(malloc(2 * plane));
+        if (memory.is_empty()) return no_memory("src", count(2 * plane));
+        const Plane u(memory.get(), plane, chroma.width, 1);
+        const Plane v(memory.get() + plane, plane, chroma.width, 1);
+        copy_plane(u, yuv.u, chroma, 1);
+        copy_plane(v, yuv.v, chroma, 1);
+        yuv.u = u;
+        yuv.v = v;
+        yuv.chroma = Chroma::kPlanes;
+        return {};
+    }
+};
+
+// Packed pictures have functions of their own.
+inline bool has_rows_apart(const Call& call, const ConstView& src) {
+    return call.filter == Filter::kQuarter && layout_of(call.format).planes > 1 &&
+           !is_packed(Planes<const uint8_t>(src), src) &&
+           Planes<const uint8_t>(src).at[0].pixel_stride == 1;
+}
+
+inline Status resize_rows_apart(const Call& call, const ConstView& src, const View& dst) {
+    RowCall rows = {call, Yuv<const uint8_t>(src)};
+    ChromaCopy copy;
+    if (rows.src.chroma == Chroma::kOther) {
+        const Status status = copy.make(rows.src, call.src);
+        if (!status.ok()) return status;
+    }
+    return quarter_rows(rows, dst);
+}
+
 }  // namespace detail
 
 // Resizes src into dst. Both have the same format, and share no bytes.
 //
-// Packed pictures go to the C function as they are. Other strides, and planes apart where the
-// filter wants them in one buffer, are copied first, and so is a destination. The bilinear filters
-// read past the last plane: where the view's buffer is longer than the picture, they read what is
-// there, as in C; where it is not long enough they read a copy, in which the last row is repeated.
+// Packed pictures go to the C function as they are. So do, for the quarter filter, the rows of
+// 4:2:0 pictures however far apart they lie, of U and V also where their bytes take turns in one
+// memory. Other strides, and planes apart where the filter wants them in one buffer, are copied
+// first, and so is a destination. The bilinear filters read past the last plane: where the view's
+// buffer is longer than the picture, they read what is there, as in C; where it is not long enough
+// they read a copy, in which the last row is repeated.
 //
 // When the library itself finds no memory, the result is incomplete and the status still ok: the C
 // functions report nothing.
@@ -873,6 +1179,7 @@ inline Status resize(const ConstView& src, const View& dst, Filter filter = Filt
     if (!status.ok()) return status;
     const detail::Call call = {
         src.format, filter, threads, {src.width, src.height}, {dst.width, dst.height}};
+    if (detail::has_rows_apart(call, src)) return detail::resize_rows_apart(call, src, dst);
     const int64_t needed = detail::source_bytes(filter, src.format, call.src, call.dst);
     detail::Source from;
     if (!from.prepare(src, filter, needed)) return detail::no_memory("src", needed);
@@ -883,6 +1190,19 @@ inline Status resize(const ConstView& src, const View& dst, Filter filter = Filt
     }
     detail::run(call, from, to.data);
     to.finish();
+    return status;
+}
+
+// Copies src into dst, which has the same format and size but may have other strides. Together with
+// nv21_as_i420_view that makes NV21 of I420, or the reverse.
+inline Status copy(const ConstView& src, const View& dst) {
+    Status status = detail::check_pair(src, dst, "dst");
+    if (!status.ok()) return status;
+    if (src.width != dst.width || src.height != dst.height) {
+        return detail::fail(ErrorCode::kDifferentSizes, "src is ", Size{src.width, src.height},
+                            ", dst is ", Size{dst.width, dst.height});
+    }
+    detail::copy_picture(dst, src);
     return status;
 }
 

@@ -57,7 +57,7 @@ make_stand_ins() {
 
     jni_h=$(dirname "$(find /usr/lib/jvm/*/include "${JAVA_HOME:-/nonexistent}" -name jni.h 2>/dev/null |
         head -n 1)")
-    local jni=("$root"/bindings/jni/{checks,extents,methods}.cpp -std=c++17 -O2 -fno-exceptions
+    local jni=("$root"/bindings/jni/{camera,checks,extents,methods}.cpp -std=c++17 -O2 -fno-exceptions
         -fno-rtti -mno-outline-atomics -fvisibility=hidden -I "$root/include" -I "$jni_h"
         -I "$jni_h/linux" "-Wl,--version-script=$root/bindings/jni/exports.map")
     stand_in libovrinresize_jni.so libovrinresize_jni.so "${jni[@]}" "${system[@]}" \

@@ -21,15 +21,27 @@ long long printable(int64_t value) {
 // C's variadic arguments: the compiler checks them against the format.
 void Checks::fail(const char* format, ...) {  // NOLINT(cert-dcl50-cpp)
     if (!ok_) return;
-    ok_ = false;
     char message[kMessageBytes];
     va_list arguments;
     va_start(arguments, format);
     vsnprintf(message, sizeof message, format, arguments);
     va_end(arguments);
+    raise("java/lang/IllegalArgumentException", message);
+}
+
+void Checks::raise(const char* type, const char* message) {
+    ok_ = false;
     // Where the class is not found, that error is thrown instead.
-    jclass type = env_->FindClass("java/lang/IllegalArgumentException");
-    if (type != nullptr) env_->ThrowNew(type, message);
+    jclass found = env_->FindClass(type);
+    if (found != nullptr) env_->ThrowNew(found, message);
+}
+
+void Checks::outcome(const ovrin::Status& status) {
+    if (status.code == ovrin::ErrorCode::kNoMemory) {
+        raise("java/lang/OutOfMemoryError", status.text);
+    } else if (!status.ok()) {
+        fail("%s", status.text);
+    }
 }
 
 void Checks::number(const char* name, int32_t value, int32_t least, int32_t most) {

@@ -6,6 +6,8 @@
 #include <jni.h>
 #include <stdint.h>
 
+#include <ovrinresize.hpp>
+
 #include "extents.h"
 
 namespace ovrin_jni {
@@ -36,6 +38,9 @@ public:
     const uint8_t* source(jobject buffer, const char* name, int64_t bytes, int alignment = 1);
     uint8_t* destination(jobject buffer, int64_t bytes, int alignment = 1);
 
+    // What a call of the C++ layer has come to: missing memory throws OutOfMemoryError.
+    void outcome(const ovrin::Status& status);
+
 private:
     struct Range {
         uintptr_t begin;
@@ -45,6 +50,7 @@ private:
     uint8_t* address(jobject buffer, const char* name, int64_t bytes, int alignment);
     bool is_read_only(jobject buffer);
     void fail(const char* format, ...) __attribute__((format(printf, 2, 3)));
+    void raise(const char* type, const char* message);
 
     JNIEnv* env_;
     bool ok_ = true;

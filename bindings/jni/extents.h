@@ -44,6 +44,11 @@ inline int64_t strided_chroma(Size size, int64_t stride) {
                    half_rounded_up(stride));
 }
 
+// The bytes from the first sample of U or V in a row to the last, `pixel_stride` bytes apart.
+inline int64_t chroma_row(Size size, int64_t pixel_stride) {
+    return (half_rounded_up(size.width) - 1) * pixel_stride + 1;
+}
+
 // Format codes of the bilinear engine.
 enum BilinearFormat : int32_t { kPlanar = 2, kPixels = 7, kSemiPlanar = 18 };
 

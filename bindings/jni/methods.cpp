@@ -3,6 +3,7 @@
 // side has checked: from here on nothing stands between a wrong number and memory that is not ours.
 #include <ovrinresize.h>
 
+#include "camera.h"
 #include "checks.h"
 
 namespace ovrin_jni {
@@ -247,6 +248,7 @@ void JNICALL lanczos_full_chroma(JNIEnv* env, jclass, jobject src, jint src_w, j
 #define OVRIN_BUFFER "Ljava/nio/ByteBuffer;"
 #define OVRIN_PICTURE OVRIN_BUFFER "II"
 #define OVRIN_PLACEMENT "IIIIII"
+#define OVRIN_FRAME OVRIN_BUFFER OVRIN_BUFFER OVRIN_BUFFER "IIIII"
 
 struct Method {
     const char* name;
@@ -278,6 +280,8 @@ bool register_methods(JNIEnv* env, jclass type) {
         method("lanczos", plain, lanczos),
         method("lanczosComponents", "(" OVRIN_PICTURE OVRIN_PICTURE "I)V", lanczos_components),
         method("lanczosFullChroma", plain, lanczos_full_chroma),
+        method("resizeYuv420", "(" OVRIN_FRAME OVRIN_PICTURE "I)V", resize_yuv420),
+        method("copyYuv420", "(" OVRIN_FRAME OVRIN_BUFFER "I)V", copy_yuv420),
     };
     // The record's fields are not const, though nothing writes to them.
     for (const Method& m : methods) {

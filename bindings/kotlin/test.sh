@@ -7,9 +7,11 @@ root=$here/../..
 build=$(cd "$1" && pwd)
 source "$here/compiler/compiler.sh"
 
-calls=100000
+calls=${OVRIN_TEST_CALLS:-100000}
 seed=${OVRIN_TEST_SEED:-1}
 classes=$build/test-classes
+# JUnit, as Debian installs it.
+junit=/usr/share/java/junit4.jar:/usr/share/java/hamcrest-core.jar
 
 fail() {
     echo "FAIL: $*"
@@ -27,10 +29,10 @@ take_example() {
 
 compile_tests() {
     rm -rf "$classes"
-    kotlinc "$build" -Werror -classpath "$build/classes" -Xfriend-paths="$build/classes" \
+    kotlinc "$build" -Werror -classpath "$build/classes:$junit" -Xfriend-paths="$build/classes" \
         -d "$classes" "$here"/test/*.kt "$here"/test/*.java "$build/Example.kt"
     javac -Xlint:all -Xlint:-options -Werror --release 8 -d "$classes" \
-        -classpath "$build/classes:$(kotlin_stdlib "$build")" "$here"/test/*.java
+        -classpath "$build/classes:$classes:$junit:$(kotlin_stdlib "$build")" "$here"/test/*.java
 }
 
 make_known_results() {
@@ -39,11 +41,17 @@ make_known_results() {
     "$build/expected" >"$build/expected.txt"
 }
 
+# Classes with tests, by their names.
+test_classes() {
+    (cd "$classes" && grep -lr 'Lorg/junit/Test;' . | grep -v '\$' | sed 's,^\./,,; s,/,.,g; s,\.class$,,' | sort)
+}
+
 # run NAME CLASS ARGUMENT...: what -Xcheck:jni has to say goes to either stream.
 run() {
     local output=$build/$1.out
-    java -Xcheck:jni -Djava.library.path="$build" \
-        -classpath "$build/classes:$classes:$(kotlin_stdlib "$build")" "${@:2}" >"$output" 2>&1 || {
+    java -Xcheck:jni -Djava.library.path="$build" -Dovrin.expected="$build/expected.txt" \
+        -Dovrin.calls="$calls" -Dovrin.seed="$seed" \
+        -classpath "$build/classes:$classes:$junit:$(kotlin_stdlib "$build")" "${@:2}" >"$output" 2>&1 || {
         cat "$output"
         fail "$2 gave $?"
     }
@@ -68,7 +76,8 @@ bash "$here/compile.sh" "$build"
 take_example
 compile_tests
 make_known_results
-run tests ovrin.resize.test.MainKt "$build/expected.txt" "$calls" "$seed"
-grep -q '^all passed' "$build/tests.out" || fail "the tests did not reach their end"
+mapfile -t tests < <(test_classes)
+run tests org.junit.runner.JUnitCore "${tests[@]}"
+grep -q '^OK (' "$build/tests.out" || fail "the tests did not reach their end"
 run example ExampleKt
 diff "$build/example.expected" "$build/example.out" || fail "the example prints something else"

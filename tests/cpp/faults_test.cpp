@@ -53,4 +53,44 @@ TEST(CppFaults, PackedPicturesNeedNoCopy) {
     EXPECT_LT(faults::largest_block(), src.size());
 }
 
+// Frames whose U and V take turns, whatever the order, need memory of the result's size at most.
+TEST(CppFaults, RowsApartNeedNoCopyOfTheSource) {
+    const std::vector<uint8_t> luma(448 * 400, 90);
+    const std::vector<uint8_t> pairs(448 * 200, 128);
+    std::vector<uint8_t> dst(ovrin::picture_bytes(ovrin::Format::kI420, 101, 99));
+    const ovrin::ConstPlane y(luma.data(), luma.size(), 448);
+    for (const int32_t row : {448, 402}) {
+        for (const int u_first : {0, 1}) {
+            const ovrin::ConstPlane u(pairs.data() + 1 - u_first, pairs.size() - 1, row, 2);
+            const ovrin::ConstPlane v(pairs.data() + u_first, pairs.size() - 1, row, 2);
+            faults::reset();
+            ASSERT_TRUE(resize(ovrin::i420_view(y, u, v, 400, 400),
+                               ovrin::i420_view(dst.data(), dst.size(), 101, 99))
+                            .ok());
+            EXPECT_LE(faults::largest_block(), size_t{2} * 104 * 100);
+        }
+    }
+    EXPECT_EQ(faults::live_blocks(), 0);
+}
+
+// The first block is that of the chroma, the second that of the result.
+TEST(CppFaults, NoMemoryForRowsApart) {
+    const std::vector<uint8_t> src(16 * 8, 200);
+    std::vector<uint8_t> dst(ovrin::picture_bytes(ovrin::Format::kI420, 3, 3), 7);
+    const ovrin::ConstPlane y(src.data(), src.size(), 9);
+    const ovrin::ConstPlane u(src.data(), src.size(), 16, 2);
+    const auto refused = [&](faults::Kind kind) {
+        faults::fail(kind, 1);
+        const ovrin::Status status =
+            resize(ovrin::i420_view(y, u, u, 8, 8), ovrin::i420_view(dst.data(), dst.size(), 3, 3));
+        EXPECT_TRUE(faults::has_failed());
+        faults::reset();
+        EXPECT_EQ(dst, std::vector<uint8_t>(dst.size(), 7));
+        return status;
+    };
+    EXPECT_STREQ(refused(faults::Kind::kMalloc).text, "src: no memory for 32 bytes");
+    EXPECT_STREQ(refused(faults::Kind::kCalloc).text, "dst: no memory for 24 bytes");
+    EXPECT_EQ(faults::live_blocks(), 0);
+}
+
 }  // namespace

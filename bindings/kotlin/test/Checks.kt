@@ -4,11 +4,7 @@ package ovrin.resize.test
 import java.nio.Buffer
 import java.nio.ByteBuffer
 
-var checks = 0L
-    private set
-
 fun check(condition: Boolean, message: () -> String) {
-    checks++
     if (!condition) throw AssertionError(message())
 }
 

@@ -3,6 +3,8 @@
 package ovrin.resize.test;
 
 import java.nio.ByteBuffer;
+import org.junit.Test;
+import ovrin.resize.CameraFrame;
 import ovrin.resize.BilinearMode;
 import ovrin.resize.Native;
 import ovrin.resize.PixelFormat;
@@ -10,9 +12,7 @@ import ovrin.resize.Placement;
 import ovrin.resize.Resizer;
 import ovrin.resize.Size;
 
-final class FromJava {
-    private FromJava() {}
-
+public final class FromJava {
     private interface Call {
         void run();
     }
@@ -27,7 +27,8 @@ final class FromJava {
         throw new AssertionError("accepted");
     }
 
-    static String run() {
+    @Test
+    public void calls() {
         Size size = new Size(8, 6);
         ByteBuffer src = ByteBuffer.allocateDirect(8 * 6 * 4 + 36);
         ByteBuffer dst = ByteBuffer.allocateDirect(8 * 6 * 4);
@@ -36,11 +37,11 @@ final class FromJava {
         Resizer.bilinear(src, size, dst, size, PixelFormat.RGBA8888);
         Resizer.bilinear(src, size, dst, size, PixelFormat.NV21, BilinearMode.HALVING);
         Resizer.lanczos(src, size, dst, size, 3);
+        CameraFrame.fromYuv420(src, src, src, 8, 8, 2, 8, 6).resizeTo(dst, size, PixelFormat.NV21);
         // Kotlin would refuse null itself.
         refused("source is null", () -> Native.rgba(null, 1, 1, dst, 1, 1));
         refused("destination is null", () -> Native.rgba(src, 1, 1, null, 1, 1));
         refused("source V plane is null",
                 () -> Native.i420InCanvas(src, src, null, 1, 1, 1, dst, 1, 1, 0, 0, 1, 1));
-        return "called from Java";
     }
 }

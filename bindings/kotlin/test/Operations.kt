@@ -4,6 +4,7 @@ package ovrin.resize.test
 
 import java.nio.ByteBuffer
 import ovrin.resize.BilinearMode
+import ovrin.resize.CameraFrame
 import ovrin.resize.Native
 import ovrin.resize.PixelFormat
 import ovrin.resize.Placement
@@ -55,9 +56,13 @@ class Operation(
     val srcAlignment: Int = 1,
     val spare: (Numbers) -> Long = { 0 },
     val exact: (Numbers) -> List<Long> = { n -> sources.map { it(n) } },
+    val isFrame: Boolean = false,
     val raw: ((List<ByteBuffer>, ByteBuffer, Numbers) -> Unit)?,
     val safe: (List<ByteBuffer>, ByteBuffer, Numbers) -> Unit,
 ) {
+    /** How messages name the first source. */
+    val firstSource get() = if (sources.size > 1) "Y plane" else "source"
+
     override fun toString() = name
 }
 
@@ -184,6 +189,32 @@ private fun lanczosComponents(components: Int) = Operation(
     safe = { src, dst, n -> Resizer.lanczos(src[0], n.source, dst, n.result, components) },
 )
 
+private val frames = listOf(PixelFormat.I420, PixelFormat.NV21)
+
+/** Frames whose U and V have memory of their own. Rows are a little longer than they must be. */
+private fun frame(format: PixelFormat, pixelStride: Int): Operation {
+    fun yRow(n: Numbers) = n.srcW + 5
+    fun uvRow(n: Numbers) = half(n.srcW).toInt() * pixelStride + 3
+    fun chroma(n: Numbers) = (half(n.srcH) - 1) * uvRow(n) + (half(n.srcW) - 1) * pixelStride + 1
+    return Operation(
+        "frame_${format.name.lowercase()}_$pixelStride",
+        sources = listOf({ n -> (n.srcH - 1L) * yRow(n) + n.srcW }, ::chroma, ::chroma),
+        result = { n -> yuv(n.dstW, n.dstH) },
+        isFrame = true,
+        raw = { src, dst, n ->
+            Native.resizeYuv420(
+                src[0], src[1], src[2], yRow(n), uvRow(n), pixelStride, n.srcW, n.srcH,
+                dst, n.dstW, n.dstH, 1 + frames.indexOf(format),
+            )
+        },
+        safe = { src, dst, n ->
+            CameraFrame.fromYuv420(
+                src[0], src[1], src[2], yRow(n), uvRow(n), pixelStride, n.srcW, n.srcH,
+            ).resizeTo(dst, n.result, format)
+        },
+    )
+}
+
 val operations: List<Operation> = listOf(
     plain("rgba", rgba, Native::rgba, Resizer::rgba, dstAlignment = 4),
     plain("rgb", full, Native::rgb, Resizer::rgb),
@@ -198,4 +229,5 @@ val operations: List<Operation> = listOf(
     (1..4).map(::lanczosComponents) +
     plain(
         "lanczosFullChroma", full, Native::lanczosFullChroma, Resizer::lanczosFullChroma, slow = true,
-    )
+    ) +
+    frames.flatMap { format -> (1..2).map { stride -> frame(format, stride) } }

@@ -4,6 +4,7 @@ package ovrin.resize.test
 
 import java.nio.ByteBuffer
 import java.util.Random
+import org.junit.Test
 
 private const val ARENA = 1 shl 20
 private const val MARGIN = 64
@@ -123,17 +124,22 @@ private class Caller(seed: Long) {
     }
 }
 
-fun testRandomCalls(calls: Int, seed: Long): String {
-    val caller = Caller(seed)
-    try {
-        repeat(calls) { caller.call() }
-        caller.checkSources()
-    } catch (e: AssertionError) {
-        throw AssertionError("${e.message} (seed $seed)", e)
+class RandomCalls {
+    @Test
+    fun endAsTheyMust() {
+        val calls = Integer.getInteger("ovrin.calls")
+        val seed = java.lang.Long.getLong("ovrin.seed")
+        val caller = Caller(seed)
+        try {
+            repeat(calls) { caller.call() }
+            caller.checkSources()
+        } catch (e: AssertionError) {
+            throw AssertionError("${e.message} (seed $seed)", e)
+        }
+        val accepted = caller.count(Outcome.ACCEPTED)
+        val refused = caller.count(Outcome.REFUSED)
+        println("$accepted of $calls random calls accepted, $refused refused")
+        check(accepted > calls / 2) { "only $accepted of $calls accepted" }
+        check(refused > calls / 20) { "only $refused of $calls refused" }
     }
-    val accepted = caller.count(Outcome.ACCEPTED)
-    val refused = caller.count(Outcome.REFUSED)
-    check(accepted > calls / 2) { "only $accepted of $calls accepted" }
-    check(refused > calls / 20) { "only $refused of $calls refused" }
-    return "$accepted of $calls accepted, $refused refused"
 }

@@ -91,4 +91,22 @@ internal object Native {
         src: ByteBuffer, srcWidth: Int, srcHeight: Int,
         dst: ByteBuffer, dstWidth: Int, dstHeight: Int,
     )
+
+    /** [format]: 1 I420, 2 NV21. */
+    @JvmStatic
+    external fun resizeYuv420(
+        y: ByteBuffer, u: ByteBuffer, v: ByteBuffer,
+        yRowStride: Int, uvRowStride: Int, uvPixelStride: Int, width: Int, height: Int,
+        dst: ByteBuffer, dstWidth: Int, dstHeight: Int,
+        format: Int,
+    )
+
+    /** As [resizeYuv420], into a picture of the same size. */
+    @JvmStatic
+    external fun copyYuv420(
+        y: ByteBuffer, u: ByteBuffer, v: ByteBuffer,
+        yRowStride: Int, uvRowStride: Int, uvPixelStride: Int, width: Int, height: Int,
+        dst: ByteBuffer,
+        format: Int,
+    )
 }

@@ -25,6 +25,15 @@ enum class PixelFormat {
         I420, NV21 -> size.pixels + 2 * size.chromaSamples
     }
 
+    /** What the native methods call it that take several formats. */
+    internal val nativeNumber: Int
+        get() = when (this) {
+            RGBA8888 -> 0
+            I420 -> 1
+            NV21 -> 2
+            RGB888 -> throw IllegalArgumentException("RGB888 has no number")
+        }
+
     /** How [bytes] comes about. */
     internal fun formula(size: Size): String = when (this) {
         RGBA8888 -> "$size x 4"

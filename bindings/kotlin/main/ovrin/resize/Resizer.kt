@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
 package ovrin.resize
 
-import java.nio.Buffer
 import java.nio.ByteBuffer
 
 /**
@@ -189,7 +188,7 @@ object Resizer {
         Native.bilinear(
             from, srcSize.width, srcSize.height,
             destinationOf(dst, format, dstSize), dstSize.width, dstSize.height,
-            if (format == PixelFormat.RGBA8888) 0 else if (format == PixelFormat.I420) 1 else 2,
+            format.nativeNumber,
             mode.ordinal,
         )
     }
@@ -270,9 +269,6 @@ object Resizer {
             "srcStride is $stride, must be ${size.width} (the source's width) to ${Size.LARGEST_SIDE}"
         }
 
-    /** Rows of [row] bytes, [stride] bytes apart. */
-    private fun strided(row: Long, rows: Long, stride: Long): Long = (rows - 1) * stride + row
-
     private fun lumaOf(buffer: ByteBuffer, size: Size, stride: Int): ByteBuffer {
         val needed = strided(size.width.toLong(), size.height.toLong(), stride.toLong())
         return sourceOf("source Y plane", buffer, needed) { "$size, rows $stride apart" }
@@ -291,42 +287,5 @@ object Resizer {
         return sourceOf(name, buffer, strided(width, height, distance)) {
             "$width x $height, rows $distance apart"
         }
-    }
-
-    private fun sourceOf(format: PixelFormat, buffer: ByteBuffer, size: Size): ByteBuffer =
-        sourceOf("source", buffer, format.bytes(size)) { format.formula(size) }
-
-    private fun destinationOf(buffer: ByteBuffer, format: PixelFormat, size: Size): ByteBuffer =
-        destinationOf(buffer, format.bytes(size)) { format.formula(size) }
-
-    private inline fun destinationOf(
-        buffer: ByteBuffer,
-        needed: Long,
-        formula: () -> String,
-    ): ByteBuffer {
-        require(!buffer.isReadOnly) { "destination is read-only" }
-        return sourceOf("destination", buffer, needed, formula)
-    }
-
-    /** The buffer from its position to its limit; both are where the native side expects them. */
-    private inline fun sourceOf(
-        name: String,
-        buffer: ByteBuffer,
-        needed: Long,
-        formula: () -> String,
-    ): ByteBuffer {
-        require(buffer.isDirect) { "$name is not a direct buffer" }
-        require(buffer.remaining() >= needed) {
-            "$name holds ${buffer.remaining()} bytes, $needed needed (${formula()})"
-        }
-        return buffer.slice()
-    }
-
-    private fun part(buffer: ByteBuffer, offset: Int, bytes: Int): ByteBuffer {
-        val copy = buffer.duplicate()
-        // Through the base class: Java 8 and older Android have these methods only there.
-        (copy as Buffer).position(offset)
-        (copy as Buffer).limit(offset + bytes)
-        return copy.slice()
     }
 }
