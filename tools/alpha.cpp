@@ -22,7 +22,8 @@ void for_each_pixel(Picture* picture, Change change) {
 
 bool is_opaque(const Picture& picture) {
     const uint8_t* const bytes = picture.bytes();
-    for (size_t i = 3; i < picture.byte_count(); i += 4) {
+    const size_t count = picture.byte_count();
+    for (size_t i = 3; i < count; i += 4) {
         if (bytes[i] != 255) return false;
     }
     return true;

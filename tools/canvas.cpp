@@ -11,36 +11,6 @@ namespace tool {
 
 namespace {
 
-// Part of a picture whose samples lie side by side: all of a packed one, or one plane.
-struct Plane {
-    size_t offset;  // bytes from the picture's start
-    size_t width;   // samples
-    size_t height;  // rows
-    size_t sample_bytes;
-    size_t pixels;  // that a sample covers in either direction
-};
-
-std::vector<Plane> planes_of(PixelFormat format, Size size) {
-    const auto width = static_cast<size_t>(size.width);
-    const auto height = static_cast<size_t>(size.height);
-    const size_t half_width = (width + 1) / 2;
-    const size_t half_height = (height + 1) / 2;
-    const size_t luma = width * height;
-    switch (format) {
-        case PixelFormat::kRgba:
-            return {{0, width, height, 4, 1}};
-        case PixelFormat::kRgb:
-            return {{0, width, height, 3, 1}};
-        case PixelFormat::kNv21:
-            return {{0, width, height, 1, 1}, {luma, half_width, half_height, 2, 2}};
-        case PixelFormat::kI420:
-            return {{0, width, height, 1, 1},
-                    {luma, half_width, half_height, 1, 2},
-                    {luma + half_width * half_height, half_width, half_height, 1, 2}};
-    }
-    return {};
-}
-
 Picture one_pixel(PixelFormat format, Color color, uint8_t alpha) {
     Picture pixel({1, 1});
     const uint8_t channels[] = {color.red, color.green, color.blue, alpha};
@@ -54,38 +24,41 @@ void fill(Picture* picture, const Picture& pixel) {
     for (size_t i = 0; i < planes.size(); ++i) {
         const uint8_t* const sample = pixel.bytes() + samples[i].offset;
         uint8_t* to = picture->bytes() + planes[i].offset;
-        for (size_t n = planes[i].width * planes[i].height; n > 0; --n) {
-            to = std::copy_n(sample, planes[i].sample_bytes, to);
+        for (size_t n = planes[i].size.pixels(); n > 0; --n) {
+            to = std::copy_n(sample, planes[i].channels, to);
         }
     }
 }
 
 // Where the samples of one row or column go: those from `first` on, `count` of them, to `to` on.
 struct Span {
-    size_t first, count, to;
+    int32_t first, count, to;
 };
 
 // offset: of the picture on the canvas, in samples.
-Span visible(size_t samples, size_t canvas_samples, ptrdiff_t offset) {
-    const size_t first = offset < 0 ? static_cast<size_t>(-offset) : 0;
-    const size_t to = offset < 0 ? 0 : static_cast<size_t>(offset);
+Span visible(int32_t samples, int32_t canvas_samples, int32_t offset) {
+    const int32_t first = std::max(-offset, 0);
+    const int32_t to = std::max(offset, 0);
     return {first, std::min(samples - first, canvas_samples - to), to};
+}
+
+// The sample's byte in the picture.
+size_t at(const Plane& plane, int32_t column, int32_t row) {
+    const int64_t sample = int64_t{row} * plane.size.width + column;
+    return plane.offset + static_cast<size_t>(sample * plane.channels);
 }
 
 void paste(const Picture& picture, Picture* canvas, int32_t x, int32_t y) {
     const std::vector<Plane> from = planes_of(picture.format, picture.size);
     const std::vector<Plane> to = planes_of(canvas->format, canvas->size);
     for (size_t i = 0; i < from.size(); ++i) {
-        const auto pixels = static_cast<int32_t>(from[i].pixels);
-        const Span columns = visible(from[i].width, to[i].width, x / pixels);
-        const Span rows = visible(from[i].height, to[i].height, y / pixels);
-        const auto at = [](const Plane& plane, size_t column, size_t row) {
-            return plane.offset + (row * plane.width + column) * plane.sample_bytes;
-        };
-        for (size_t row = 0; row < rows.count; ++row) {
+        const Span columns = visible(from[i].size.width, to[i].size.width, x / from[i].across);
+        const Span rows = visible(from[i].size.height, to[i].size.height, y / from[i].down);
+        const auto row_bytes =
+            static_cast<size_t>(columns.count) * static_cast<size_t>(from[i].channels);
+        for (int32_t row = 0; row < rows.count; ++row) {
             memcpy(canvas->bytes() + at(to[i], columns.to, rows.to + row),
-                   picture.bytes() + at(from[i], columns.first, rows.first + row),
-                   columns.count * from[i].sample_bytes);
+                   picture.bytes() + at(from[i], columns.first, rows.first + row), row_bytes);
         }
     }
 }

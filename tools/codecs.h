@@ -23,10 +23,12 @@ Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata);
 // quality: 1 to 100. Alpha is dropped.
 void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out);
 
-// Binary PPM (P6), which holds no metadata.
-bool is_ppm(const uint8_t* data, size_t size);
-Picture decode_ppm(const uint8_t* data, size_t size, Metadata* metadata);
-// Alpha is dropped.
+// PBM, PGM, PPM (P1 to P6) and PAM (P7), which hold no metadata. Of several pictures the first.
+bool is_pnm(const uint8_t* data, size_t size);
+Picture decode_pnm(const uint8_t* data, size_t size, Metadata* metadata);
+// P6, P5 and P7, binary. The first two drop alpha, and PGM colours.
 void encode_ppm(const Picture& picture, FILE* out);
+void encode_pgm(const Picture& picture, FILE* out);
+void encode_pam(const Picture& picture, FILE* out);
 
 }  // namespace tool

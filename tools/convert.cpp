@@ -4,12 +4,13 @@
 #include <algorithm>
 #include <cstring>
 #include <utility>
+#include <vector>
 
 namespace tool {
 
 namespace {
 
-// Where the chroma samples of an I420 or NV21 picture lie.
+// Where the chroma samples of a picture lie that has some.
 template <class Byte>
 struct Chroma {
     Byte* u;
@@ -18,17 +19,28 @@ struct Chroma {
     size_t row_bytes;  // bytes from one row to the next
     size_t width;      // samples
     size_t height;
+    size_t across;  // pixels of a sample
+    size_t down;
 
     size_t at(size_t x, size_t y) const { return y * row_bytes + x * step; }
 };
 
 template <class Byte>
 Chroma<Byte> chroma_of(Byte* picture, PixelFormat format, Size size) {
-    const size_t width = static_cast<size_t>(size.width + 1) / 2;
-    const size_t height = static_cast<size_t>(size.height + 1) / 2;
-    Byte* const start = picture + size.pixels();
-    if (format == PixelFormat::kNv21) return {start + 1, start, 2, 2 * width, width, height};
-    return {start, start + width * height, 1, width, width, height};
+    const std::vector<Plane> planes = planes_of(format, size);
+    const Plane& first = planes[1];
+    const bool has_pairs = first.channels == 2;
+    const auto width = static_cast<size_t>(first.size.width);
+    const auto step = static_cast<size_t>(first.channels);
+    Byte* const u = picture + first.offset;
+    return {has_pairs ? u + 1 : u,
+            has_pairs ? u : picture + planes[2].offset,
+            step,
+            step * width,
+            width,
+            static_cast<size_t>(first.size.height),
+            static_cast<size_t>(first.across),
+            static_cast<size_t>(first.down)};
 }
 
 uint8_t to_byte(int fixed_point) {
@@ -65,21 +77,21 @@ struct Mean {
     int r, g, b;
 };
 
-// The mean colour of the 2 x 2 pixels of a chroma sample. The last column and row stand in for
-// those that a picture of odd size lacks.
-Mean mean_color(const Picture& rgba, size_t x, size_t y) {
-    const size_t width = static_cast<size_t>(rgba.size.width);
-    const size_t height = static_cast<size_t>(rgba.size.height);
-    const uint8_t* const top = rgba.bytes() + 2 * y * width * 4;
-    const uint8_t* const bottom = rgba.bytes() + std::min(2 * y + 1, height - 1) * width * 4;
-    const size_t left = 2 * x * 4;
-    const size_t right = std::min(2 * x + 1, width - 1) * 4;
-    const auto mean = [&](size_t channel) {
-        return (top[left + channel] + top[right + channel] + bottom[left + channel] +
-                bottom[right + channel] + 2) >>
-               2;
-    };
-    return {mean(0), mean(1), mean(2)};
+// The mean colour of the pixels of a chroma sample. The last column and row stand in for those that
+// a picture of odd size lacks.
+Mean mean_color(const Picture& rgba, size_t left, size_t top, size_t across, size_t down) {
+    const auto width = static_cast<size_t>(rgba.size.width);
+    const auto height = static_cast<size_t>(rgba.size.height);
+    const int count = static_cast<int>(across * down);
+    Mean sum = {count / 2, count / 2, count / 2};
+    for (size_t y = top; y < top + down; ++y) {
+        for (size_t x = left; x < left + across; ++x) {
+            const size_t at = std::min(y, height - 1) * width + std::min(x, width - 1);
+            const uint8_t* const pixel = rgba.bytes() + at * 4;
+            sum = {sum.r + pixel[0], sum.g + pixel[1], sum.b + pixel[2]};
+        }
+    }
+    return {sum.r / count, sum.g / count, sum.b / count};
 }
 
 Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
@@ -88,10 +100,12 @@ Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
         const uint8_t* const pixel = rgba.bytes() + i * 4;
         to.bytes()[i] = luma(pixel[0], pixel[1], pixel[2]);
     }
+    if (format == PixelFormat::kGray) return to;
     const auto chroma = chroma_of(to.bytes(), format, rgba.size);
     for (size_t y = 0; y < chroma.height; ++y) {
         for (size_t x = 0; x < chroma.width; ++x) {
-            const Mean mean = mean_color(rgba, x, y);
+            const Mean mean =
+                mean_color(rgba, x * chroma.across, y * chroma.down, chroma.across, chroma.down);
             chroma.u[chroma.at(x, y)] = chroma_u(mean.r, mean.g, mean.b);
             chroma.v[chroma.at(x, y)] = chroma_v(mean.r, mean.g, mean.b);
         }
@@ -99,13 +113,25 @@ Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
     return to;
 }
 
+Picture gray_to_rgba(const Picture& gray) {
+    Picture rgba(gray.size);
+    rgba.is_gray = true;
+    uint8_t* to = rgba.bytes();
+    for (size_t i = 0; i < gray.size.pixels(); ++i, to += 4) {
+        to[0] = to[1] = to[2] = gray.bytes()[i];
+        to[3] = 255;
+    }
+    return rgba;
+}
+
 Picture yuv_to_rgba(const Picture& yuv) {
+    if (yuv.format == PixelFormat::kGray) return gray_to_rgba(yuv);
     Picture rgba(yuv.size);
     const size_t width = static_cast<size_t>(yuv.size.width);
     const auto chroma = chroma_of(yuv.bytes(), yuv.format, yuv.size);
     uint8_t* to = rgba.bytes();
     for (size_t i = 0; i < yuv.size.pixels(); ++i) {
-        const size_t sample = chroma.at(i % width / 2, i / width / 2);
+        const size_t sample = chroma.at(i % width / chroma.across, i / width / chroma.down);
         const int y = yuv.bytes()[i] << 16;
         const int u = chroma.u[sample] - 128;
         const int v = chroma.v[sample] - 128;
@@ -143,12 +169,12 @@ Picture rgba_to_rgb(const Picture& rgba) {
 }
 
 Picture to_rgba(const Picture& picture) {
-    if (has_chroma_planes(picture.format)) return yuv_to_rgba(picture);
+    if (is_yuv(picture.format)) return yuv_to_rgba(picture);
     return picture.format == PixelFormat::kRgb ? rgb_to_rgba(picture) : picture;
 }
 
 Picture from_rgba(Picture rgba, PixelFormat format) {
-    if (has_chroma_planes(format)) return rgba_to_yuv(rgba, format);
+    if (is_yuv(format)) return rgba_to_yuv(rgba, format);
     return format == PixelFormat::kRgb ? rgba_to_rgb(rgba) : std::move(rgba);
 }
 
@@ -156,7 +182,7 @@ Picture from_rgba(Picture rgba, PixelFormat format) {
 
 Picture converted(const Picture& picture, PixelFormat format) {
     if (picture.format == format) return picture;
-    if (has_chroma_planes(picture.format) && has_chroma_planes(format)) {
+    if (is_420(picture.format) && is_420(format)) {
         return chroma_rearranged(picture, format);
     }
     return from_rgba(to_rgba(picture), format);

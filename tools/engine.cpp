@@ -3,6 +3,7 @@
 
 #include <ovrinresize.h>
 
+#include <cstring>
 #include <vector>
 
 #include "convert.h"
@@ -13,21 +14,18 @@ namespace tool {
 
 namespace {
 
-void resize_whole(const Picture& source, Picture* result) {
+// Not for planes of other formats.
+void resize_quarter(const Picture& source, Picture* result) {
     const auto call = [&](auto function, auto* dst) {
         function(source.bytes(), dst, source.size.width, source.size.height, result->size.width,
                  result->size.height);
     };
-    switch (source.format) {
-        case PixelFormat::kRgba:
-            return call(ovrin_resize_rgba8888, result->words.data());
-        case PixelFormat::kRgb:
-            return call(ovrin_resize_rgb888, result->bytes());
-        case PixelFormat::kI420:
-            return call(ovrin_resize_yuv420, result->bytes());
-        case PixelFormat::kNv21:
-            return call(ovrin_resize_nv21, result->bytes());
+    if (source.format == PixelFormat::kRgba) {
+        return call(ovrin_resize_rgba8888, result->words.data());
     }
+    if (source.format == PixelFormat::kRgb) return call(ovrin_resize_rgb888, result->bytes());
+    if (source.format == PixelFormat::kI420) return call(ovrin_resize_yuv420, result->bytes());
+    call(ovrin_resize_nv21, result->bytes());
 }
 
 ovrin_resize_target target_of(Size source, const Placement& placement, void* canvas) {
@@ -101,31 +99,63 @@ void resize_any_bilinear(Bilinear* bilinear, Picture* source, Picture* result) {
     *result = converted(rgba, PixelFormat::kRgb);
 }
 
-// Planes one by one: the library's own function for Y and VU wants more chroma than a frame has.
-void resize_planes_lanczos(const Picture& source, Picture* result) {
-    const bool planar = source.format == PixelFormat::kI420;
-    const auto half = [](Size size) { return Size{(size.width + 1) / 2, (size.height + 1) / 2}; };
-    const auto plane = [](const uint8_t* src, Size from, uint8_t* dst, Size to, int32_t samples) {
-        ov_lanczos(src, from.width, from.height, dst, to.width, to.height, samples);
-    };
-    const Size from = half(source.size);
-    const Size to = half(result->size);
-    const uint8_t* src = source.bytes() + source.size.pixels();
-    uint8_t* dst = result->bytes() + result->size.pixels();
-    plane(source.bytes(), source.size, result->bytes(), result->size, 1);
-    if (!planar) return plane(src, from, dst, to, 2);
-    plane(src, from, dst, to, 1);
-    plane(src + from.pixels(), from, dst + to.pixels(), to, 1);
+// Formats that the library itself resizes, by its engines that know them.
+void resize_whole(Engine engine, Picture* source, Picture* result) {
+    switch (engine) {
+        case Engine::kQuarter:
+            return resize_quarter(*source, result);
+        case Engine::kBilinear:
+            // On the calling thread at any height: in bands the engine would not interpolate.
+            return resize_any_bilinear(ov_bilinear_sg, source, result);
+        case Engine::kBilinearProgressive:
+            return resize_any_bilinear(ov_bilinear_ex, source, result);
+        case Engine::kNearest:
+            return resize_nearest(*source, result);
+        case Engine::kLanczos:
+        case Engine::kThumbnail:
+            return;  // these take planes
+    }
 }
 
-void resize_lanczos(const Picture& source, Picture* result) {
-    if (has_chroma_planes(source.format)) return resize_planes_lanczos(source, result);
-    if (source.format == PixelFormat::kRgb) {
-        return ov_lanczos(source.bytes(), source.size.width, source.size.height, result->bytes(),
-                          result->size.width, result->size.height, 3);
+// A plane of single bytes by an engine that knows none: as the luma of a picture in 4:2:0 whose
+// chroma nobody looks at.
+void resize_as_luma(Engine engine, const uint8_t* from, Size size, uint8_t* to, Size target) {
+    Picture picture(size, PixelFormat::kI420);
+    const auto width = static_cast<size_t>(size.width);
+    memcpy(picture.bytes(), from, size.pixels());
+    // The bilinear engine may read a row past the end, which then counts; it repeats the last one.
+    memcpy(picture.bytes() + size.pixels(), from + size.pixels() - width, width);
+    Picture result(target, PixelFormat::kI420);
+    resize_whole(engine, &picture, &result);
+    memcpy(to, result.bytes(), target.pixels());
+}
+
+// Each plane for itself, so that those of source and result need not cover the same pixels. What
+// a gray picture lacks is neutral.
+void resize_planes(Engine engine, Picture* source, Picture* result) {
+    constexpr uint8_t kNeutral = 128;
+    const std::vector<Plane> from = planes_of(source->format, source->size);
+    const std::vector<Plane> to = planes_of(result->format, result->size);
+    for (size_t i = 0; i < to.size(); ++i) {
+        uint8_t* const dst = result->bytes() + to[i].offset;
+        if (i >= from.size()) {
+            memset(dst, kNeutral, to[i].bytes());
+            continue;
+        }
+        uint8_t* const src = source->bytes() + from[i].offset;
+        if (engine == Engine::kLanczos) {
+            resize_lanczos(src, from[i].size, dst, to[i].size, from[i].channels);
+        } else if (engine == Engine::kThumbnail) {
+            resize_thumbnail(src, from[i].size, dst, to[i].size, from[i].channels);
+        } else {
+            resize_as_luma(engine, src, from[i].size, dst, to[i].size);
+        }
     }
-    ovrin_resize_lanczos(source.bytes(), result->bytes(), source.size.width, source.size.height,
-                         result->size.width, result->size.height, 4);
+}
+
+bool is_resized_whole(Engine engine, PixelFormat from, PixelFormat to) {
+    if (engine == Engine::kLanczos || engine == Engine::kThumbnail) return false;
+    return from == to && (is_420(from) || !is_yuv(from));
 }
 
 }  // namespace
@@ -154,30 +184,26 @@ void check_engine(Engine engine, PixelFormat format) {
     }
 }
 
+void resize_lanczos(const uint8_t* src, Size from, uint8_t* dst, Size to, int32_t channels) {
+    if (channels < 4) {
+        return ov_lanczos(src, from.width, from.height, dst, to.width, to.height, channels);
+    }
+    ovrin_resize_lanczos(src, dst, from.width, from.height, to.width, to.height, channels);
+}
+
 void resize(Engine engine, Picture* source, Picture* result) {
     result->has_alpha = source->has_alpha;
     result->is_gray = source->is_gray;
-    switch (engine) {
-        case Engine::kQuarter:
-            return resize_whole(*source, result);
-        case Engine::kThumbnail:
-            return resize_thumbnail(source, result);
-        case Engine::kBilinear:
-            // On the calling thread at any height: in bands the engine would not interpolate.
-            return resize_any_bilinear(ov_bilinear_sg, source, result);
-        case Engine::kBilinearProgressive:
-            return resize_any_bilinear(ov_bilinear_ex, source, result);
-        case Engine::kLanczos:
-            return resize_lanczos(*source, result);
-        case Engine::kNearest:
-            return resize_nearest(*source, result);
+    if (!is_resized_whole(engine, source->format, result->format)) {
+        return resize_planes(engine, source, result);
     }
+    resize_whole(engine, source, result);
 }
 
 void resize_onto_canvas(const Picture& source, const Placement& placement, Picture* canvas) {
     canvas->has_alpha = source.has_alpha;
     canvas->is_gray = source.is_gray;
-    if (has_chroma_planes(source.format)) return place_yuv(source, placement, canvas);
+    if (is_420(source.format)) return place_yuv(source, placement, canvas);
     if (source.format == PixelFormat::kRgba) return place_rgba(source, placement, canvas);
     // The library places no RGB; RGBA gives the same bytes.
     Picture rgba(placement.result);

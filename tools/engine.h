@@ -16,11 +16,14 @@ const char* name_of(Engine engine);
 // Throws Error when the engine cannot resize pictures of this format.
 void check_engine(Engine engine, PixelFormat format);
 
-// Resizes into *result, which has the source's format. The engine has passed check_engine(). May
-// use up the source.
+// Resizes into *result, which has the source's format or, where that is YUV, may have another one
+// that is. The engine has passed check_engine(). May use up the source.
 void resize(Engine engine, Picture* source, Picture* result);
 
-// The quarter engine, straight onto a black, transparent canvas.
+// The Lanczos engine on samples of 1 to 4 bytes that lie side by side.
+void resize_lanczos(const uint8_t* src, Size from, uint8_t* dst, Size to, int32_t channels);
+
+// The quarter engine, straight onto a black, transparent canvas. Not for planes other than 4:2:0.
 void resize_onto_canvas(const Picture& source, const Placement& placement, Picture* canvas);
 
 // What the engine makes of white and of full alpha, 255.

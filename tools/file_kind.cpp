@@ -19,6 +19,9 @@ constexpr Ending kEndings[] = {
     {".jpg", {Container::kJpeg, PixelFormat::kRgba}},
     {".jpeg", {Container::kJpeg, PixelFormat::kRgba}},
     {".ppm", {Container::kPpm, PixelFormat::kRgba}},
+    {".pgm", {Container::kPgm, PixelFormat::kRgba}},
+    {".pnm", {Container::kPnm, PixelFormat::kRgba}},
+    {".pam", {Container::kPam, PixelFormat::kRgba}},
     {".y4m", {Container::kY4m, PixelFormat::kI420}},
     {".nv21", {Container::kRaw, PixelFormat::kNv21}},
     {".i420", {Container::kRaw, PixelFormat::kI420}},
@@ -34,7 +37,7 @@ bool is_image_file(FileKind kind) {
 }
 
 bool holds_alpha(FileKind kind) {
-    return kind.container == Container::kPng ||
+    return kind.container == Container::kPng || kind.container == Container::kPam ||
            (kind.container == Container::kRaw && kind.format == PixelFormat::kRgba);
 }
 

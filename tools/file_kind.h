@@ -7,7 +7,8 @@
 
 namespace tool {
 
-enum class Container { kPng, kJpeg, kPpm, kY4m, kRaw };
+// kPnm: PGM where the picture is gray, PPM elsewhere.
+enum class Container { kPng, kJpeg, kPnm, kPpm, kPgm, kPam, kY4m, kRaw };
 
 struct FileKind {
     Container container;

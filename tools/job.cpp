@@ -67,6 +67,25 @@ SinkSettings settings_of(const Options& options, const Source& source, const Pla
     return settings;
 }
 
+// Planes of frames stay as they are, unless OUT is to be 4:2:0.
+PixelFormat result_format(PixelFormat format, FileKind out) {
+    const bool becomes_420 = is_yuv(format) && !is_420(format) && is_420(out.format);
+    return becomes_420 ? PixelFormat::kI420 : format;
+}
+
+FileKind kind_of_out(const Options& options, const Source& source) {
+    FileKind kind = source.kind();
+    if (options.output_type) {
+        kind = *options.output_type;
+    } else if (options.out != "-") {
+        kind = kind_of_name(options.out);
+    }
+    check_conversion(source.kind(), kind);
+    // Y4M holds whatever it held before.
+    if (kind.container == Container::kY4m) kind.format = source.kind().format;
+    return kind;
+}
+
 void judge_damage(const Options& options, const std::string& damage) {
     if (damage.empty()) return;
     if (options.strict) throw Error(options.in + ": " + damage);
@@ -80,20 +99,22 @@ void run(const Options& options) {
     if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
     const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
     judge_damage(options, source->metadata().damage);
+    if (!options.quiet && !source->remark().empty()) {
+        say((options.in + ": " + source->remark()).c_str());
+    }
     const PixelFormat format = source->kind().format;
-    const FileKind out_kind = concerning(options.out, [&] {
-        if (options.output_type) return *options.output_type;
-        return options.out == "-" ? source->kind() : kind_of_name(options.out);
-    });
-    check_conversion(source->kind(), out_kind);
+    const FileKind out_kind =
+        concerning(options.out, [&] { return kind_of_out(options, *source); });
+    const PixelFormat format_of_result = result_format(format, out_kind);
     const Orientation orientation =
         options.rotate ? orientation_of(source->metadata()) : Orientation::kUpright;
     const Size upright = turned(source->size(), orientation);
-    const Placement placement = place(options.wish, upright, format);
+    const Placement placement = place(options.wish, upright, format_of_result);
     const Engine engine = engine_for(options, *source, upright, placement.picture);
     check_engine(engine, format);
     const Resizing how = {engine,
                           placement,
+                          format_of_result,
                           orientation,
                           background_of(options, out_kind),
                           options.background,

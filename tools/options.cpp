@@ -99,7 +99,7 @@ FileKind read_type(const std::string& text) {
     try {
         return kind_of_name("x." + text);
     } catch (const Error&) {
-        throw Error("'" + text + "' is none of: png jpg ppm y4m nv21 i420 rgba rgb");
+        throw Error("'" + text + "' is none of: png jpg ppm pgm pnm pam y4m nv21 i420 rgba rgb");
     }
 }
 
@@ -141,10 +141,11 @@ void add_frames(CLI::App* app, Options* options) {
 
 void declare_files(CLI::App* app, Options* options) {
     app->add_option("IN OUT", options->files,
-                    "IN is PNG, JPEG, binary PPM, Y4M or, with --format, raw frames;\n"
-                    "- is standard input. OUT ends in .png, .jpg, .jpeg, .ppm, .y4m, or\n"
-                    "for raw frames in .nv21, .i420, .yuv, .rgba, .rgb; - is standard\n"
-                    "output, with the type of IN. With --output all are IN")
+                    "IN is PNG, JPEG, PBM, PGM, PPM, PAM, Y4M or, with --format, raw\n"
+                    "frames; - is standard input. OUT ends in .png, .jpg, .jpeg, .ppm,\n"
+                    ".pgm, .pnm, .pam, .y4m, or for raw frames in .nv21, .i420, .yuv,\n"
+                    ".rgba, .rgb; - is standard output, with the type of IN. With\n"
+                    "--output all are IN")
         ->type_name("");
     app->add_option_function<std::string>(
            "-o,--output", [options](const std::string& text) { options->output = text; },
@@ -152,8 +153,8 @@ void declare_files(CLI::App* app, Options* options) {
            "without folder and ending, like thumbs/%s.jpg")
         ->type_name("TEMPLATE");
     add_value(app, "-t,--output-type", "TYPE", &options->output_type, read_type,
-              "Type of OUT whatever its name: png, jpg, ppm, y4m, nv21, i420, rgba\n"
-              "or rgb");
+              "Type of OUT whatever its name: png, jpg, ppm, pgm, pnm, pam, y4m,\n"
+              "nv21, i420, rgba or rgb");
     app->add_flag("-r,--recursive", options->recursive, "Take pictures in folders, too")
         ->needs("--output");
     app->add_option("-j,--jobs", options->jobs,

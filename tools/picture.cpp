@@ -3,28 +3,63 @@
 
 namespace tool {
 
+namespace {
+
+struct Chroma {
+    int32_t across, down;  // pixels of a sample
+};
+
+Chroma chroma_of(PixelFormat format) {
+    if (format == PixelFormat::kI444) return {1, 1};
+    if (format == PixelFormat::kI422) return {2, 1};
+    return {2, 2};
+}
+
+}  // namespace
+
 const char* name_of(PixelFormat format) {
     switch (format) {
         case PixelFormat::kRgba:
             return "rgba";
         case PixelFormat::kRgb:
             return "rgb";
+        case PixelFormat::kGray:
+            return "gray";
         case PixelFormat::kI420:
             return "i420";
         case PixelFormat::kNv21:
             return "nv21";
+        case PixelFormat::kI422:
+            return "i422";
+        case PixelFormat::kI444:
+            return "i444";
     }
     return "";
 }
 
-bool has_chroma_planes(PixelFormat format) {
+bool is_420(PixelFormat format) {
     return format == PixelFormat::kI420 || format == PixelFormat::kNv21;
 }
 
+bool is_yuv(PixelFormat format) {
+    return format != PixelFormat::kRgba && format != PixelFormat::kRgb;
+}
+
+std::vector<Plane> planes_of(PixelFormat format, Size size) {
+    if (format == PixelFormat::kRgba) return {{0, size, 4, 1, 1}};
+    if (format == PixelFormat::kRgb) return {{0, size, 3, 1, 1}};
+    const Plane luma = {0, size, 1, 1, 1};
+    if (format == PixelFormat::kGray) return {luma};
+    const auto [across, down] = chroma_of(format);
+    const Size half = {(size.width + across - 1) / across, (size.height + down - 1) / down};
+    if (format == PixelFormat::kNv21) return {luma, {luma.bytes(), half, 2, across, down}};
+    const Plane u = {luma.bytes(), half, 1, across, down};
+    return {luma, u, {u.offset + u.bytes(), half, 1, across, down}};
+}
+
 size_t picture_bytes(PixelFormat format, Size size) {
-    const Size chroma = {(size.width + 1) / 2, (size.height + 1) / 2};
-    if (has_chroma_planes(format)) return size.pixels() + 2 * chroma.pixels();
-    return size.pixels() * (format == PixelFormat::kRgb ? 3 : 4);
+    const Plane last = planes_of(format, size).back();
+    return last.offset + last.bytes();
 }
 
 Picture::Picture(Size the_size, PixelFormat the_format) : format(the_format), size(the_size) {

@@ -9,16 +9,32 @@
 
 namespace tool {
 
-// RGBA and RGB: bytes in that order. I420 and NV21: a plane of luma, then chroma at half the size,
-// rounded up; I420 has a plane of U and one of V, NV21 a plane of pairs, V before U.
-enum class PixelFormat { kRgba, kRgb, kI420, kNv21 };
+// RGBA and RGB: bytes in that order. The others: a plane of luma, then chroma, at half the size,
+// rounded up, in 4:2:0 (I420 and NV21), at half the width in 4:2:2 (I422). NV21 has a plane of
+// pairs, V before U, the others have a plane of U and one of V; gray has none.
+enum class PixelFormat { kRgba, kRgb, kGray, kI420, kNv21, kI422, kI444 };
 
 const char* name_of(PixelFormat format);
 
-// 4:2:0, that is I420 or NV21.
-bool has_chroma_planes(PixelFormat format);
+bool is_420(PixelFormat format);
+
+// Neither RGBA nor RGB.
+bool is_yuv(PixelFormat format);
 
 size_t picture_bytes(PixelFormat format, Size size);
+
+// Part of a picture whose samples lie side by side: all of a packed one, or one plane.
+struct Plane {
+    size_t offset;     // bytes from the picture's start
+    Size size;         // in samples
+    int32_t channels;  // bytes of a sample
+    int32_t across;    // pixels that a sample covers
+    int32_t down;
+
+    size_t bytes() const { return size.pixels() * static_cast<size_t>(channels); }
+};
+
+std::vector<Plane> planes_of(PixelFormat format, Size size);
 
 // A picture in memory, rows packed.
 struct Picture {

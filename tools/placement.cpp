@@ -11,9 +11,11 @@ namespace tool {
 namespace {
 
 // The library's 4:2:0 functions lay chroma exactly under the luma only where sizes are multiples of
-// 4; two pixels of distortion are less visible than colours beside their shapes.
+// 4; two pixels of distortion are less visible than colours beside their shapes. Planes that are
+// resized one by one need as much as whole samples of chroma.
 int64_t unit_of(PixelFormat format) {
-    return has_chroma_planes(format) ? 4 : 1;
+    if (is_420(format)) return 4;
+    return format == PixelFormat::kI422 ? 2 : 1;
 }
 
 // round(side * numerator / denominator) to a multiple of `unit`, at least one unit, at most
@@ -82,7 +84,7 @@ Size limited(Size asked, Size source, Limit limit) {
 Placement placed(Size picture, Size frame, bool keeps_aspect, Gravity gravity, PixelFormat format) {
     int32_t x = (frame.width - picture.width) * gravity.across / 2;
     int32_t y = (frame.height - picture.height) * gravity.down / 2;
-    if (has_chroma_planes(format)) {
+    if (unit_of(format) > 1) {
         // A chroma sample covers two pixels each way.
         x -= x % 2;
         y -= y % 2;

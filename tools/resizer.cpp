@@ -8,19 +8,23 @@ namespace tool {
 
 namespace {
 
+// Whether the canvas is ours to draw: the library draws black ones, with one engine, in some
+// formats, and crops nothing.
+bool draws_canvas(const Resizing& resizing, const Placement& placement, PixelFormat format) {
+    const bool is_cropped = placement.x < 0 || placement.y < 0;
+    const bool is_known = resizing.format == format && (is_420(format) || !is_yuv(format));
+    return resizing.engine != Engine::kQuarter || resizing.canvas || is_cropped || !is_known;
+}
+
 void resize_and_place(const Resizing& resizing, const Placement& placement, Picture* frame,
                       Picture* result) {
-    // The library draws black ones, with one engine, and crops nothing.
-    const bool is_cropped = placement.x < 0 || placement.y < 0;
-    const bool draws_canvas = placement.on_canvas && (resizing.engine != Engine::kQuarter ||
-                                                      resizing.canvas || is_cropped);
-    if (draws_canvas) {
-        Picture picture(placement.picture, frame->format);
+    if (placement.on_canvas && draws_canvas(resizing, placement, frame->format)) {
+        Picture picture(placement.picture, resizing.format);
         resize(resizing.engine, frame, &picture);
         *result = on_canvas(picture, placement, resizing.canvas);
         return;
     }
-    if (result->words.empty()) *result = Picture(placement.result, frame->format);
+    if (result->words.empty()) *result = Picture(placement.result, resizing.format);
     if (placement.on_canvas) return resize_onto_canvas(*frame, placement, result);
     resize(resizing.engine, frame, result);
 }

@@ -15,6 +15,7 @@ namespace tool {
 struct Resizing {
     Engine engine;
     Placement placement;  // of the upright picture
+    PixelFormat format;   // of the result, see engine.h
     Orientation orientation = Orientation::kUpright;
     std::optional<Color> background;  // behind what is transparent
     std::optional<Color> canvas;      // of the canvas; otherwise black, and transparent

@@ -31,6 +31,12 @@ void Sink::write_in_format(const Picture& frame) {
             return encode_jpeg(frame, settings_.metadata, settings_.quality, stream_);
         case Container::kPpm:
             return encode_ppm(frame, stream_);
+        case Container::kPgm:
+            return encode_pgm(frame, stream_);
+        case Container::kPnm:
+            return frame.is_gray ? encode_pgm(frame, stream_) : encode_ppm(frame, stream_);
+        case Container::kPam:
+            return encode_pam(frame, stream_);
         case Container::kY4m: {
             const std::string head =
                 (is_first_ ? y4m_header_line(*settings_.y4m_header) : "") + "FRAME\n";
@@ -51,7 +57,7 @@ void check_conversion(FileKind from, FileKind to) {
     if (to.container == Container::kY4m && !from_y4m) {
         throw Error("only Y4M can be written as Y4M");
     }
-    if (from_y4m && !has_chroma_planes(to.format)) {
+    if (from_y4m && to.container != Container::kY4m && !is_420(to.format)) {
         throw Error("Y4M can be written as .y4m, .i420, .yuv or .nv21 only");
     }
 }

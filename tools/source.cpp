@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "source.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "alpha.h"
@@ -46,8 +47,21 @@ public:
         size_ = checked_size(layout.size.width, layout.size.height);
     }
 
-    bool next(Picture* frame) override { return read_frame(frame); }
+    bool next(Picture* frame) override {
+        if (frame->words.empty()) *frame = Picture(size_, kind_.format);
+        return read_frame(frame->bytes(), frame->byte_count());
+    }
 };
+
+// Samples of more than 8 bits, rounded to 8. Two bytes each, little end first; what exceeds the
+// bits counts as white.
+void reduce(const Bytes& samples, int bits, uint8_t* to) {
+    const int shift = bits - 8;
+    for (size_t i = 0; i < samples.size(); i += 2) {
+        const int value = samples[i] | samples[i + 1] << 8;
+        *to++ = static_cast<uint8_t>(std::min((value + (1 << shift >> 1)) >> shift, 255));
+    }
+}
 
 class Y4m : public Source {
 public:
@@ -56,6 +70,10 @@ public:
         if (!input_.read_line(&line, kMaxY4mLine)) throw Error("damaged Y4M: bad header");
         y4m_header_ = parse_y4m_header(line);
         size_ = y4m_header_->size;
+        kind_.format = y4m_header_->format;
+        if (y4m_header_->bits > 8) {
+            remark_ = "samples of " + std::to_string(y4m_header_->bits) + " bits are rounded to 8";
+        }
     }
 
     bool next(Picture* frame) override {
@@ -65,17 +83,28 @@ public:
         if (!is_whole || line.compare(0, 5, "FRAME") != 0) {
             throw Error("damaged Y4M: a frame was expected");
         }
-        if (!read_frame(frame)) throw Error("damaged Y4M: the last frame is empty");
+        if (frame->words.empty()) *frame = Picture(size_, kind_.format);
+        if (!read_samples(frame)) throw Error("damaged Y4M: the last frame is empty");
         return true;
     }
+
+private:
+    bool read_samples(Picture* frame) {
+        const size_t count = frame->byte_count();
+        if (y4m_header_->bits == 8) return read_frame(frame->bytes(), count);
+        deep_.resize(2 * count);
+        if (!read_frame(deep_.data(), deep_.size())) return false;
+        reduce(deep_, y4m_header_->bits, frame->bytes());
+        return true;
+    }
+
+    Bytes deep_;  // samples of more than 8 bits
 };
 
 }  // namespace
 
-bool Source::read_frame(Picture* frame) {
-    if (frame->words.empty()) *frame = Picture(size_, kind_.format);
-    const size_t bytes = frame->byte_count();
-    const size_t got = input_.read(frame->bytes(), bytes);
+bool Source::read_frame(uint8_t* to, size_t bytes) {
+    const size_t got = input_.read(to, bytes);
     if (got == 0) return false;
     ++frames_read_;
     if (got < bytes) {
@@ -94,11 +123,14 @@ std::unique_ptr<Source> open_source(const std::string& path, const std::optional
     if (is(is_png)) return std::make_unique<Still>(std::move(input), Container::kPng, decode_png);
     if (is(is_jpeg))
         return std::make_unique<Still>(std::move(input), Container::kJpeg, decode_jpeg);
-    if (is(is_ppm)) return std::make_unique<Still>(std::move(input), Container::kPpm, decode_ppm);
+    if (is(is_pnm)) {
+        const Container container = head[1] == '7' ? Container::kPam : Container::kPnm;
+        return std::make_unique<Still>(std::move(input), container, decode_pnm);
+    }
     if (std::string(head.begin(), head.end()).compare(0, kY4mMagicBytes, kY4mMagic) == 0) {
         return std::make_unique<Y4m>(std::move(input));
     }
-    throw Error("neither PNG, JPEG, binary PPM (P6) nor Y4M; raw frames need --format");
+    throw Error("neither PNG, JPEG, PNM, PAM nor Y4M; raw frames need --format");
 }
 
 }  // namespace tool

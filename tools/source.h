@@ -33,19 +33,22 @@ public:
     // Of Y4M only.
     const std::optional<Y4mHeader>& y4m_header() const { return y4m_header_; }
     const Metadata& metadata() const { return metadata_; }
+    // What the user should know of how frames are read; empty: nothing.
+    const std::string& remark() const { return remark_; }
     double part_read() const { return input_.part_read(); }
 
 protected:
     Source(Input input, FileKind kind) : input_(std::move(input)), kind_(kind), size_() {}
 
     // Reads one frame's bytes; false at the end of the file. A frame that is cut short is an Error.
-    bool read_frame(Picture* frame);
+    bool read_frame(uint8_t* to, size_t bytes);
 
     Input input_;
     FileKind kind_;
     Size size_;
     std::optional<Y4mHeader> y4m_header_;
     Metadata metadata_;
+    std::string remark_;
 
 private:
     int64_t frames_read_ = 0;

@@ -1,9 +1,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "thumbnail.h"
 
-#include <algorithm>
-#include <cstring>
-#include <utility>
+#include <vector>
 
 #include "engine.h"
 
@@ -11,82 +9,65 @@ namespace tool {
 
 namespace {
 
-constexpr uint32_t kInEachByte = 0x01010101;
-
 bool is_at_least(Size size, int32_t times, Size other) {
     return size.width / times >= other.width && size.height / times >= other.height;
 }
 
-// Of frames in 4:2:0 the library lays chroma exactly under the luma where sizes are multiples of 4.
-int32_t half_side(int32_t side, PixelFormat format) {
-    const int32_t unit = has_chroma_planes(format) ? 4 : 1;
-    return side / 2 / unit * unit;
-}
-
-// The mean of each 2 x 2 samples, rounded. The quarter engine takes just these four when it halves,
-// and drops their two low bits; a second pass, over the low bits, says what that has cost.
-Picture halved(Picture source, Size size) {
-    Picture result(size, source.format);
-    resize(Engine::kQuarter, &source, &result);
-    for (uint32_t& word : source.words) word = (word & 3 * kInEachByte) << 2;
-    Picture low_bits(size, source.format);
-    resize(Engine::kQuarter, &source, &low_bits);
-    for (size_t i = 0; i < result.words.size(); ++i) {
-        // At most 252 + 3, and 12 + 2: no byte carries into the next.
-        result.words[i] += ((low_bits.words[i] + 2 * kInEachByte) >> 2) & 3 * kInEachByte;
+// A row of the mean of each 2 x 2 samples of two rows, rounded.
+template <size_t kChannels>
+void halve_rows(const uint8_t* top, const uint8_t* bottom, uint8_t* to, size_t samples) {
+    for (size_t x = 0; x < samples; ++x) {
+        for (size_t c = 0; c < kChannels; ++c) {
+            const size_t left = 2 * x * kChannels + c;
+            const size_t right = left + kChannels;
+            to[x * kChannels + c] = static_cast<uint8_t>(
+                (top[left] + top[right] + bottom[left] + bottom[right] + 2) / 4);
+        }
     }
-    return result;
 }
 
-// Strip by strip, each into the room of those before it, so that a large picture needs no second
-// one beside it, and strips stay in the cache. RGBA and RGB.
-void halve_in_strips(Picture* picture, Size half) {
-    constexpr int32_t kStripRows = 16;  // of the result
-    const Size size = picture->size;
-    const size_t row_bytes = picture_bytes(picture->format, {size.width, 1});
-    const size_t half_row_bytes = picture_bytes(picture->format, {half.width, 1});
-    uint8_t* const bytes = picture->bytes();
-    int32_t rows = 0;
-    for (int32_t done = 0; done < half.height; done += rows) {
-        rows = std::min(kStripRows, half.height - done);
-        // The last takes the row that an odd height leaves.
-        const bool is_last = done + rows == half.height;
-        Picture strip({size.width, is_last ? size.height - 2 * done : 2 * rows}, picture->format);
-        memcpy(strip.bytes(), bytes + static_cast<size_t>(2 * done) * row_bytes,
-               strip.byte_count());
-        const Picture half_strip = halved(std::move(strip), {half.width, rows});
-        memcpy(bytes + static_cast<size_t>(done) * half_row_bytes, half_strip.bytes(),
-               half_strip.byte_count());
+// An odd last row or column is left out. The result may lie where the source lies: no sample is
+// written before those that follow it have been read.
+template <size_t kChannels>
+void halve(const uint8_t* from, Size size, uint8_t* to) {
+    const size_t row_bytes = static_cast<size_t>(size.width) * kChannels;
+    const auto half_width = static_cast<size_t>(size.width / 2);
+    for (int32_t y = 0; y < size.height / 2; ++y) {
+        halve_rows<kChannels>(from, from + row_bytes, to, half_width);
+        from += 2 * row_bytes;
+        to += half_width * kChannels;
     }
-    picture->size = half;
-    picture->words.resize((picture->byte_count() + 3) / 4);
 }
 
-void halve(Picture* picture, Size half) {
-    if (!has_chroma_planes(picture->format)) return halve_in_strips(picture, half);
-    *picture = halved(std::move(*picture), half);
+void halve(const uint8_t* from, Size size, uint8_t* to, int32_t channels) {
+    switch (channels) {
+        case 1:
+            return halve<1>(from, size, to);
+        case 2:
+            return halve<2>(from, size, to);
+        case 3:
+            return halve<3>(from, size, to);
+        default:
+            return halve<4>(from, size, to);
+    }
 }
 
 }  // namespace
 
-void resize_thumbnail(Picture* source, Picture* result) {
-    const Size target = result->size;
-    Size half = source->size;
-    for (;;) {
-        half = {half_side(half.width, source->format), half_side(half.height, source->format)};
-        if (!is_at_least(half, 2, target)) break;
-        halve(source, half);
+void resize_thumbnail(uint8_t* src, Size from, uint8_t* dst, Size to, int32_t channels) {
+    while (is_at_least(from, 4, to)) {
+        halve(src, from, src, channels);
+        from = {from.width / 2, from.height / 2};
     }
-    if (!is_at_least(source->size, 2, target)) return resize(Engine::kLanczos, source, result);
+    if (!is_at_least(from, 2, to)) return resize_lanczos(src, from, dst, to, channels);
 
-    const Size twice = {2 * target.width, 2 * target.height};
-    if (source->size.width != twice.width || source->size.height != twice.height) {
-        Picture rest(twice, source->format);
-        resize(Engine::kLanczos, source, &rest);
-        *source = std::move(rest);
+    const Size twice = {2 * to.width, 2 * to.height};
+    if (from.width == twice.width && from.height == twice.height) {
+        return halve(src, from, dst, channels);
     }
-    halve(source, target);
-    *result = *source;
+    std::vector<uint8_t> rest(twice.pixels() * static_cast<size_t>(channels));
+    resize_lanczos(src, from, rest.data(), twice, channels);
+    halve(rest.data(), twice, dst, channels);
 }
 
 }  // namespace tool

@@ -2,6 +2,7 @@
 #include "y4m.h"
 
 #include <charconv>
+#include <cstring>
 #include <numeric>
 #include <sstream>
 
@@ -28,11 +29,42 @@ void parse_aspect(const std::string& value, Y4mHeader* header) {
     header->aspect_height = parse_number(value.substr(colon + 1));
 }
 
-void check_chroma(const std::string& value) {
-    for (const char* known : {"420", "420jpeg", "420mpeg2", "420paldv"}) {
-        if (value == known) return;
+struct ChromaName {
+    const char* name;
+    PixelFormat format;
+};
+
+constexpr ChromaName kChromaNames[] = {
+    {"420", PixelFormat::kI420},      {"420jpeg", PixelFormat::kI420},
+    {"420mpeg2", PixelFormat::kI420}, {"420paldv", PixelFormat::kI420},
+    {"422", PixelFormat::kI422},      {"444", PixelFormat::kI444},
+    {"mono", PixelFormat::kGray},
+};
+
+// What stands behind the name: nothing, or for deeper samples their bits, as in "420p10" and
+// "mono10". 0 where it is anything else.
+int bits_of(const std::string& text, PixelFormat format) {
+    if (text.empty()) return 8;
+    const size_t start = format == PixelFormat::kGray ? 0 : 1;
+    if (start == 1 && text[0] != 'p') return 0;
+    int bits = 0;
+    const char* const end = text.data() + text.size();
+    const auto [stop, status] = std::from_chars(text.data() + start, end, bits);
+    return status == std::errc() && stop == end && bits > 8 && bits <= 16 ? bits : 0;
+}
+
+void parse_chroma(const std::string& value, Y4mHeader* header) {
+    for (const auto& [name, format] : kChromaNames) {
+        const size_t length = strlen(name);
+        const int bits =
+            value.compare(0, length, name) == 0 ? bits_of(value.substr(length), format) : 0;
+        if (bits == 0) continue;
+        header->format = format;
+        header->bits = bits;
+        header->other_tags += std::string(" C") + name;
+        return;
     }
-    throw Error("Y4M of type C" + value + " is not handled, only 8-bit 4:2:0");
+    throw Error("Y4M of type C" + value + " is not handled, only 4:2:0, 4:2:2, 4:4:4 and mono");
 }
 
 void check_interlacing(const std::string& value) {
@@ -63,7 +95,11 @@ Y4mHeader parse_y4m_header(const std::string& line) {
                 parse_aspect(value, &header);
                 continue;
             case 'C':
-                check_chroma(value);
+                parse_chroma(value, &header);
+                continue;
+            case 'X':
+                // Another name of the same, for some readers.
+                if (value.compare(0, 6, "YSCSS=") == 0) continue;
                 break;
             case 'I':
                 check_interlacing(value);

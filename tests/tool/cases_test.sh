@@ -13,7 +13,7 @@ table=$2
 tables=$OLDPWD/$(dirname "${BASH_SOURCE[0]}")/cases
 case ${BASH_SOURCE[0]} in /*) tables=$(dirname "${BASH_SOURCE[0]}")/cases ;; esac
 
-for program in convert identify compare exiftool pngcheck djpeg python3; do
+for program in convert identify compare exiftool pngcheck djpeg ffmpeg ffprobe python3; do
     if ! command -v "$program" >/dev/null; then
         echo "skipped: no $program"
         exit 77
@@ -24,6 +24,7 @@ done
 
 source "$(dirname "$tables")/fixtures.sh"
 make_fixtures
+[ "$table" != inputs ] || make_inputs
 
 trim() {
     local text=${1#"${1%%[![:space:]]*}"}

@@ -72,9 +72,9 @@ Picture decode_jpeg(const uint8_t* data, size_t size) {
     return picture;
 }
 
-Picture decode_ppm(const uint8_t* data, size_t size) {
+Picture decode_pnm(const uint8_t* data, size_t size) {
     tool::Metadata ignored;
-    return tool::decode_ppm(data, size, &ignored);
+    return tool::decode_pnm(data, size, &ignored);
 }
 
 struct Codec {
@@ -89,7 +89,8 @@ const Codec kCodecs[] = {
      [](const Picture& picture, FILE* out) { tool::encode_png(picture, {}, out); }},
     {"JPEG", tool::is_jpeg, decode_jpeg,
      [](const Picture& picture, FILE* out) { tool::encode_jpeg(picture, {}, 90, out); }},
-    {"PPM", tool::is_ppm, decode_ppm, tool::encode_ppm},
+    {"PPM", tool::is_pnm, decode_pnm, tool::encode_ppm},
+    {"PAM", tool::is_pnm, decode_pnm, tool::encode_pam},
 };
 
 Bytes encoded(const Codec& codec, const Picture& picture) {
@@ -141,8 +142,8 @@ Bytes pixels_of(const Picture& picture) {
     return Bytes(picture.bytes(), picture.bytes() + picture.size.pixels() * 4);
 }
 
-Picture decode_ppm(const std::string& file) {
-    return decode_ppm(reinterpret_cast<const uint8_t*>(file.data()), file.size());
+Picture decode_pnm(const std::string& file) {
+    return decode_pnm(reinterpret_cast<const uint8_t*>(file.data()), file.size());
 }
 
 }  // namespace
@@ -159,9 +160,11 @@ TEST(Codecs, LosslessTypesKeepEveryPixel) {
             EXPECT_EQ(rgb_bytes(from_png), rgb_bytes(picture));
             if (has_alpha) {
                 EXPECT_EQ(from_png.words, picture.words);
+                const Bytes pam = encoded(kCodecs[3], picture);
+                EXPECT_EQ(decode_pnm(pam.data(), pam.size()).words, picture.words);
             }
             const Bytes ppm = encoded(kCodecs[2], picture);
-            const Picture from_ppm = decode_ppm(ppm.data(), ppm.size());
+            const Picture from_ppm = decode_pnm(ppm.data(), ppm.size());
             EXPECT_FALSE(from_ppm.has_alpha);
             EXPECT_EQ(rgb_bytes(from_ppm), rgb_bytes(picture));
         }
@@ -203,16 +206,57 @@ TEST(Codecs, GrayJpegIsReadAndCmykIsRefused) {
     EXPECT_THROW(decode_jpeg(cmyk.data(), cmyk.size()), tool::Error);
 }
 
-TEST(Codecs, PpmHeadersAndDepths) {
-    EXPECT_EQ(pixels_of(decode_ppm("P6#c\n1# 9\n\t1\r\n15\n\x0F\x05\x08")),
+TEST(Codecs, PnmHeadersAndDepths) {
+    EXPECT_EQ(pixels_of(decode_pnm("P6#c\n1# 9\n\t1\r\n15\n\x0F\x05\x08")),
               (Bytes{255, 85, 136, 255}));
-    EXPECT_EQ(pixels_of(decode_ppm(std::string("P6 1 1 65535 \xFF\xFF\x80\x80\0\0", 19))),
+    EXPECT_EQ(pixels_of(decode_pnm(std::string("P6 1 1 65535 \xFF\xFF\x80\x80\0\0", 19))),
               (Bytes{255, 128, 0, 255}));
     // Samples above the stated largest value count as that value.
-    EXPECT_EQ(pixels_of(decode_ppm("P6 1 1 10 \x0A\x7F\x05")), (Bytes{255, 255, 128, 255}));
+    EXPECT_EQ(pixels_of(decode_pnm("P6 1 1 10 \x0A\x7F\x05")), (Bytes{255, 255, 128, 255}));
+    // Every type, and what tells their samples apart.
+    EXPECT_EQ(pixels_of(decode_pnm("P1 3 1 1 0#c\n1")),
+              (Bytes{0, 0, 0, 255, 255, 255, 255, 255, 0, 0, 0, 255}));
+    EXPECT_EQ(pixels_of(decode_pnm("P1 2 1 01")), (Bytes{255, 255, 255, 255, 0, 0, 0, 255}));
+    EXPECT_EQ(pixels_of(decode_pnm("P2 2 1 3 1 3")), (Bytes{85, 85, 85, 255, 255, 255, 255, 255}));
+    EXPECT_EQ(pixels_of(decode_pnm("P3\n1 1\n1000\n0 500\t1000")), (Bytes{0, 128, 255, 255}));
+    // Rows of bits start at whole bytes.
+    EXPECT_EQ(pixels_of(decode_pnm("P4 1 2 \x80\x7F")), (Bytes{0, 0, 0, 255, 255, 255, 255, 255}));
+    EXPECT_EQ(pixels_of(decode_pnm("P5 1 1 255 \x09")), (Bytes{9, 9, 9, 255}));
+    EXPECT_EQ(pixels_of(decode_pnm("P5 1 1 1023 \x03\xFF")), (Bytes{255, 255, 255, 255}));
+    EXPECT_EQ(
+        pixels_of(decode_pnm("P7\n#c\nHEIGHT 1\nWIDTH 1\nMAXVAL 255\nDEPTH 2\nENDHDR\n\x09\x20")),
+        (Bytes{9, 9, 9, 32}));
+    EXPECT_EQ(pixels_of(decode_pnm("P7\nWIDTH 1\nHEIGHT 1\nDEPTH 1\nMAXVAL 1\n"
+                                   "TUPLTYPE BLACKANDWHITE\nENDHDR\n\x01")),
+              (Bytes{255, 255, 255, 255}));
+    EXPECT_TRUE(decode_pnm("P2 1 1 3 1").is_gray);
+    EXPECT_FALSE(decode_pnm("P3 1 1 3 1 1 1").is_gray);
+    for (const char* file : {"P1 2 1 0",
+                             "P1 2 1 02",
+                             "P1 2",
+                             "P2 1 1 255",
+                             "P2 1 1 255 x",
+                             "P2 2 1 255 1",
+                             "P2 1 1 0 1",
+                             "P2 65535 4096 255 1",
+                             "P3 1 1 255 1 2",
+                             "P4 9 1 a",
+                             "P5 1 1 255",
+                             "P5 1 1 256 a",
+                             "P7\nWIDTH 1",
+                             "P7\nENDHDR\na",
+                             "P7\nWIDTH\nENDHDR\n",
+                             "P7\nWIDTH 1\nHEIGHT 1\nDEPTH 1\nMAXVAL 255\nENDHDR",
+                             "P7\nWIDTH 1\nHEIGHT 1\nDEPTH 5\nMAXVAL 255\nENDHDR\nabcde",
+                             "P7\nWIDTH 1\nHEIGHT 1\nDEPTH 1\nMAXVAL 255\nTUPLTYPE RGB\nENDHDR\na",
+                             "P7\nWIDTH 1\nHEIGHT 1\nDEPTH 1\nMAXVAL 255\nTUPLTYPE CMYK\nENDHDR\na",
+                             "P7\nWIDTH 1\nHEIGHT 1\nDEPTH 1\nMAXVAL 255\nCOLOUR 1\nENDHDR\na",
+                             "P7\nWIDTH 1\nHEIGHT 1\nDEPTH 1\nMAXVAL 70000\nENDHDR\nab"}) {
+        EXPECT_THROW(decode_pnm(file), tool::Error) << file;
+    }
     for (const char* file : {"P6 1 1 255", "P6 1 1 0 abc", "P6 1 1 65536 abcdef", "P6 1 -1 255 abc",
                              "P6 1 x 255 abc", "P6 1 1 255 ab", "P6 # 1 1 255 abc"}) {
-        EXPECT_THROW(decode_ppm(file), tool::Error) << file;
+        EXPECT_THROW(decode_pnm(file), tool::Error) << file;
     }
 }
 
@@ -220,7 +264,7 @@ TEST(Codecs, EachTypeIsToldApart) {
     for (const Codec& codec : kCodecs) {
         const Bytes file = encoded(codec, gradient({9, 7}));
         for (const Codec& other : kCodecs) {
-            EXPECT_EQ(other.recognise(file.data(), file.size()), &codec == &other)
+            EXPECT_EQ(other.recognise(file.data(), file.size()), codec.decode == other.decode)
                 << codec.name << " as " << other.name;
         }
         for (size_t size = 0; size < 3; ++size) {

@@ -90,9 +90,9 @@ fails 1 'big.ppm: too large' big.ppm no.png --size 3x3
 printf 'P6 0 1 255\n' >flat.ppm
 fails 1 'flat.ppm: .*at least 1' flat.ppm no.png --size 3x3
 printf 'P6 1 1 70000\nabcdef' >deep.ppm
-fails 1 'deep.ppm: damaged PPM' deep.ppm no.png --size 3x3
+fails 1 'deep.ppm: damaged PNM' deep.ppm no.png --size 3x3
 printf 'P6 99999999999999999999 1 255\nabc' >overflow.ppm
-fails 1 'overflow.ppm: damaged PPM' overflow.ppm no.png --size 3x3
+fails 1 'overflow.ppm: damaged PNM' overflow.ppm no.png --size 3x3
 # A message is one line even when it quotes a name that is not.
 fails 1 'No such file' "$(printf 'two\nlines')" no.png --size 3x3
 

@@ -100,6 +100,48 @@ make_album() {
     echo 'no picture' >broken.jpg
 }
 
+# The family of Netpbm, as binary and as text; samples of 16 bits.
+make_netpbm() {
+    local type
+    for type in ppm pam; do
+        convert plain.png "plain.$type"
+        convert plain.png -depth 16 "deep.$type"
+    done
+    ffmpeg -nostdin -v error -i gray.png -pix_fmt gray gray.pam
+    convert plain.png -compress none text.ppm
+    for type in pgm pnm; do convert gray.png "gray.$type"; done
+    convert gray.png -compress none text.pgm
+    convert gray.png -depth 16 deep.pgm
+    convert bits.png bits.pbm
+    convert bits.png -compress none text.pbm
+    convert halo.png halo.pam
+    convert gray_halo.png gray_halo.pam
+    convert gray.png -depth 16 deep_gray.png
+    head -c 60 gray.pgm >cut.pgm
+    head -c 60 text.pgm >cut_text.pgm
+    head -c 15 bits.pbm >cut.pbm
+    head -c 90 plain.pam >cut.pam
+    sed 's/TUPLTYPE.*/TUPLTYPE CMYK/' plain.pam >odd.pam
+}
+
+# in_FORMAT.y4m: three frames of the scene, in each format of samples.
+make_videos() {
+    local format
+    for format in yuv420p yuv422p yuv444p gray yuv420p10le yuv422p10le yuv444p12le gray10le yuv411p; do
+        ffmpeg -nostdin -v error -loop 1 -i upright.png -frames:v 3 -pix_fmt "$format" -strict -1 \
+            -f yuv4mpegpipe "in_$format.y4m" 2>ffmpeg.log
+    done
+    # Samples of 0, 2, 1022 and 65535, of 10 bits.
+    printf 'YUV4MPEG2 W4 H1 Cmono10\nFRAME\n\x00\x00\x02\x00\xfe\x03\xff\xff' >steps.y4m
+    head -c 100000 in_yuv420p10le.y4m >cut.y4m
+}
+
+# What only the table of inputs needs.
+make_inputs() {
+    make_netpbm
+    make_videos
+}
+
 make_fixtures() {
     make_photographs
     make_coloured
@@ -120,6 +162,27 @@ like() {
     convert "$2" -strip -resize "$(identify -format '%wx%h!' seen.png)" -depth 8 PNG32:expected.png
     psnr=$(compare -metric PSNR seen.png expected.png null: 2>&1)
     awk -v psnr="$psnr" 'BEGIN { print (psnr == "inf" || psnr >= 25) ? "yes" : "no: " psnr " dB" }'
+}
+
+# video FILE: what another program says that it holds.
+video() {
+    ffprobe -v error -count_frames -show_entries stream=pix_fmt,width,height,nb_read_frames -of csv=p=0 "$1"
+}
+
+# frame FILE: its last one, as a PNG of that name.
+frame() {
+    ffmpeg -nostdin -v error -y -i "$1" -update 1 "$1.png"
+    echo "$1.png"
+}
+
+# samples FILE COUNT: its last ones.
+samples() {
+    tail -c "$2" "$1" | od -An -v -tu1 | xargs
+}
+
+# head_of FILE: its first two bytes.
+head_of() {
+    head -c 2 "$1"
 }
 
 # pixel FILE X,Y: its channels, 0 to 255, alpha where the file has it.

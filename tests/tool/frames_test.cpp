@@ -146,11 +146,32 @@ TEST(Convert, ChromaIsTheMeanOfItsPixels) {
               (std::vector<int>{76, 29, 150, 182, 170, 21, 44}));
 }
 
+TEST(Convert, ChromaOfEachSubsampling) {
+    // 2 x 2 pixels: red above blue.
+    const Picture rgb =
+        of_bytes({2, 2}, PixelFormat::kRgb, {255, 0, 0, 255, 0, 0, 0, 0, 255, 0, 0, 255});
+    const std::vector<int> luma = {76, 76, 29, 29};
+    const auto with = [&](const std::vector<int>& chroma) {
+        std::vector<int> all = luma;
+        all.insert(all.end(), chroma.begin(), chroma.end());
+        return all;
+    };
+    EXPECT_EQ(values(converted(rgb, PixelFormat::kGray)), luma);
+    EXPECT_EQ(values(converted(rgb, PixelFormat::kI422)), with({85, 255, 255, 107}));
+    EXPECT_EQ(values(converted(rgb, PixelFormat::kI444)),
+              with({85, 85, 255, 255, 255, 255, 107, 107}));
+    // And back: to what JPEG's formulas make of rounded samples.
+    const std::vector<int> back =
+        values(converted(converted(rgb, PixelFormat::kI422), PixelFormat::kRgb));
+    for (size_t i = 0; i < back.size(); ++i) EXPECT_NEAR(back[i], rgb.bytes()[i], 2) << i;
+}
+
 TEST(Convert, EveryPairOfFormatsAndOddSizes) {
     Random random(2);
     SCOPED_TRACE(random.trace());
-    const PixelFormat formats[] = {PixelFormat::kRgba, PixelFormat::kRgb, PixelFormat::kI420,
-                                   PixelFormat::kNv21};
+    const PixelFormat formats[] = {PixelFormat::kRgba, PixelFormat::kRgb,  PixelFormat::kGray,
+                                   PixelFormat::kI420, PixelFormat::kNv21, PixelFormat::kI422,
+                                   PixelFormat::kI444};
     for (const Size size : {Size{1, 1}, Size{2, 1}, Size{1, 3}, Size{7, 5}, Size{16, 8}}) {
         for (const PixelFormat from : formats) {
             for (const PixelFormat to : formats) {
@@ -168,6 +189,30 @@ TEST(Y4mHeaders, AreReadAndWritten) {
     EXPECT_EQ(to_string(header.size), "640x480");
     EXPECT_EQ(y4m_header_line(header), "YUV4MPEG2 W640 H480 A10:11 F25:1 Ip C420mpeg2 XA=B\n");
     EXPECT_EQ(y4m_header_line(parse_y4m_header("YUV4MPEG2 H1 W2")), "YUV4MPEG2 W2 H1 A0:0\n");
+}
+
+TEST(Y4mHeaders, NameTheSamples) {
+    struct Case {
+        const char* type;
+        PixelFormat format;
+        int bits;
+        const char* written;
+    };
+    const Case cases[] = {
+        {"420", PixelFormat::kI420, 8, "420"},           {"422", PixelFormat::kI422, 8, "422"},
+        {"444", PixelFormat::kI444, 8, "444"},           {"mono", PixelFormat::kGray, 8, "mono"},
+        {"420p10", PixelFormat::kI420, 10, "420"},       {"422p12", PixelFormat::kI422, 12, "422"},
+        {"444p16", PixelFormat::kI444, 16, "444"},       {"mono9", PixelFormat::kGray, 9, "mono"},
+        {"420paldv", PixelFormat::kI420, 8, "420paldv"},
+    };
+    for (const Case& c : cases) {
+        const Y4mHeader header =
+            parse_y4m_header(std::string("YUV4MPEG2 W2 H2 C") + c.type + " XYSCSS=OLD XA=B");
+        EXPECT_EQ(header.format, c.format) << c.type;
+        EXPECT_EQ(header.bits, c.bits) << c.type;
+        EXPECT_EQ(y4m_header_line(header),
+                  std::string("YUV4MPEG2 W2 H2 A0:0 C") + c.written + " XA=B\n");
+    }
 }
 
 TEST(Y4mHeaders, FollowTheShapeOfThePicture) {

@@ -9,7 +9,7 @@ _ovrinresize() {
         -g | --gravity) words='center north northeast east southeast south southwest west northwest' ;;
         --format) words='nv21 i420 rgba rgb' ;;
         --background) words='black white gray red green blue yellow cyan magenta' ;;
-        -t | --output-type) words='png jpg ppm y4m nv21 i420 rgba rgb' ;;
+        -t | --output-type) words='png jpg ppm pgm pnm pam y4m nv21 i420 rgba rgb' ;;
         -s | --size | -c | --canvas | --input-size | -q | --quality | --max-pixels | \
             -o | --output | -j | --jobs | --frames) return ;;
         *)

@@ -5,7 +5,7 @@ complete -c ovrinresize -s f -l fit -x -a 'contain exact cover' -d 'how it fills
 complete -c ovrinresize -s g -l gravity -x -a 'center north northeast east southeast south southwest west northwest' -d 'where on the canvas, or what is left'
 complete -c ovrinresize -s e -l engine -x -a 'quarter thumbnail bilinear bilinear-progressive lanczos nearest' -d resampler
 complete -c ovrinresize -s o -l output -x -d 'name of many results, like thumbs/%s.jpg'
-complete -c ovrinresize -s t -l output-type -x -a 'png jpg ppm y4m nv21 i420 rgba rgb' -d 'type of OUT'
+complete -c ovrinresize -s t -l output-type -x -a 'png jpg ppm pgm pnm pam y4m nv21 i420 rgba rgb' -d 'type of OUT'
 complete -c ovrinresize -s r -l recursive -d 'take pictures in folders'
 complete -c ovrinresize -s j -l jobs -x -d 'pictures at a time'
 complete -c ovrinresize -l frames -x -d 'only these frames, like 10:20'
