@@ -8,7 +8,7 @@
 # counts its accesses to the stack, which spilled registers would cause. Where a loop calls a
 # function, a compiler did not inline what it should have, and nothing can be modelled.
 set -euo pipefail
-cd "$(dirname "${BASH_SOURCE[0]}")/.."
+cd "$(dirname "${BASH_SOURCE[0]}")/../.."
 
 # The Neoverse N1 is the Cortex-A76 of servers; for the A76 itself there is only its ancestor's model.
 processors="cortex-a55 cortex-a510 neoverse-n1 neoverse-v2"
@@ -41,34 +41,10 @@ split_loops() {
         }'
 }
 
-# Writes loads and stores of whole vectors in one way: as ld1 and st1, one vector each. LLVM's models
-# set different costs for one and the same access: on the A55 an ldr takes one cycle, an ld1 two, as
-# the processor's path of 64 bits does, and an ldp six; on the N1 an str costs twice as much as an
-# st1. The choice is the compiler's, and would hide what the kernels do. An offset's register stands
-# for the address. A prefetch below its address is a prfum; g++ leaves it to its assembler to say so.
-even_out() {
-    awk '
-        /^\tprfm\t.*, -[0-9]+\]/ { sub("prfm", "prfum") }
-        !/^\t(ldr|ldur|ldp|ldnp|str|stur|stp|stnp)\tq/ { print; next }
-        {
-            count = split($0, part, /[][, \t]+/)
-            operation = part[2] ~ /^ld/ ? "ld1" : "st1"
-            last = 3
-            while (part[last + 1] ~ /^q/) ++last
-            base = part[last + 1]
-            if (part[last + 2] ~ /^[wx][0-9]/) base = "x" substr(part[last + 2], 2)
-            step = /\], |\]!/ ? ", #16" : ""
-            for (i = 3; i <= last; ++i) {
-                printf "\t%s\t{ v%s.16b }, [%s]%s\n", operation, substr(part[i], 2), base,
-                    i == last ? step : ""
-            }
-        }' "$1"
-}
-
 # model FILE PROCESSOR: cycles of one round of the loop.
 model() {
     local rounds=1000
-    even_out "$1" | llvm-mca-19 -mtriple=aarch64 -mcpu="$2" -iterations=$rounds |
+    llvm-mca-19 -mtriple=aarch64 -mcpu="$2" -iterations=$rounds "$1" |
         awk -v rounds=$rounds '/^Total Cycles:/ { printf "%.2f", $3 / rounds }'
 }
 
@@ -80,12 +56,13 @@ print_loops() { # COMPILER
             sed 's/(anonymous namespace):://g; s/ovrin:://g; s/^void //; s/(.*//')
         printf '| %-28s | %-5s | %5d | %12d | %5d |' "$name" "$1" "$bytes" \
             "$(grep -c '^	' "$loop")" "$stack"
+        bench/neon/even_out.py <"$loop" >"$work/evened"
         for processor in $processors; do
             if grep -q '^	bl	' "$loop"; then
                 printf ' %11s |' calls
                 continue
             fi
-            printf ' %11.3f |' "$(awk -v c="$(model "$loop" "$processor")" -v b="$bytes" 'BEGIN { print c / b }')"
+            printf ' %11.3f |' "$(awk -v c="$(model "$work/evened" "$processor")" -v b="$bytes" 'BEGIN { print c / b }')"
         done
         echo
     done
