@@ -548,6 +548,8 @@ OVRIN_API void _resize_y_nv21_tp(void* band);
  *  - Samples just outside the picture are read and can reach the result: those one column to the
  *    right, one row below and, in U and V, two rows below. After every source plane src_stride + 1
  *    samples (pixels, bytes or pairs) must be readable, whatever they hold.
+ *  - Positions are counted in single precision. From 8388608 destination columns or rows on it may
+ *    round the last of them up to the source's size: one column, or row, more is read then.
  *
  * The whole canvas is cleared first: 0, chroma 128. Only sizes of 0 are tested for; those of the
  * source must not be negative.

@@ -26,12 +26,12 @@ struct Plane {
     const uint8_t* src_row(int32_t row_index) const {
         return src + ptrdiff_t{row_index / subsampling} * src_pitch;
     }
-    uint8_t* dst_row(int32_t row) const { return dst + ptrdiff_t{row / subsampling} * dst_pitch; }
+    uint8_t* dst_row(int64_t row) const { return dst + row / subsampling * dst_pitch; }
     int32_t samples(int32_t columns) const {
         return columns < 1 ? 0 : static_cast<int32_t>((int64_t{columns} - 1) / subsampling + 1);
     }
     // The first of the rows from `row` on that has samples.
-    int32_t first_row(int32_t row) const { return row + row % subsampling; }
+    int64_t first_row(int64_t row) const { return row + row % subsampling; }
 };
 
 Plane first_plane(const BilinearGeometry& g) {
@@ -123,7 +123,7 @@ public:
                int32_t first_sample) {
         const ptrdiff_t offset = ptrdiff_t{first_sample} * plane.sample_bytes;
         const int32_t step = plane.subsampling;
-        for (int32_t r = plane.first_row(rows.first); r < rows.end; r += step) {
+        for (int64_t r = plane.first_row(rows.first); r < rows.end; r += step) {
             const uint8_t* top = plane.src_row(axes.row_index[r]);
             const uint8_t* bottom = top + below;
             const BilinearSums& upper = sums(top, bottom);
@@ -192,8 +192,8 @@ void copy_plane(const Kernels& set, const Plane& plane, const BilinearAxes& axes
         BilinearPlan plan;
         BilinearCopy* copy = set.plan_bilinear_copy(plan, strip);
         const Span span = span_of(strip);
-        for (int32_t r = plane.first_row(rows.first); r < rows.end; r += plane.subsampling) {
-            const int32_t next = r + plane.subsampling;
+        for (int64_t r = plane.first_row(rows.first); r < rows.end; r += plane.subsampling) {
+            const int64_t next = r + plane.subsampling;
             if (next < rows.end) {
                 prefetch(plane.src_row(axes.row_index[next]) + span.first, span.bytes);
             }

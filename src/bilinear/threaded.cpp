@@ -47,10 +47,11 @@ ovrin_bilinear_band template_band(const BilinearCall& call, const BilinearGeomet
 void fill_bands(ovrin_bilinear_band* bands, int32_t count, int32_t height,
                 const ovrin_bilinear_band& first, int32_t edge_rows) {
     for (int32_t i = 0; i < count; ++i) {
-        const int32_t end = (i + 1) * height;
+        const int64_t end = (int64_t{i} + 1) * height;
         bands[i] = first;
         bands[i].first_row = i * height;
-        bands[i].end_row = i == count - 1 || end > first.dst_h ? first.dst_h : end;
+        bands[i].end_row =
+            i == count - 1 || end > first.dst_h ? first.dst_h : static_cast<int32_t>(end);
     }
     bands[count - 1].edge_rows = edge_rows;
 }

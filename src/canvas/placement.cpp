@@ -29,7 +29,7 @@ int32_t cut(int32_t canvas_size, int32_t position, int32_t& dst_size, int32_t& t
 
 bool rgba_lies_in_memory(const ovrin_resize_target& target) {
     const int64_t width = target.canvas_width;
-    if (width < target.dst_width) return false;
+    if (width < 1 || width < target.dst_width) return false;
     const int64_t first = width * target.dst_y + target.dst_x;
     const int64_t last_row = first + width * (int64_t{target.dst_height} - 1);
     return first >= 0 && last_row + target.dst_width <= width * target.canvas_height;

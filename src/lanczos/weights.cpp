@@ -47,7 +47,7 @@ void fill_table(float* table, const Wanted& wanted) {
 }
 
 double fraction_of(double position) {
-    return position - static_cast<double>(static_cast<int32_t>(position));
+    return position - static_cast<double>(static_cast<int64_t>(position));
 }
 
 // An axis of the picture. Columns lie at a running sum of source / destination, rows at a multiple

@@ -74,8 +74,9 @@ void copy_even(const NearestPicture& p) {
 // Positions that single precision has rounded, in strips.
 void copy_rounded(const NearestPicture& p) {
     int32_t taps[kStripColumns];
-    for (int32_t x = 0; x < p.width; x += kStripColumns) {
-        const int32_t count = p.width - x < kStripColumns ? p.width - x : kStripColumns;
+    int32_t count;
+    for (int32_t x = 0; x < p.width; x += count) {
+        count = p.width - x < kStripColumns ? p.width - x : kStripColumns;
         for (int32_t i = 0; i < count; ++i) taps[i] = static_cast<int32_t>(p.columns.at(x + i));
         for (int32_t j = 0; j < p.height; ++j) {
             const uint32_t* row = p.row(j);

@@ -143,6 +143,7 @@ TEST(Extremes, EmptyCanvasesAreNotWritten) {
                 letterbox_all_ways(letterbox(w, 8, 5, 6, x, 0), src_h, random);
                 letterbox_all_ways(letterbox(8, w, 5, 6, 0, x), src_h, random);
                 letterbox_all_ways(letterbox(w, w, 5, 6, x, x), src_h, random);
+                letterbox_all_ways(letterbox(w, w, w, w, x, x), src_h, random);
             }
         }
     }
