@@ -1,0 +1,26 @@
+# SPDX-License-Identifier: Apache-2.0
+# cmake -DPORT_FOLDER=... -DPACKAGES=... -P port.cmake: runs the portfile with functions in place of
+# vcpkg's that look at their arguments and do nothing.
+function(vcpkg_cmake_configure)
+  cmake_parse_arguments(PARSE_ARGV 0 arg "" "SOURCE_PATH" "OPTIONS")
+  if(NOT EXISTS ${arg_SOURCE_PATH}/CMakeLists.txt OR NOT arg_OPTIONS STREQUAL "-DBUILD_SHARED_LIBS=1")
+    message(FATAL_ERROR "configures ${arg_SOURCE_PATH} with ${arg_OPTIONS}")
+  endif()
+endfunction()
+function(vcpkg_cmake_install)
+endfunction()
+function(vcpkg_cmake_config_fixup)
+endfunction()
+function(vcpkg_fixup_pkgconfig)
+endfunction()
+function(vcpkg_install_copyright)
+  cmake_parse_arguments(PARSE_ARGV 0 arg "" "" "FILE_LIST")
+  if(NOT EXISTS ${arg_FILE_LIST})
+    message(FATAL_ERROR "there is no ${arg_FILE_LIST}")
+  endif()
+endfunction()
+
+set(PORT ovrinresize)
+set(VCPKG_LIBRARY_LINKAGE dynamic)
+set(CURRENT_PACKAGES_DIR ${PACKAGES})
+include(${PORT_FOLDER}/portfile.cmake)
