@@ -5,6 +5,7 @@ from __future__ import annotations
 
 import ctypes
 import gc
+import importlib.metadata
 import sys
 import threading
 import time
@@ -125,3 +126,8 @@ def test_the_module_shows_nothing_of_the_library():
     module = ctypes.CDLL(ovrin._native.__file__)
     assert not hasattr(module, "ovrin_resize_rgba8888")
     assert hasattr(module, "PyInit__native")
+
+
+@pytest.mark.skipif(SANITIZED, reason="that module is not installed")
+def test_version():
+    assert ovrin.__version__ == importlib.metadata.version("ovrinresize")
