@@ -1,14 +1,17 @@
-#!/usr/bin/env python3
+#!/usr/bin/python3
 # SPDX-License-Identifier: Apache-2.0
 """Makes an Android archive (AAR) of libraries that an NDK has built for arm64.
 
 C and C++ code finds the library and its header in the archive as the prefab package "ovrinresize".
-With the JNI library and the binding's classes, the archive serves Kotlin and Java, too.
+With the JNI library and the binding's classes, the archive serves Kotlin and Java, too. Beside it come
+the sources and their documentation, and what Gradle and Maven want to know, all in the layout of a Maven
+repository.
 
 The same input gives the same bytes: entries are sorted, undated and not compressed.
 """
 
 import argparse
+import hashlib
 import io
 import json
 import os
@@ -17,15 +20,24 @@ import struct
 import sys
 import zipfile
 
+from elftools.common.exceptions import ELFError
+from elftools.elf.elffile import ELFFile
+
+import documentation
+
 MIN_SDK = 21  # the oldest Android for 64-bit processors
 ABI = "arm64-v8a"
 PAGE = 16384  # the largest page of Android devices
 CORE = "libovrinresize.so"
 JNI = "libovrinresize_jni.so"
+HEADERS = ("ovrinresize.h", "ovrinresize.hpp")
 PACKAGE = "ovrin.resize"
+HASHES = ("md5", "sha1", "sha256", "sha512")
 
 # What Android gives to apps, and the libraries use.
 SYSTEM_LIBRARIES = {"libc.so", "libm.so", "libdl.so", "liblog.so"}
+# Bitmaps are the binding's; the core must not need them.
+JNI_LIBRARIES = SYSTEM_LIBRARIES | {"libjnigraphics.so"}
 
 MANIFEST = f"""<?xml version="1.0" encoding="utf-8"?>
 <manifest xmlns:android="http://schemas.android.com/apk/res/android"
@@ -36,8 +48,9 @@ MANIFEST = f"""<?xml version="1.0" encoding="utf-8"?>
 </manifest>
 """
 
-PROGUARD = f"""# The native library finds this class and its methods by their names.
+PROGUARD = f"""# The native library finds these classes and their methods by their names.
 -keep class {PACKAGE}.Native {{ *; }}
+-keep class {PACKAGE}.NativeBitmaps {{ *; }}
 """
 
 
@@ -45,87 +58,44 @@ class Refused(Exception):
     """The archive cannot be made of this."""
 
 
-# ---- ELF ------------------------------------------------------------------------------------------
-
-ET_DYN = 3
-EM_AARCH64 = 183
-PT_LOAD = 1
-PT_DYNAMIC = 2
-DT_NEEDED = 1
-DT_STRTAB = 5
-DT_SONAME = 14
+# ---- Libraries ------------------------------------------------------------------------------------
 
 
-class Elf:
+class Library:
     """What the checks below want to know of a shared library."""
 
     def __init__(self, name, data):
-        self.name = name
-        self.data = data
         try:
-            self._read()
-        except (struct.error, ValueError) as error:
-            raise Refused(f"{name} is damaged: {error}") from error
-
-    def _read(self):
-        if self.data[:4] != b"\x7fELF":
-            raise Refused(f"{self.name} is not an ELF file")
-        if self.data[4:6] != b"\x02\x01":
-            raise Refused(f"{self.name} is not a 64-bit, little-endian ELF file")
-        kind, self.machine = struct.unpack_from("<HH", self.data, 16)
-        if kind != ET_DYN:
-            raise Refused(f"{self.name} is not a shared library")
-        self.loads = []  # (file offset, address, bytes in the file, alignment)
-        self.soname = None
-        self.needed = []
-        dynamic = None
-        table, = struct.unpack_from("<Q", self.data, 32)
-        size, count = struct.unpack_from("<HH", self.data, 54)
-        for i in range(count):
-            kind, _, offset, address, _, file_size, _, alignment = struct.unpack_from(
-                "<IIQQQQQQ", self.data, table + i * size)
-            if kind == PT_LOAD:
-                self.loads.append((offset, address, file_size, alignment))
-            elif kind == PT_DYNAMIC:
-                dynamic = (offset, file_size)
-        if not self.loads or dynamic is None:
-            raise Refused(f"{self.name} is not a shared library")
-        self._read_dynamic(*dynamic)
-
-    def _read_dynamic(self, offset, size):
-        entries = [struct.unpack_from("<qQ", self.data, offset + i) for i in range(0, size, 16)]
-        strings = next((value for tag, value in entries if tag == DT_STRTAB), None)
-        if strings is None:
-            raise ValueError("no string table")
-        start = self._offset_of(strings)
-        for tag, value in entries:
-            if tag == DT_SONAME:
-                self.soname = self._string(start + value)
-            elif tag == DT_NEEDED:
-                self.needed.append(self._string(start + value))
-
-    def _offset_of(self, address):
-        for offset, begin, size, _ in self.loads:
-            if begin <= address < begin + size:
-                return offset + address - begin
-        raise ValueError(f"nothing at address {address:#x}")
-
-    def _string(self, offset):
-        end = self.data.index(b"\0", offset)
-        return self.data[offset:end].decode("ascii")
+            elf = ELFFile(io.BytesIO(data))
+            self.machine = elf["e_machine"]
+            self.is_shared = elf["e_type"] == "ET_DYN"
+            segments = list(elf.iter_segments())
+            self.loads = [s.header for s in segments if s["p_type"] == "PT_LOAD"]
+            dynamic = next((s for s in segments if s["p_type"] == "PT_DYNAMIC"), None)
+            tags = list(dynamic.iter_tags()) if dynamic else []
+            self.needed = [t.needed for t in tags if t.entry.d_tag == "DT_NEEDED"]
+            self.soname = next((t.soname for t in tags if t.entry.d_tag == "DT_SONAME"), None)
+        except ELFError as error:
+            raise Refused(f"{name} is not an ELF file, or damaged: {error}") from error
+        except Exception as error:  # elftools stumbles over damaged files in many ways
+            raise Refused(f"{name} is damaged: {error!r}") from error
+        if not self.is_shared or not self.loads or dynamic is None:
+            raise Refused(f"{name} is not a shared library")
 
 
-def check_library(name, data, soname, others):
+def check_library(name, data, soname, system, others):
     """Android must load it: on devices with large pages, under this name, without other libraries."""
-    elf = Elf(name, data)
-    if elf.machine != EM_AARCH64:
+    elf = Library(name, data)
+    if elf.machine != "EM_AARCH64":
         raise Refused(f"{name} is not for AArch64 (its machine is {elf.machine})")
     if elf.soname != soname:
         raise Refused(f"the SONAME of {name} is {elf.soname}, must be {soname}")
-    for offset, address, _, alignment in elf.loads:
-        if alignment % PAGE != 0 or alignment == 0 or (address - offset) % PAGE != 0:
-            raise Refused(f"{name} is not aligned to pages of 16 KB (a segment has {alignment:#x})")
-    foreign = [needed for needed in elf.needed if needed not in SYSTEM_LIBRARIES | others]
+    for load in elf.loads:
+        shift = load.p_vaddr - load.p_offset
+        if load.p_align % PAGE != 0 or load.p_align == 0 or shift % PAGE != 0:
+            raise Refused(
+                f"{name} is not aligned to pages of 16 KB (a segment has {load.p_align:#x})")
+    foreign = [needed for needed in elf.needed if needed not in system | others]
     if foreign:
         raise Refused(f"{name} needs {', '.join(foreign)}, which an Android app does not have")
     for other in others:
@@ -182,7 +152,7 @@ def as_json(value):
 # ---- The AAR --------------------------------------------------------------------------------------
 
 
-def prefab(version, ndk, header, library):
+def prefab(version, ndk, headers, library):
     module = "prefab/modules/ovrinresize"
     libs = f"{module}/libs/android.{ABI}"
     return {
@@ -196,7 +166,7 @@ def prefab(version, ndk, header, library):
             "export_libraries": [],
             "library_name": CORE[:-len(".so")],
         }),
-        f"{module}/include/ovrinresize.h": header,
+        **{f"{module}/include/{name}": content for name, content in headers.items()},
         f"{libs}/abi.json": as_json({
             "abi": ABI,
             "api": MIN_SDK,
@@ -210,8 +180,9 @@ def prefab(version, ndk, header, library):
 
 def aar_files(options):
     library = read(options.library)
-    check_library(options.library, library, CORE, set())
-    files = prefab(options.version, options.ndk, read(options.header), library)
+    check_library(options.library, library, CORE, SYSTEM_LIBRARIES, set())
+    headers = {name: read(os.path.join(options.include, name)) for name in HEADERS}
+    files = prefab(options.version, options.ndk, headers, library)
     files["AndroidManifest.xml"] = MANIFEST.encode()
     files["LICENSE"] = read(options.license)
     files["R.txt"] = b""  # no resources; some tools expect the file
@@ -219,14 +190,152 @@ def aar_files(options):
     classes = {}
     if options.jni:
         jni = read(options.jni)
-        check_library(options.jni, jni, JNI, {CORE})
+        check_library(options.jni, jni, JNI, JNI_LIBRARIES, {CORE})
         files[f"jni/{ABI}/{JNI}"] = jni
         files["proguard.txt"] = PROGUARD.encode()
         classes = read_tree(options.classes)
-        if PACKAGE.replace(".", "/") + "/Native.class" not in classes:
-            raise Refused(f"{options.classes} does not hold the binding's classes")
+        for name in ("Native", "NativeBitmaps"):
+            if f"{PACKAGE.replace('.', '/')}/{name}.class" not in classes:
+                raise Refused(f"{options.classes} does not hold the binding's classes")
     files["classes.jar"] = archive(classes)
     return files
+
+
+# ---- The repository -------------------------------------------------------------------------------
+
+GROUP = "ovrin"
+MODULE = "ovrinresize"
+URL_OF_LICENSE = "https://www.apache.org/licenses/LICENSE-2.0.txt"
+
+
+def artifact(version, suffix):
+    return f"{MODULE}-{version}{suffix}"
+
+
+def sums(content):
+    return {name: hashlib.new(name, content).hexdigest() for name in HASHES}
+
+
+def pom(version, kotlin):
+    """What tools read that do not know Gradle's metadata; the comment tells Gradle of them."""
+    dependency = f"""
+    <dependency>
+      <groupId>org.jetbrains.kotlin</groupId>
+      <artifactId>kotlin-stdlib</artifactId>
+      <version>{kotlin}</version>
+      <scope>compile</scope>
+    </dependency>
+  """ if kotlin else ""
+    return f"""<?xml version="1.0" encoding="UTF-8"?>
+<!-- do_not_remove: published-with-gradle-metadata -->
+<project xmlns="http://maven.apache.org/POM/4.0.0">
+  <modelVersion>4.0.0</modelVersion>
+  <groupId>{GROUP}</groupId>
+  <artifactId>{MODULE}</artifactId>
+  <version>{version}</version>
+  <packaging>aar</packaging>
+  <name>{MODULE}</name>
+  <description>Small, fast resizing of raw pictures in memory</description>
+  <licenses>
+    <license>
+      <name>Apache-2.0</name>
+      <url>{URL_OF_LICENSE}</url>
+    </license>
+  </licenses>
+  <dependencies>{dependency}</dependencies>
+</project>
+""".encode()
+
+
+def module_metadata(version, kotlin, files):
+    """Gradle's module metadata. `files` are the contents of the archives, by their suffixes."""
+    def variant(name, suffix, attributes, dependencies):
+        content = files[suffix]
+        file = artifact(version, suffix)
+        return {
+            "name": name,
+            "attributes": {"org.gradle.dependency.bundling": "external", **attributes},
+            **({"dependencies": dependencies} if dependencies else {}),
+            "files": [{"name": file, "url": file, "size": len(content), **sums(content)}],
+        }
+
+    needs_kotlin = [{"group": "org.jetbrains.kotlin", "module": "kotlin-stdlib",
+                     "version": {"requires": kotlin}}] if kotlin else []
+
+    def library(name, usage):
+        return variant(name, ".aar", {
+            "org.gradle.category": "library",
+            "org.gradle.jvm.environment": "android",
+            "org.gradle.libraryelements": "aar",
+            "org.gradle.usage": usage,
+            **({"org.jetbrains.kotlin.platform.type": "androidJvm"} if kotlin else {}),
+        }, needs_kotlin)
+
+    def documentation(kind):
+        return variant(f"release{kind.capitalize()}Elements", f"-{kind}.jar", {
+            "org.gradle.category": "documentation",
+            "org.gradle.docstype": kind,
+            "org.gradle.usage": "java-runtime",
+        }, [])
+
+    return as_json({
+        "formatVersion": "1.1",
+        "component": {"group": GROUP, "module": MODULE, "version": version,
+                      "attributes": {"org.gradle.status": "release"}},
+        "variants": [library("releaseApiElements", "java-api"),
+                     library("releaseRuntimeElements", "java-runtime"),
+                     documentation("sources"), documentation("javadoc")],
+    })
+
+
+def maven_metadata(version):
+    return f"""<?xml version="1.0" encoding="UTF-8"?>
+<metadata>
+  <groupId>{GROUP}</groupId>
+  <artifactId>{MODULE}</artifactId>
+  <versioning>
+    <latest>{version}</latest>
+    <release>{version}</release>
+    <versions>
+      <version>{version}</version>
+    </versions>
+  </versioning>
+</metadata>
+""".encode()
+
+
+def repository(options, aar):
+    """All files of the repository, by their paths; each with the sums that clients ask for."""
+    sources = {}
+    if options.jni:
+        for folder in options.sources:
+            sources.update(read_tree(folder))
+    jars = {
+        ".aar": aar,
+        "-sources.jar": archive({**sources, "LICENSE": read(options.license)}),
+        "-javadoc.jar": archive({**documentation.pages(sources), "LICENSE": read(options.license)}),
+    }
+    kotlin = options.kotlin if options.jni else None
+    version = options.version
+    folder = f"{GROUP}/{MODULE}"
+    files = {f"{folder}/{version}/{artifact(version, suffix)}": content
+             for suffix, content in jars.items()}
+    files[f"{folder}/{version}/{artifact(version, '.pom')}"] = pom(version, kotlin)
+    files[f"{folder}/{version}/{artifact(version, '.module')}"] = module_metadata(
+        version, kotlin, jars)
+    files[f"{folder}/maven-metadata.xml"] = maven_metadata(version)
+    for path, content in list(files.items()):
+        for name, value in sums(content).items():
+            files[f"{path}.{name}"] = value.encode()
+    return files
+
+
+def write_tree(root, files):
+    for path, content in files.items():
+        target = os.path.join(root, path)
+        os.makedirs(os.path.dirname(target), exist_ok=True)
+        with open(target, "wb") as file:
+            file.write(content)
 
 
 def version_number(text):
@@ -234,6 +343,11 @@ def version_number(text):
     if not re.fullmatch(r"\d+(\.\d+){0,3}", text):
         raise argparse.ArgumentTypeError("a version is 1 to 4 numbers with points between")
     return text
+
+
+def kotlin_version(folder):
+    with open(os.path.join(folder, "compiler", "package.json"), encoding="utf-8") as file:
+        return json.load(file)["dependencies"]["kotlin-compiler"]
 
 
 def parse_arguments():
@@ -244,21 +358,35 @@ def parse_arguments():
     parser.add_argument("--classes", help="the folder with the binding's compiled classes")
     parser.add_argument("--version", required=True, type=version_number)
     parser.add_argument("--ndk", required=True, type=int, help="major version of the NDK")
-    parser.add_argument("--output", required=True, help="the archive to write")
-    parser.add_argument("--header", default=os.path.join(root, "include", "ovrinresize.h"))
+    parser.add_argument("--output", help="the archive to write")
+    parser.add_argument("--repository", help="the folder in which to write a Maven repository")
+    kotlin = os.path.join(root, "bindings", "kotlin")
+    parser.add_argument("--sources", action="append", metavar="FOLDER",
+                        help="a folder with the binding's sources (default: the project's)")
+    parser.add_argument("--kotlin", default=kotlin_version(kotlin),
+                        help="version of Kotlin's standard library (default: the compiler's)")
+    parser.add_argument("--include", default=os.path.join(root, "include"),
+                        help="the folder with the headers")
     parser.add_argument("--license", default=os.path.join(root, "LICENSE"))
     options = parser.parse_args()
     if (options.jni is None) != (options.classes is None):
         parser.error("the JNI library and --classes go together")
+    if not options.output and not options.repository:
+        parser.error("nothing to write: give --output, --repository, or both")
+    if not options.sources:
+        options.sources = [os.path.join(kotlin, name) for name in ("main", "android")]
     return options
 
 
 def main():
     options = parse_arguments()
     try:
-        contents = archive(aar_files(options))
-        with open(options.output, "wb") as file:
-            file.write(contents)
+        aar = archive(aar_files(options))
+        if options.repository:
+            write_tree(options.repository, repository(options, aar))
+        if options.output:
+            with open(options.output, "wb") as file:
+                file.write(aar)
     except (Refused, OSError) as error:
         sys.exit(f"make_aar.py: {error}")
 

@@ -45,7 +45,7 @@ make_stand_ins() {
     rm -rf "$folder"
     mkdir -p "$folder/system"
     # Empty libraries with the names of Android's.
-    for name in libc.so libm.so libc++_shared.so; do
+    for name in libc.so libm.so libjnigraphics.so libc++_shared.so; do
         stand_in "system/$name" "$name" -x c /dev/null
     done
     local system=("-Wl,--no-as-needed" "$folder/system/libc.so" "$folder/system/libm.so")
@@ -57,11 +57,12 @@ make_stand_ins() {
 
     jni_h=$(dirname "$(find /usr/lib/jvm/*/include "${JAVA_HOME:-/nonexistent}" -name jni.h 2>/dev/null |
         head -n 1)")
-    local jni=("$root"/bindings/jni/{camera,checks,extents,methods}.cpp -std=c++17 -O2 -fno-exceptions
-        -fno-rtti -mno-outline-atomics -fvisibility=hidden -I "$root/include" -I "$jni_h"
+    local jni=("$root"/bindings/jni/{bitmap,camera,checks,extents,methods}.cpp -std=c++17 -O2
+        -fno-exceptions -fno-rtti -mno-outline-atomics -fvisibility=hidden
+        -DOVRINRESIZE_JNI_BITMAPS -I "$root/bindings/jni/stubs" -I "$root/include" -I "$jni_h"
         -I "$jni_h/linux" "-Wl,--version-script=$root/bindings/jni/exports.map")
     stand_in libovrinresize_jni.so libovrinresize_jni.so "${jni[@]}" "${system[@]}" \
-        "$folder/libovrinresize.so"
+        "$folder/libovrinresize.so" "$folder/system/libjnigraphics.so"
 
     # And libraries that must be refused.
     local any=(-x c /dev/null)
@@ -71,6 +72,7 @@ make_stand_ins() {
     with_alignment 0x1000 <"$folder/libovrinresize.so" >"$folder/small_alignment.so"
     with_alignment 0x4000 <"$folder/small_pages.so" >"$folder/false_alignment.so"
     stand_in with_cxx.so libovrinresize.so -Wl,--no-as-needed "$folder/system/libc++_shared.so"
+    stand_in with_bitmaps.so libovrinresize.so -Wl,--no-as-needed "$folder/system/libjnigraphics.so"
     stand_in alone_jni.so libovrinresize_jni.so "${any[@]}"
     g++ -shared -nostdlib -o "$folder/x86.so" -Wl,-soname,libovrinresize.so \
         -Wl,-z,max-page-size=16384 "${any[@]}"
@@ -81,7 +83,7 @@ make_stand_ins() {
 # ---- The archive ------------------------------------------------------------------------------
 
 make_aar() {
-    python3 "$here/make_aar.py" --version "$version" --ndk "$ndk" --output "$folder/$1" "${@:2}"
+    "$here/make_aar.py" --version "$version" --ndk "$ndk" --output "$folder/$1" "${@:2}"
 }
 
 # refused TEXT ARGUMENT...: no archive, and a message that says why.
@@ -105,6 +107,7 @@ check_refusals() {
     refused "16 KB" "$folder/small_alignment.so"
     refused "16 KB" "$folder/false_alignment.so"
     refused "libc++_shared.so" "$folder/with_cxx.so"
+    refused "libjnigraphics.so" "$folder/with_bitmaps.so"
     refused "damaged" "$folder/short.so"
     refused "not an ELF file" "$folder/text.so"
     refused "No such file" "$folder/missing.so"
@@ -126,6 +129,7 @@ classes.jar
 jni/arm64-v8a/libovrinresize.so
 jni/arm64-v8a/libovrinresize_jni.so
 prefab/modules/ovrinresize/include/ovrinresize.h
+prefab/modules/ovrinresize/include/ovrinresize.hpp
 prefab/modules/ovrinresize/libs/android.arm64-v8a/abi.json
 prefab/modules/ovrinresize/libs/android.arm64-v8a/libovrinresize.so
 prefab/modules/ovrinresize/module.json
@@ -167,7 +171,8 @@ check_libraries() {
     local lib=prefab/modules/ovrinresize/libs/android.arm64-v8a/libovrinresize.so
     check_library $lib "libc.so libm.so"
     cmp $lib jni/arm64-v8a/libovrinresize.so || fail "two libraries of one name"
-    check_library jni/arm64-v8a/libovrinresize_jni.so "libc.so libm.so libovrinresize.so"
+    check_library jni/arm64-v8a/libovrinresize_jni.so \
+        "libc.so libjnigraphics.so libm.so libovrinresize.so"
     # Every function of the header that goes along can be linked.
     local declared missing
     declared=$(sed -n 's/^OVRIN_API [^(]*[ *]\([A-Za-z_0-9]*\)(.*/\1/p' \
@@ -190,11 +195,14 @@ check_classes() {
         fail "classes.jar does not hold the classes"
     javap -classpath classes.jar ovrin.resize.Resizer | grep -q 'static final void rgba(' ||
         fail "classes.jar cannot be read"
-    local native=ovrin.resize.Native
-    # The name by which the native library looks the class up is the one that is kept.
-    grep -qx -- "-keep class $native { \*; }" proguard.txt || fail "the keep rule"
-    grep -q "${native//./\/}" jni/arm64-v8a/libovrinresize_jni.so || fail "the class's name"
-    javap -classpath classes.jar $native >/dev/null || fail "no class $native"
+    ! unzip -Z1 classes.jar | grep -v '^ovrin/resize/\|^META-INF/' || fail "classes.jar holds others' classes"
+    local native
+    for native in ovrin.resize.Native ovrin.resize.NativeBitmaps; do
+        # The name by which the native library looks the class up is the one that is kept.
+        grep -qx -- "-keep class $native { \*; }" proguard.txt || fail "the keep rule"
+        grep -q "${native//./\/}" jni/arm64-v8a/libovrinresize_jni.so || fail "the class's name"
+        javap -classpath classes.jar $native >/dev/null || fail "no class $native"
+    done
 }
 
 # zipalign prints where the data of each entry begins.
@@ -213,7 +221,7 @@ check_aar() {
     local aar=$1
     unzip -tq "$aar" || fail "unzip finds errors"
     diff <(unzip -Z1 "$aar") <(expected_entries) || fail "other entries"
-    [[ $(unzip -Z -v "$aar" | grep -c 'compression method: *none') -eq 12 ]] || fail "compressed"
+    [[ $(unzip -Z -v "$aar" | grep -c 'compression method: *none') -eq 13 ]] || fail "compressed"
     check_alignment "$aar"
     rm -rf "$folder/open"
     mkdir "$folder/open"
@@ -224,8 +232,7 @@ check_aar() {
     check_libraries
     check_classes
     cmp LICENSE "$root/LICENSE" || fail "another licence"
-    cmp prefab/modules/ovrinresize/include/ovrinresize.h "$root/include/ovrinresize.h" ||
-        fail "another header"
+    diff prefab/modules/ovrinresize/include "$root/include" || fail "other headers"
     cd - >/dev/null
 }
 
@@ -250,6 +257,25 @@ check_without_jni() {
         fail "other entries without the binding"
 }
 
+# Rules of the repository, twins that break them, and the same bytes once more.
+check_repository() {
+    local repository=$folder/maven
+    rm -rf "$repository" "$folder/maven-again" "$folder/maven-native"
+    make_repository maven "$folder"/libovrinresize{,_jni}.so --classes "$classes"
+    "$here/check_repository.py" "$repository" || fail "the repository"
+    cmp "$repository/ovrin/ovrinresize/$version/ovrinresize-$version.aar" "$folder/ovrinresize.aar" ||
+        fail "another archive in the repository"
+    "$here/check_repository_test.py" "$repository" "$folder/maven-twins" || fail "twins"
+    TZ=Asia/Tokyo make_repository maven-again "$folder"/libovrinresize{,_jni}.so --classes "$classes"
+    diff -r "$repository" "$folder/maven-again" || fail "a second repository is another one"
+    make_repository maven-native "$folder/libovrinresize.so"
+    "$here/check_repository.py" "$folder/maven-native" || fail "the repository without the binding"
+}
+
+make_repository() {
+    "$here/make_aar.py" --version "$version" --ndk "$ndk" --repository "$folder/$1" "${@:2}"
+}
+
 make_stand_ins
 folder=$(cd "$folder" && pwd)
 classes=$(cd "$classes" && pwd)
@@ -257,6 +283,7 @@ make_aar ovrinresize.aar "$folder"/libovrinresize{,_jni}.so --classes "$classes"
 check_aar "$folder/ovrinresize.aar"
 check_repetition
 check_without_jni
+check_repository
 check_refusals
 ((failures == 0))
 echo "all passed"

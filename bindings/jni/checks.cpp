@@ -9,8 +9,6 @@ namespace ovrin_jni {
 namespace {
 
 constexpr const char kDestination[] = "destination";
-// Longer than any message here can get.
-constexpr int kMessageBytes = 256;
 
 long long printable(int64_t value) {
     return value;
@@ -18,30 +16,28 @@ long long printable(int64_t value) {
 
 }  // namespace
 
+Checks::~Checks() {
+    if (exception_ == nullptr) return;
+    // Where the class is not found, that error is thrown instead.
+    jclass found = env_->FindClass(exception_);
+    if (found != nullptr) env_->ThrowNew(found, message_);
+}
+
 // C's variadic arguments: the compiler checks them against the format.
 void Checks::fail(const char* format, ...) {  // NOLINT(cert-dcl50-cpp)
     if (!ok_) return;
-    char message[kMessageBytes];
+    ok_ = false;
+    exception_ = "java/lang/IllegalArgumentException";
     va_list arguments;
     va_start(arguments, format);
-    vsnprintf(message, sizeof message, format, arguments);
+    vsnprintf(message_, sizeof message_, format, arguments);
     va_end(arguments);
-    raise("java/lang/IllegalArgumentException", message);
-}
-
-void Checks::raise(const char* type, const char* message) {
-    ok_ = false;
-    // Where the class is not found, that error is thrown instead.
-    jclass found = env_->FindClass(type);
-    if (found != nullptr) env_->ThrowNew(found, message);
 }
 
 void Checks::outcome(const ovrin::Status& status) {
-    if (status.code == ovrin::ErrorCode::kNoMemory) {
-        raise("java/lang/OutOfMemoryError", status.text);
-    } else if (!status.ok()) {
-        fail("%s", status.text);
-    }
+    if (status.ok()) return;
+    fail("%s", status.text);
+    if (status.code == ovrin::ErrorCode::kNoMemory) exception_ = "java/lang/OutOfMemoryError";
 }
 
 void Checks::number(const char* name, int32_t value, int32_t least, int32_t most) {

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 // What native methods demand of their arguments. The first demand that is not met throws
-// IllegalArgumentException; the others then pass unlooked at, and ok() says not to go on.
+// IllegalArgumentException; the others then pass unlooked at, and ok() says not to go on. It is
+// thrown at the end of the object's life: what is released before that may call Java without it
+// pending.
 #pragma once
 
 #include <jni.h>
@@ -23,6 +25,10 @@ struct Placement {
 class Checks {
 public:
     explicit Checks(JNIEnv* env) : env_(env) {}
+    ~Checks();
+
+    Checks(const Checks&) = delete;
+    Checks& operator=(const Checks&) = delete;
 
     bool ok() const { return ok_; }
 
@@ -38,6 +44,9 @@ public:
     const uint8_t* source(jobject buffer, const char* name, int64_t bytes, int alignment = 1);
     uint8_t* destination(jobject buffer, int64_t bytes, int alignment = 1);
 
+    // Takes a message as printf does.
+    void fail(const char* format, ...) __attribute__((format(printf, 2, 3)));
+
     // What a call of the C++ layer has come to: missing memory throws OutOfMemoryError.
     void outcome(const ovrin::Status& status);
 
@@ -49,11 +58,12 @@ private:
 
     uint8_t* address(jobject buffer, const char* name, int64_t bytes, int alignment);
     bool is_read_only(jobject buffer);
-    void fail(const char* format, ...) __attribute__((format(printf, 2, 3)));
-    void raise(const char* type, const char* message);
 
     JNIEnv* env_;
     bool ok_ = true;
+    // The class to throw, or null, and what it says.
+    const char* exception_ = nullptr;
+    char message_[256] = "";
     Range sources_[3] = {};
     int source_count_ = 0;
 };

@@ -1,8 +1,11 @@
 // SPDX-License-Identifier: Apache-2.0
 // The native methods of ovrin.resize.Native. Each checks everything itself, whatever the Kotlin
 // side has checked: from here on nothing stands between a wrong number and memory that is not ours.
+#include "methods.h"
+
 #include <ovrinresize.h>
 
+#include "bitmap.h"
 #include "camera.h"
 #include "checks.h"
 
@@ -245,23 +248,11 @@ void JNICALL lanczos_full_chroma(JNIEnv* env, jclass, jobject src, jint src_w, j
 
 // ---- Registration ------------------------------------------------------------------------------
 
-#define OVRIN_BUFFER "Ljava/nio/ByteBuffer;"
 #define OVRIN_PICTURE OVRIN_BUFFER "II"
 #define OVRIN_PLACEMENT "IIIIII"
 #define OVRIN_FRAME OVRIN_BUFFER OVRIN_BUFFER OVRIN_BUFFER "IIIII"
 
-struct Method {
-    const char* name;
-    const char* signature;
-    void* function;
-};
-
-template <class Function>
-Method method(const char* name, const char* signature, Function* function) {
-    return {name, signature, reinterpret_cast<void*>(function)};
-}
-
-bool register_methods(JNIEnv* env, jclass type) {
+bool register_resizer_methods(JNIEnv* env) {
     const char* const plain = "(" OVRIN_PICTURE OVRIN_PICTURE ")V";
     const Method methods[] = {
         method("rgba", plain, rgba),
@@ -283,16 +274,24 @@ bool register_methods(JNIEnv* env, jclass type) {
         method("resizeYuv420", "(" OVRIN_FRAME OVRIN_PICTURE "I)V", resize_yuv420),
         method("copyYuv420", "(" OVRIN_FRAME OVRIN_BUFFER "I)V", copy_yuv420),
     };
-    // The record's fields are not const, though nothing writes to them.
-    for (const Method& m : methods) {
-        const JNINativeMethod native = {const_cast<char*>(m.name), const_cast<char*>(m.signature),
-                                        m.function};
-        if (env->RegisterNatives(type, &native, 1) != JNI_OK) return false;
-    }
-    return true;
+    return ovrin_jni::register_methods(env, "ovrin/resize/Native", methods,
+                                       sizeof methods / sizeof *methods);
 }
 
 }  // namespace
+
+bool register_methods(JNIEnv* env, const char* type, const Method* methods, size_t count) {
+    jclass found = env->FindClass(type);
+    if (found == nullptr) return false;
+    for (size_t i = 0; i < count; ++i) {
+        // The record's fields are not const, though nothing writes to them.
+        const JNINativeMethod native = {const_cast<char*>(methods[i].name),
+                                        const_cast<char*>(methods[i].signature),
+                                        methods[i].function};
+        if (env->RegisterNatives(found, &native, 1) != JNI_OK) return false;
+    }
+    return true;
+}
 
 }  // namespace ovrin_jni
 
@@ -300,7 +299,9 @@ JNIEXPORT jint JNICALL JNI_OnLoad(JavaVM* vm, void* /*reserved*/) {
     void* env = nullptr;
     if (vm->GetEnv(&env, JNI_VERSION_1_6) != JNI_OK) return JNI_ERR;
     auto* jni = static_cast<JNIEnv*>(env);
-    jclass type = jni->FindClass("ovrin/resize/Native");
-    if (type == nullptr || !ovrin_jni::register_methods(jni, type)) return JNI_ERR;
+    if (!ovrin_jni::register_resizer_methods(jni)) return JNI_ERR;
+#if defined(OVRINRESIZE_JNI_BITMAPS)
+    if (!ovrin_jni::register_bitmap_methods(jni)) return JNI_ERR;
+#endif
     return JNI_VERSION_1_6;
 }

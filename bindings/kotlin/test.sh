@@ -13,6 +13,8 @@ classes=$build/test-classes
 # JUnit, as Debian installs it.
 junit=/usr/share/java/junit4.jar:/usr/share/java/hamcrest-core.jar
 
+class_path=$build/classes:$build/stubs:$classes:$junit:$(kotlin_stdlib "$build")
+
 fail() {
     echo "FAIL: $*"
     exit 1
@@ -29,10 +31,11 @@ take_example() {
 
 compile_tests() {
     rm -rf "$classes"
-    kotlinc "$build" -Werror -classpath "$build/classes:$junit" -Xfriend-paths="$build/classes" \
-        -d "$classes" "$here"/test/*.kt "$here"/test/*.java "$build/Example.kt"
+    kotlinc "$build" -Werror -classpath "$build/classes:$build/stubs:$junit" \
+        -Xfriend-paths="$build/classes" -d "$classes" \
+        "$here"/{test,examples}/*.kt "$here"/test/*.java "$build/Example.kt"
     javac -Xlint:all -Xlint:-options -Werror --release 8 -d "$classes" \
-        -classpath "$build/classes:$classes:$junit:$(kotlin_stdlib "$build")" "$here"/test/*.java
+        -classpath "$class_path" "$here"/test/*.java
 }
 
 make_known_results() {
@@ -51,7 +54,7 @@ run() {
     local output=$build/$1.out
     java -Xcheck:jni -Djava.library.path="$build" -Dovrin.expected="$build/expected.txt" \
         -Dovrin.calls="$calls" -Dovrin.seed="$seed" \
-        -classpath "$build/classes:$classes:$junit:$(kotlin_stdlib "$build")" "${@:2}" >"$output" 2>&1 || {
+        -classpath "$class_path" "${@:2}" >"$output" 2>&1 || {
         cat "$output"
         fail "$2 gave $?"
     }
@@ -65,7 +68,7 @@ check_native_half() {
     exported=$(nm -D --defined-only "$library" | awk '{ print $3 }')
     [[ $exported == JNI_OnLoad ]] || fail "exports: $exported"
     needed=$(readelf -dW "$library" | sed -n 's/.*(NEEDED).*\[\(.*\)\].*/\1/p' | sort | xargs)
-    [[ $needed == "libc.so.6 libovrinresize.so.1" ]] || fail "needs: $needed"
+    [[ $needed == "libc.so.6 libjnigraphics.so libovrinresize.so.1" ]] || fail "needs: $needed"
     undefined=$(nm -D --undefined-only "$library" | awk '{ print $2 }' |
         grep -E '^(_Z|__cxa_|__gxx_|_Unwind_)' | grep -v '^__cxa_finalize' || true)
     [[ ! $undefined ]] || fail "needs of the C++ run-time library: $undefined"

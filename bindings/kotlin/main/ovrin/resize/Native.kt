@@ -12,6 +12,10 @@ internal object Native {
         System.loadLibrary("ovrinresize_jni")
     }
 
+    /** The library is loaded when this returns. */
+    @JvmStatic
+    fun load() = Unit
+
     @JvmStatic
     external fun rgba(
         src: ByteBuffer, srcWidth: Int, srcHeight: Int,
