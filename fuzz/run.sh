@@ -32,7 +32,7 @@ export UBSAN_OPTIONS=halt_on_error=1:print_stacktrace=1
 # What libFuzzer is told about how long to run.
 limits() {
     local runs=${quick[$1]}
-    [[ $build != *asan ]] || runs=$((runs / 10))
+    [[ $build != *san ]] || runs=$((runs / 10))
     case $amount in
         quick) echo "-runs=$runs -seed=1" ;;
         x*) echo "-runs=$((runs * ${amount#x}))" ;;
@@ -63,6 +63,10 @@ printf '%-16s %12s %10s %8s\n' "$build" executions per-second corpus
 for name in "${fuzzers[@]}"; do
     log=$work/logs/$build-$name.log
     corpora=$(corpus_of "$name")
+    # The memory sanitizer does not know that permutations of 32-bit words move what is not
+    # initialised along with the rest; bilinear rows end in such.
+    unset OVRIN_FUZZ_SETS
+    case $build-$name in *msan-bilinear* | *msan-drivers) export OVRIN_FUZZ_SETS=1 ;; esac
     # shellcheck disable=SC2046,SC2086 # lists
     if ! "build/$build/fuzz/fuzz_$name" -max_len=96 -len_control=0 -timeout=60 -print_final_stats=1 -verbosity=1 \
         -artifact_prefix="$work/crashes/$name-" $(limits "$name") $corpora >"$log" 2>&1; then
