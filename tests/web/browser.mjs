@@ -12,9 +12,11 @@ import { root } from './native.mjs';
 
 const TYPES = {
     '': 'text/html',
+    '.css': 'text/css',
     '.html': 'text/html',
     '.js': 'text/javascript',
     '.mjs': 'text/javascript',
+    '.svg': 'image/svg+xml',
     other: 'application/octet-stream',
 };
 const FLAGS = [
