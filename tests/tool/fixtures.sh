@@ -89,6 +89,15 @@ make_sample() {
     convert sample.png -crop 800x800+400+200 +repage -depth 8 RGB:sample.rgb
 }
 
+# A PNG of which one chunk announces a gigabyte of text.
+make_announcement() {
+    {
+        head -c 33 plain.png # up to the end of its first chunk
+        printf '\x40\0\0\0tEXt'
+        tail -c +34 plain.png
+    } >long_text.png
+}
+
 # album/: photographs in folders, and what is none. empty/ holds nothing.
 make_album() {
     mkdir -p album/2025/may album/2026 empty
@@ -147,6 +156,7 @@ make_fixtures() {
     make_coloured
     make_transparent
     make_sample
+    make_announcement
     make_album
 }
 
@@ -268,6 +278,16 @@ def value(key):
     for name in names: found = found[name]
     return str(found)
 print(*map(value, sys.argv[1].split()))' "$keys"
+}
+
+# is_light ARGUMENT...: whether the tool, so called, takes less than half a gigabyte of memory.
+is_light() {
+    python3 - "$tool" "$@" 2>&1 <<'END'
+import resource, subprocess, sys
+subprocess.run(sys.argv[1:], stderr=subprocess.DEVNULL)
+kilobytes = resource.getrusage(resource.RUSAGE_CHILDREN).ru_maxrss
+print("yes" if kilobytes < 500000 else f"no: {kilobytes} KB")
+END
 }
 
 # sizes FILE...: of each.
