@@ -14,16 +14,22 @@ cd "$(dirname "${BASH_SOURCE[0]}")/.."
 
 fuzzers=(packed canvas planar semi_planar nearest bilinear bilinear_bands lanczos lanczos_bands
     walkers tasks drivers pool)
+readers=(png jpeg pnm y4m exif icc geometry template)
 # Runs of a quick check: about as long for each but those with threads, or a tenth of that under
 # sanitizers.
 declare -A quick=([packed]=100000 [canvas]=100000 [planar]=80000 [semi_planar]=100000
     [nearest]=150000 [bilinear]=40000 [bilinear_bands]=50000 [lanczos]=1000 [lanczos_bands]=150000
-    [walkers]=40000 [tasks]=100000 [drivers]=500 [pool]=40000)
+    [walkers]=40000 [tasks]=100000 [drivers]=500 [pool]=40000 [png]=60000 [jpeg]=60000
+    [pnm]=100000 [y4m]=100000 [exif]=100000 [icc]=2000 [geometry]=200000 [template]=200000)
+# Bytes of their longest inputs, where the usual ones are too short for a file.
+declare -A longest=([png]=512 [jpeg]=1024 [pnm]=128 [y4m]=256 [exif]=512 [icc]=512)
 
 work=build/fuzzing
 build=$1
 amount=$2
 shift 2
+# The memory sanitizer knows nothing of what the system's libraries write.
+[[ $build == *msan ]] || fuzzers+=("${readers[@]}")
 (($# == 0)) || fuzzers=("$@")
 
 export ASAN_OPTIONS=halt_on_error=1:detect_leaks=1:detect_stack_use_after_return=1
@@ -68,7 +74,7 @@ for name in "${fuzzers[@]}"; do
     unset OVRIN_FUZZ_SETS
     case $build-$name in *msan-bilinear* | *msan-drivers) export OVRIN_FUZZ_SETS=1 ;; esac
     # shellcheck disable=SC2046,SC2086 # lists
-    if ! "build/$build/fuzz/fuzz_$name" -max_len=96 -len_control=0 -timeout=60 -print_final_stats=1 -verbosity=1 \
+    if ! "build/$build/fuzz/fuzz_$name" -max_len="${longest[$name]:-96}" -len_control=0 -timeout=60 -print_final_stats=1 -verbosity=1 \
         -artifact_prefix="$work/crashes/$name-" $(limits "$name") $corpora >"$log" 2>&1; then
         tail -n 40 "$log"
         echo "$name failed; what it was given lies in $work/crashes, its log is $log"

@@ -6,6 +6,8 @@
 #include <utility>
 #include <vector>
 
+#include "yuv.h"
+
 namespace tool {
 
 namespace {
@@ -47,16 +49,17 @@ uint8_t to_byte(int fixed_point) {
     return static_cast<uint8_t>(std::clamp((fixed_point + (1 << 15)) >> 16, 0, 255));
 }
 
-uint8_t luma(int r, int g, int b) {
-    return to_byte(19595 * r + 38470 * g + 7471 * b);
+uint8_t luma(const YuvFactors& factors, int r, int g, int b) {
+    return to_byte((factors.black << 16) + factors.y_of_r * r + factors.y_of_g * g +
+                   factors.y_of_b * b);
 }
 
-uint8_t chroma_u(int r, int g, int b) {
-    return to_byte((128 << 16) - 11059 * r - 21709 * g + 32768 * b);
+uint8_t chroma_u(const YuvFactors& factors, int r, int g, int b) {
+    return to_byte((128 << 16) - factors.u_of_r * r - factors.u_of_g * g + factors.chroma * b);
 }
 
-uint8_t chroma_v(int r, int g, int b) {
-    return to_byte((128 << 16) + 32768 * r - 27439 * g - 5329 * b);
+uint8_t chroma_v(const YuvFactors& factors, int r, int g, int b) {
+    return to_byte((128 << 16) + factors.chroma * r - factors.v_of_g * g - factors.v_of_b * b);
 }
 
 Picture chroma_rearranged(const Picture& from, PixelFormat format) {
@@ -95,10 +98,11 @@ Mean mean_color(const Picture& rgba, size_t left, size_t top, size_t across, siz
 }
 
 Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
+    const YuvFactors factors = yuv_factors();
     Picture to(rgba.size, format);
     for (size_t i = 0; i < rgba.size.pixels(); ++i) {
         const uint8_t* const pixel = rgba.bytes() + i * 4;
-        to.bytes()[i] = luma(pixel[0], pixel[1], pixel[2]);
+        to.bytes()[i] = luma(factors, pixel[0], pixel[1], pixel[2]);
     }
     if (format == PixelFormat::kGray) return to;
     const auto chroma = chroma_of(to.bytes(), format, rgba.size);
@@ -106,19 +110,20 @@ Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
         for (size_t x = 0; x < chroma.width; ++x) {
             const Mean mean =
                 mean_color(rgba, x * chroma.across, y * chroma.down, chroma.across, chroma.down);
-            chroma.u[chroma.at(x, y)] = chroma_u(mean.r, mean.g, mean.b);
-            chroma.v[chroma.at(x, y)] = chroma_v(mean.r, mean.g, mean.b);
+            chroma.u[chroma.at(x, y)] = chroma_u(factors, mean.r, mean.g, mean.b);
+            chroma.v[chroma.at(x, y)] = chroma_v(factors, mean.r, mean.g, mean.b);
         }
     }
     return to;
 }
 
 Picture gray_to_rgba(const Picture& gray) {
+    const YuvFactors factors = yuv_factors();
     Picture rgba(gray.size);
     rgba.is_gray = true;
     uint8_t* to = rgba.bytes();
     for (size_t i = 0; i < gray.size.pixels(); ++i, to += 4) {
-        to[0] = to[1] = to[2] = gray.bytes()[i];
+        to[0] = to[1] = to[2] = to_byte((gray.bytes()[i] - factors.black) * factors.luma);
         to[3] = 255;
     }
     return rgba;
@@ -126,18 +131,19 @@ Picture gray_to_rgba(const Picture& gray) {
 
 Picture yuv_to_rgba(const Picture& yuv) {
     if (yuv.format == PixelFormat::kGray) return gray_to_rgba(yuv);
+    const YuvFactors factors = yuv_factors();
     Picture rgba(yuv.size);
     const size_t width = static_cast<size_t>(yuv.size.width);
     const auto chroma = chroma_of(yuv.bytes(), yuv.format, yuv.size);
     uint8_t* to = rgba.bytes();
     for (size_t i = 0; i < yuv.size.pixels(); ++i) {
         const size_t sample = chroma.at(i % width / chroma.across, i / width / chroma.down);
-        const int y = yuv.bytes()[i] << 16;
+        const int y = (yuv.bytes()[i] - factors.black) * factors.luma;
         const int u = chroma.u[sample] - 128;
         const int v = chroma.v[sample] - 128;
-        *to++ = to_byte(y + 91881 * v);
-        *to++ = to_byte(y - 22554 * u - 46802 * v);
-        *to++ = to_byte(y + 116130 * u);
+        *to++ = to_byte(y + factors.r_of_v * v);
+        *to++ = to_byte(y - factors.g_of_u * u - factors.g_of_v * v);
+        *to++ = to_byte(y + factors.b_of_u * u);
         *to++ = 255;
     }
     return rgba;

@@ -14,6 +14,8 @@ namespace tool {
 
 namespace {
 
+bool may_start_threads = true;
+
 // Not for planes of other formats.
 void resize_quarter(const Picture& source, Picture* result) {
     const auto call = [&](auto function, auto* dst) {
@@ -21,11 +23,15 @@ void resize_quarter(const Picture& source, Picture* result) {
                  result->size.height);
     };
     if (source.format == PixelFormat::kRgba) {
-        return call(ovrin_resize_rgba8888, result->words.data());
+        return call(may_start_threads ? ovrin_resize_rgba8888 : ovrin_resize_rgba8888_sg,
+                    result->words.data());
     }
     if (source.format == PixelFormat::kRgb) return call(ovrin_resize_rgb888, result->bytes());
-    if (source.format == PixelFormat::kI420) return call(ovrin_resize_yuv420, result->bytes());
-    call(ovrin_resize_nv21, result->bytes());
+    if (source.format == PixelFormat::kI420) {
+        return call(may_start_threads ? ovrin_resize_yuv420 : ovrin_resize_yuv420_sg,
+                    result->bytes());
+    }
+    call(may_start_threads ? ovrin_resize_nv21 : ovrin_resize_nv21_sg, result->bytes());
 }
 
 ovrin_resize_target target_of(Size source, const Placement& placement, void* canvas) {
@@ -44,8 +50,9 @@ ovrin_resize_target target_of(Size source, const Placement& placement, void* can
 
 void place_rgba(const Picture& source, const Placement& placement, Picture* canvas) {
     ovrin_resize_target target = target_of(source.size, placement, canvas->words.data());
-    ovrin_resize_rgba8888_keep_ratio(source.bytes(), source.size.width, source.size.height,
-                                     &target);
+    const auto function =
+        may_start_threads ? ovrin_resize_rgba8888_keep_ratio : ovrin_resize_rgba_keep_ratio_sg;
+    function(source.bytes(), source.size.width, source.size.height, &target);
 }
 
 void place_yuv(const Picture& source, const Placement& placement, Picture* canvas) {
@@ -53,11 +60,15 @@ void place_yuv(const Picture& source, const Placement& placement, Picture* canva
     const auto [width, height] = source.size;
     const uint8_t* const luma = source.bytes();
     const uint8_t* const chroma = luma + source.size.pixels();
+    // In bands the library draws nothing that lies further right than the canvas is high.
+    const bool in_bands = may_start_threads && placement.x <= placement.result.height;
     if (source.format == PixelFormat::kNv21) {
-        return ovrin_resize_y_nv21_keep_ratio(luma, chroma, width, height, &target);
+        const auto function = in_bands ? ovrin_resize_y_nv_tps : ovrin_resize_y_nv_sg;
+        return function(luma, chroma, nullptr, width, height, 0, 0, &target);
     }
     const uint8_t* const v = chroma + Size{(width + 1) / 2, (height + 1) / 2}.pixels();
-    ovrin_resize_y_u_v_keep_ratio(luma, chroma, v, width, height, &target);
+    const auto function = in_bands ? ovrin_resize_y_u_v_tps : ovrin_resize_y_u_v_sg;
+    function(luma, chroma, v, nullptr, width, height, 0, 0, &target);
 }
 
 void resize_nearest(const Picture& source, Picture* result) {
@@ -185,7 +196,7 @@ void check_engine(Engine engine, PixelFormat format) {
 }
 
 void resize_lanczos(const uint8_t* src, Size from, uint8_t* dst, Size to, int32_t channels) {
-    if (channels < 4) {
+    if (channels < 4 || !may_start_threads) {
         return ov_lanczos(src, from.width, from.height, dst, to.width, to.height, channels);
     }
     ovrin_resize_lanczos(src, dst, from.width, from.height, to.width, to.height, channels);
@@ -209,6 +220,10 @@ void resize_onto_canvas(const Picture& source, const Placement& placement, Pictu
     Picture rgba(placement.result);
     place_rgba(converted(source, PixelFormat::kRgba), placement, &rgba);
     *canvas = converted(rgba, PixelFormat::kRgb);
+}
+
+void keep_to_calling_thread() {
+    may_start_threads = false;
 }
 
 int white_of(Engine engine) {

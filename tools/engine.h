@@ -26,6 +26,13 @@ void resize_lanczos(const uint8_t* src, Size from, uint8_t* dst, Size to, int32_
 // The quarter engine, straight onto a black, transparent canvas. Not for planes other than 4:2:0.
 void resize_onto_canvas(const Picture& source, const Placement& placement, Picture* canvas);
 
+// Otherwise the library starts threads for pictures of 1024 rows or more, which changes no byte;
+// kBilinearProgressive keeps its own, which do. Before any picture is resized.
+void keep_to_calling_thread();
+
+// Threads that work while the library resizes one picture: its own four, and the calling one.
+constexpr int64_t kThreadsOfPicture = 5;
+
 // What the engine makes of white and of full alpha, 255.
 int white_of(Engine engine);
 

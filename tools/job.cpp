@@ -59,6 +59,12 @@ std::optional<Color> background_of(const Options& options, FileKind out) {
     return kWhite;
 }
 
+// The library's black is that of the full range.
+std::optional<Color> canvas_of(const Options& options, PixelFormat format) {
+    const bool is_limited = is_yuv(format) && options.yuv.range == Range::kLimited;
+    return is_limited ? options.background.value_or(kBlack) : options.background;
+}
+
 SinkSettings settings_of(const Options& options, const Source& source, const Placement& placement) {
     SinkSettings settings = {resized_header(source, placement), {}, options.quality};
     if (!options.strip) {
@@ -95,9 +101,8 @@ void judge_damage(const Options& options, const std::string& damage) {
 }  // namespace
 
 void run(const Options& options) {
-    std::optional<RawLayout> raw;
-    if (options.raw_format) raw = RawLayout{*options.raw_format, *options.raw_size};
-    const auto source = concerning(options.in, [&] { return open_source(options.in, raw); });
+    const auto source =
+        concerning(options.in, [&] { return open_source(options.in, raw_layout(options)); });
     judge_damage(options, source->metadata().damage);
     if (!options.quiet && !source->remark().empty()) {
         say((options.in + ": " + source->remark()).c_str());
@@ -117,7 +122,7 @@ void run(const Options& options) {
                           format_of_result,
                           orientation,
                           background_of(options, out_kind),
-                          options.background,
+                          canvas_of(options, format),
                           options.premultiply,
                           is_image_file(source->kind())};
 

@@ -1,13 +1,17 @@
 // SPDX-License-Identifier: Apache-2.0
-// The ovrinresize command: reads pictures, resizes them with the library, writes them.
+// The ovrinresize command: reads pictures, resizes them with the library, writes them; and what
+// else there is to do with pictures and with the library.
 #include <exception>
 #include <iostream>
 #include <new>
 
 #include "batch.h"
+#include "compare.h"
+#include "info.h"
 #include "job.h"
 #include "message.h"
 #include "options.h"
+#include "selftest.h"
 
 namespace {
 
@@ -26,6 +30,29 @@ ExitCode checked_output() {
     return fail(kFailed, "standard output cannot be written");
 }
 
+bool resize(const Options& options) {
+    const int64_t jobs = options.output ? options.jobs : 1;
+    if (options.threads && *options.threads < jobs * kThreadsOfPicture) keep_to_calling_thread();
+    if (options.output) return run_batch(options) == 0;
+    run(options);
+    return true;
+}
+
+// False when something failed, or files or results differ; that has been said.
+bool carry_out(const Options& options) {
+    switch (options.command) {
+        case Command::kResize:
+            return resize(options);
+        case Command::kInfo:
+            return say_what_files_are(options);
+        case Command::kCompare:
+            return compare(options);
+        case Command::kSelftest:
+            return selftest(options);
+    }
+    return false;
+}
+
 int command(int argc, char** argv) {
     CLI::App app("Resize pictures and video frames.", "ovrinresize");
     Options options;
@@ -38,12 +65,8 @@ int command(int argc, char** argv) {
         return fail(kWrongUsage, error.what());
     }
     set_most_pixels(options.most_pixels);
-    if (options.output) {
-        const bool all_done = run_batch(options) == 0;
-        return all_done ? checked_output() : kFailed;
-    }
-    run(options);
-    return checked_output();
+    set_yuv_meaning(options.yuv);
+    return carry_out(options) ? checked_output() : kFailed;
 }
 
 }  // namespace

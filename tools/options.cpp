@@ -21,14 +21,13 @@ namespace {
 // CLI11's help in the look of other command-line tools: "-s, --size WxH", and defaults in words.
 class HelpFormatter : public CLI::Formatter {
 public:
-    HelpFormatter() {
+    explicit HelpFormatter(std::string usage) : usage_(std::move(usage)) {
         column_width(26);
         label("Positionals", "Arguments");
     }
 
     std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
-        return "Usage: ovrinresize IN OUT --size SIZE [OPTION]...\n"
-               "       ovrinresize IN... --output TEMPLATE --size SIZE [OPTION]...\n";
+        return usage_;
     }
 
     std::string make_option_name(const CLI::Option* option, bool is_positional) const override {
@@ -44,6 +43,9 @@ public:
     std::string make_option_opts(const CLI::Option* option) const override {
         return option->get_type_name().empty() ? "" : " " + option->get_type_name();
     }
+
+private:
+    std::string usage_;
 };
 
 [[noreturn]] void reject(const std::string& names, const std::string& why) {
@@ -139,6 +141,64 @@ void add_frames(CLI::App* app, Options* options) {
         ->type_name("A:B");
 }
 
+void declare_raw(CLI::App* app, Options* options) {
+    add_choice<std::optional<PixelFormat>, PixelFormat>(
+        app, "--format", "FORMAT", &options->raw_format,
+        {{"nv21", PixelFormat::kNv21},
+         {"i420", PixelFormat::kI420},
+         {"rgba", PixelFormat::kRgba},
+         {"rgb", PixelFormat::kRgb}},
+        "IN holds raw frames: nv21, i420, rgba or rgb");
+    add_value(app, "--input-size", "WxH", &options->raw_size, read_size, "Size of the raw frames");
+    app->get_option("--format")->needs("--input-size");
+    app->get_option("--input-size")->needs("--format");
+}
+
+void declare_yuv(CLI::App* app, Options* options) {
+    add_choice<Range, Range>(app, "--range", "RANGE", &options->yuv.range,
+                             {{"full", Range::kFull}, {"limited", Range::kLimited}},
+                             "Of YUV beside RGB: full, from 0 to 255, by default, or limited,\n"
+                             "luma from 16 to 235");
+    add_choice<Matrix, Matrix>(app, "--matrix", "NAME", &options->yuv.matrix,
+                               {{"601", Matrix::k601}, {"709", Matrix::k709}},
+                               "Of YUV beside RGB: that of BT.601, by default, or 709");
+}
+
+int64_t read_threads(const std::string& text) {
+    int64_t threads = 0;
+    const char* const end = text.data() + text.size();
+    const auto [stop, status] = std::from_chars(text.data(), end, threads);
+    if (status != std::errc() || stop != end || threads < 1) {
+        throw Error("'" + text + "' is neither auto nor a number from 1 on");
+    }
+    return threads;
+}
+
+void declare_threads(CLI::App* app, Options* options) {
+    const auto parse = [options](const std::string& text) {
+        options->threads.reset();
+        if (text == "auto") return;
+        try {
+            options->threads = read_threads(text);
+        } catch (const Error& error) {
+            reject("--threads", error.what());
+        }
+    };
+    app->add_option_function<std::string>(
+           "--threads", parse,
+           "At most so many threads at a time, for a picture or for all jobs;\n"
+           "auto, as many as do good, by default")
+        ->type_name("N");
+}
+
+void declare_limit(CLI::App* app, Options* options) {
+    app->add_option("--max-pixels", options->most_pixels,
+                    "Refuse larger pictures, before memory is taken for them;\n"
+                    "268435456, which is the most, by default")
+        ->type_name("N")
+        ->check(CLI::Range(int64_t{1}, kMostPixels).description(""));
+}
+
 void declare_files(CLI::App* app, Options* options) {
     app->add_option("IN OUT", options->files,
                     "IN is PNG, JPEG, PBM, PGM, PPM, PAM, Y4M or, with --format, raw\n"
@@ -164,16 +224,7 @@ void declare_files(CLI::App* app, Options* options) {
         ->check(CLI::Range(1, kMostDoomedFiles).description(""))
         ->needs("--output");
     add_frames(app, options);
-    add_choice<std::optional<PixelFormat>, PixelFormat>(
-        app, "--format", "FORMAT", &options->raw_format,
-        {{"nv21", PixelFormat::kNv21},
-         {"i420", PixelFormat::kI420},
-         {"rgba", PixelFormat::kRgba},
-         {"rgb", PixelFormat::kRgb}},
-        "IN holds raw frames: nv21, i420, rgba or rgb");
-    add_value(app, "--input-size", "WxH", &options->raw_size, read_size, "Size of the raw frames");
-    app->get_option("--format")->needs("--input-size");
-    app->get_option("--input-size")->needs("--format");
+    declare_raw(app, options);
 }
 
 void declare_resizing(CLI::App* app, Options* options) {
@@ -216,10 +267,15 @@ void declare_resizing(CLI::App* app, Options* options) {
         "to half or less in both directions, and quarter for all others");
 }
 
-void declare(CLI::App* app, Options* options) {
-    app->formatter(std::make_shared<HelpFormatter>());
+void declare_resize(CLI::App* app, Options* options) {
+    app->formatter(std::make_shared<HelpFormatter>(
+        "Usage: ovrinresize IN OUT --size SIZE [OPTION]...\n"
+        "       ovrinresize IN... --output TEMPLATE --size SIZE [OPTION]...\n"
+        "       ovrinresize info | compare | selftest, each with --help\n"));
     declare_resizing(app, options);
     declare_files(app, options);
+    declare_yuv(app, options);
+    declare_threads(app, options);
     app->add_option("-q,--quality", options->quality, "JPEG quality, 1 to 100; 90 by default")
         ->type_name("N")
         ->check(CLI::Range(1, 100).description(""));
@@ -244,17 +300,13 @@ void declare(CLI::App* app, Options* options) {
                   "Say on standard output what was done, as one line of JSON");
     app->add_flag("--quiet", options->quiet, "Say nothing but what went wrong");
     app->get_option("--quiet")->excludes("--verbose");
-    app->add_option("--max-pixels", options->most_pixels,
-                    "Refuse larger pictures, before memory is taken for them;\n"
-                    "268435456, which is the most, by default")
-        ->type_name("N")
-        ->check(CLI::Range(int64_t{1}, kMostPixels).description(""));
-    app->set_help_flag("-h,--help", "Print this help and exit");
+    declare_limit(app, options);
     app->set_version_flag("-V,--version", version_text(),
                           "Print the versions and the kernels in use, and exit");
     app->footer(
         "The content of IN decides what it is, not its name. An older OUT is replaced.\n"
-        "See ovrinresize(1) for the details.\n"
+        "info says what files hold, compare how far two are apart, selftest whether the\n"
+        "library works as it should on this machine. See ovrinresize(1) for the details.\n"
         "\n"
         "Examples:\n"
         "  ovrinresize photo.jpg small.jpg --size 1024x768\n"
@@ -262,6 +314,75 @@ void declare(CLI::App* app, Options* options) {
         "  ovrinresize *.jpg --size 200 --output thumbs/%s_small.jpg\n"
         "  ovrinresize camera.nv21 small.nv21 --format nv21 --input-size 4000x3000 -s 1000x750\n"
         "  ffmpeg -i film.mp4 -f yuv4mpegpipe - | ovrinresize - - -s 640x360 | ffplay -");
+}
+
+void declare_upright(CLI::App* app, Options* options) {
+    add_switch_off(app, "--no-rotate", &options->rotate,
+                   "Leave the orientation that a camera recorded out of account");
+}
+
+void declare_info(CLI::App* app, Options* options) {
+    app->description("Say what pictures and video frames are, on standard output.");
+    app->formatter(
+        std::make_shared<HelpFormatter>("Usage: ovrinresize info FILE... [OPTION]...\n"));
+    app->add_option("FILE", options->files, "As IN of ovrinresize; - is standard input")
+        ->type_name("");
+    declare_raw(app, options);
+    declare_limit(app, options);
+    app->add_flag("--json", options->json, "Say it as a line of JSON for each file");
+}
+
+void declare_compare(CLI::App* app, Options* options) {
+    app->description(
+        "Say how far two pictures, or the frames of two files, are apart. The exit status is 0 "
+        "when\n"
+        "they are equal, 1 when they are not or have different sizes.");
+    app->formatter(std::make_shared<HelpFormatter>("Usage: ovrinresize compare A B [OPTION]...\n"));
+    app->add_option("A B", options->files, "As IN of ovrinresize; - is standard input")
+        ->type_name("");
+    app->add_option("--max-diff", options->largest_difference,
+                    "Samples that are so far apart count as equal; 0 by default")
+        ->type_name("N")
+        ->check(CLI::Range(0, 255).description(""));
+    declare_raw(app, options);
+    declare_yuv(app, options);
+    declare_upright(app, options);
+    declare_limit(app, options);
+    app->add_flag("--json", options->json, "Say it as one line of JSON");
+    app->add_flag("--quiet", options->quiet, "Say nothing but what went wrong");
+    app->get_option("--quiet")->excludes("--json");
+}
+
+void declare_selftest(CLI::App* app, Options* options) {
+    app->description(
+        "Call the library with every set of kernels that this processor has, and compare the "
+        "results\n"
+        "with those that are the same everywhere. The exit status is 1 when any differs.");
+    app->formatter(std::make_shared<HelpFormatter>("Usage: ovrinresize selftest [OPTION]...\n"));
+    app->add_option("--library", options->library,
+                    "Call this shared library instead, with the kernels that it chooses")
+        ->type_name("FILE");
+    app->add_flag("--json", options->json, "Say it as one line of JSON");
+}
+
+void declare(CLI::App* app, Options* options) {
+    app->set_help_flag("-h,--help", "Print this help and exit");
+    switch (options->command) {
+        case Command::kResize:
+            return declare_resize(app, options);
+        case Command::kInfo:
+            return declare_info(app, options);
+        case Command::kCompare:
+            return declare_compare(app, options);
+        case Command::kSelftest:
+            return declare_selftest(app, options);
+    }
+}
+
+Command command_of(const std::string& word) {
+    if (word == "info") return Command::kInfo;
+    if (word == "compare") return Command::kCompare;
+    return word == "selftest" ? Command::kSelftest : Command::kResize;
 }
 
 void check_template(const Options& options) {
@@ -293,12 +414,7 @@ void take_files(Options* options) {
     options->out = options->files[1];
 }
 
-}  // namespace
-
-void parse(int argc, char** argv, CLI::App* app, Options* options) {
-    declare(app, options);
-    options->jobs = std::clamp<int64_t>(std::thread::hardware_concurrency(), 1, kMostDoomedFiles);
-    app->parse(argc, argv);
+void check_resize(Options* options) {
     take_files(options);
     if (!options->wish.size && !options->wish.canvas) {
         throw CLI::RequiredError("--size or --canvas");
@@ -306,6 +422,32 @@ void parse(int argc, char** argv, CLI::App* app, Options* options) {
     if (options->json && (options->out == "-" || options->output == "-")) {
         throw CLI::ValidationError("--json", "standard output is taken by OUT");
     }
+    if (options->threads) options->jobs = std::min(options->jobs, *options->threads);
+}
+
+void check(Options* options) {
+    const size_t count = options->files.size();
+    if (options->command == Command::kResize) check_resize(options);
+    if (options->command == Command::kInfo && count == 0) throw CLI::RequiredError("FILE");
+    if (options->command == Command::kCompare && count != 2) {
+        throw CLI::ValidationError("compare", "takes two files, A and B");
+    }
+}
+
+}  // namespace
+
+std::optional<RawLayout> raw_layout(const Options& options) {
+    if (!options.raw_format) return std::nullopt;
+    return RawLayout{*options.raw_format, *options.raw_size};
+}
+
+void parse(int argc, char** argv, CLI::App* app, Options* options) {
+    options->command = command_of(argc > 1 ? argv[1] : "");
+    const int words = options->command == Command::kResize ? 0 : 1;
+    declare(app, options);
+    options->jobs = std::clamp<int64_t>(std::thread::hardware_concurrency(), 1, kMostDoomedFiles);
+    app->parse(argc - words, argv + words);
+    check(options);
 }
 
 }  // namespace tool

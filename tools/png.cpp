@@ -93,6 +93,20 @@ bool is_converted(const Decoder& decoder) {
 
 // ---- Reading ----
 
+// Bytes up to the end of the last chunk that is whole: libpng takes memory for a chunk before it
+// sees how much of it there is.
+size_t whole_chunks(const uint8_t* data, size_t size) {
+    constexpr size_t kSignature = 8;
+    constexpr size_t kAround = 12;  // length, type and checksum
+    size_t end = std::min(size, kSignature);
+    while (size - end >= kAround) {
+        const size_t content = png_get_uint_32(data + end);
+        if (content > size - end - kAround) break;
+        end += content + kAround;
+    }
+    return end;
+}
+
 bool read_header(Decoder* decoder) {
     if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
     png_set_read_fn(decoder->png, &decoder->unread, read_bytes);
@@ -259,7 +273,7 @@ bool is_png(const uint8_t* data, size_t size) {
 }
 
 Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata) {
-    Decoder decoder(data, size);
+    Decoder decoder(data, whole_chunks(data, size));
     if (!read_header(&decoder)) throw error("damaged PNG", decoder.errors);
     Picture picture(checked_size(png_get_image_width(decoder.png, decoder.info),
                                  png_get_image_height(decoder.png, decoder.info)));

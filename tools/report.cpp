@@ -2,18 +2,11 @@
 #include "report.h"
 
 #include <iomanip>
-#include <nlohmann/json.hpp>
 #include <sstream>
 
+#include "json.h"
+
 namespace tool {
-
-namespace {
-
-nlohmann::ordered_json json_of(Size size) {
-    return {{"width", size.width}, {"height", size.height}};
-}
-
-}  // namespace
 
 std::string in_words(const Report& report) {
     const Placement& placement = report.placement;
@@ -30,7 +23,7 @@ std::string in_words(const Report& report) {
 }
 
 std::string as_json(const Report& report) {
-    const nlohmann::ordered_json json = {
+    return json_line({
         {"in", report.in},
         {"out", report.out},
         {"format", name_of(report.format)},
@@ -40,9 +33,7 @@ std::string as_json(const Report& report) {
         {"engine", name_of(report.engine)},
         {"frames", report.frames},
         {"resizing_ms", report.resizing_ms},
-    };
-    // Names of files may be any bytes; those that are no UTF-8 are replaced.
-    return json.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+    });
 }
 
 }  // namespace tool

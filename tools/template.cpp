@@ -58,7 +58,8 @@ std::vector<InAndOut> in_and_out(const std::vector<std::string>& inputs, const s
                                  bool is_recursive) {
     std::vector<InAndOut> files;
     for (const std::string& input : inputs) {
-        if (!fs::is_directory(input)) {
+        std::error_code ignored;  // opening the file will tell
+        if (!fs::is_directory(input, ignored)) {
             files.push_back({input, filled_template(text, fs::path(input).stem())});
             continue;
         }

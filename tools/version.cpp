@@ -3,23 +3,17 @@
 
 #include <ovrinresize.h>
 
-// The library's own look at the processor, compiled in: it does not tell its choice.
-#include "kernels/cpu.h"
+#include "kernels/kernels.h"
 
 namespace tool {
 
 namespace {
 
 const char* kernels() {
-#if defined(OVRIN_KERNELS)
-    return OVRIN_KERNELS;
-#elif defined(__aarch64__)
-    return "neon";
-#else
-    const ovrin::CpuFeatures cpu = ovrin::cpu_features();
-    if (cpu.avx512_vbmi) return "avx512";
-    return cpu.avx2 ? "avx2" : "scalar";
-#endif
+    ovrin::NamedKernels sets[ovrin::kMaxSets];
+    int32_t number = ovrin::available_kernels(sets) - 1;
+    while (number > 0 && sets[number].kernels != &ovrin::kernels()) --number;
+    return sets[number].name;
 }
 
 }  // namespace

@@ -42,8 +42,6 @@ pkg-config, and the documents.")
 set(CPACK_DEBIAN_TOOL_PACKAGE_NAME ovrinresize)
 set(CPACK_DEBIAN_TOOL_PACKAGE_SECTION graphics)
 set(CPACK_DEBIAN_TOOL_PACKAGE_SHLIBDEPS ON)
-set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${PROJECT_BINARY_DIR})
-set(CPACK_DEBIAN_TOOL_PACKAGE_DEPENDS "${library_package} (= ${debian_version})")
 set(CPACK_COMPONENT_TOOL_DESCRIPTION "resize pictures and video frames
 This package has the command ovrinresize, which resizes PNG and JPEG pictures,
 PPM, Y4M video and raw frames with the resamplers of libovrinresize. It turns

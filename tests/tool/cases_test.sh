@@ -7,6 +7,7 @@
 # ARGUMENTS are the shell's words. SIZE is that of OUT, the second argument, as another program sees
 # it; empty: not looked at. MESSAGE is a pattern that standard error must match; empty: nothing is said.
 # A CHECK is a command that must print what is EXPECTED: what another program says of the result.
+# Where the first of the ARGUMENTS is info, compare or selftest, what it prints lies in the file stdout.
 # Usage: cases_test.sh PATH_OF_OVRINRESIZE NAME_OF_TABLE
 source "$(dirname "${BASH_SOURCE[0]}")/support.sh"
 table=$2
@@ -44,6 +45,20 @@ succeeds() {
     fi
 }
 
+# answers STATUS MESSAGE COMMAND ARGUMENT...: it may print something.
+answers() {
+    local wanted=$1 message=$2 status
+    shift 2
+    "$tool" "$@" >stdout 2>stderr
+    status=$?
+    [ "$status" = "$wanted" ] || complain "exit code $status, not $wanted, of: $*: $(cat stderr)"
+    if [ -z "$message" ]; then
+        [ ! -s stderr ] || complain "message of: $*: $(cat stderr)"
+    else
+        grep -q -e "^ovrinresize: .*$message" stderr || complain "no '$message' from: $*: $(cat stderr)"
+    fi
+}
+
 run_checks() {
     local rest="$1 ;;" check expected actual
     while [ "$(trim "$rest")" ]; do
@@ -64,7 +79,9 @@ run_case() {
     status=$(trim "$status")
     size=$(trim "$size")
     message=$(trim "$message")
-    if [ "$status" = 0 ]; then
+    if [[ ${1-} == @(info|compare|selftest) ]]; then
+        answers "$status" "$message" "$@"
+    elif [ "$status" = 0 ]; then
         succeeds "$message" "$@"
     else
         fails "$status" "$message" "$@"

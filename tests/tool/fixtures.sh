@@ -89,6 +89,15 @@ make_sample() {
     convert sample.png -crop 800x800+400+200 +repage -depth 8 RGB:sample.rgb
 }
 
+# A PNG of which one chunk announces a gigabyte of text.
+make_announcement() {
+    {
+        head -c 33 plain.png # up to the end of its first chunk
+        printf '\x40\0\0\0tEXt'
+        tail -c +34 plain.png
+    } >long_text.png
+}
+
 # album/: photographs in folders, and what is none. empty/ holds nothing.
 make_album() {
     mkdir -p album/2025/may album/2026 empty
@@ -142,11 +151,33 @@ make_inputs() {
     make_videos
 }
 
+# Frames of one colour, which video knows by these numbers.
+make_frames() {
+    local colour
+    for colour in red lime blue white black; do
+        convert -size 8x8 "xc:$colour" "PNG24:pure_$colour.png"
+    done
+    {
+        echo 'YUV4MPEG2 W8 H8 F25:1 Ip A1:1 C420jpeg'
+        for _ in 1 2 3; do
+            echo FRAME
+            head -c 64 /dev/zero | tr '\0' '\100'
+            head -c 32 /dev/zero | tr '\0' '\200'
+        done
+    } >three.y4m
+    sed '2,$!d' three.y4m >headless
+    { head -n 1 three.y4m; head -c $((2 * (6 + 96))) headless; } >two.y4m
+    tr '\100' '\103' <three.y4m >brighter.y4m
+    tail -c 96 three.y4m >gray.i420
+}
+
 make_fixtures() {
     make_photographs
     make_coloured
     make_transparent
     make_sample
+    make_announcement
+    make_frames
     make_album
 }
 
@@ -268,6 +299,29 @@ def value(key):
     for name in names: found = found[name]
     return str(found)
 print(*map(value, sys.argv[1].split()))' "$keys"
+}
+
+# is_light ARGUMENT...: whether the tool, so called, takes less than half a gigabyte of memory.
+is_light() {
+    python3 - "$tool" "$@" 2>&1 <<'END'
+import resource, subprocess, sys
+subprocess.run(sys.argv[1:], stderr=subprocess.DEVNULL)
+kilobytes = resource.getrusage(resource.RUSAGE_CHILDREN).ru_maxrss
+print("yes" if kilobytes < 500000 else f"no: {kilobytes} KB")
+END
+}
+
+# yuv FILE: luma, U and V of the first pixel of an I420 picture of 8 x 8.
+yuv() {
+    od -An -v -tu1 "$1" | xargs | awk '{ print $1, $65, $81 }'
+}
+
+# of_json KEY...: of the line in the file stdout, by a reader of JSON that is not ours.
+of_json() {
+    python3 -c '
+import json, sys
+found = json.load(open("stdout"))
+print(*(eval("found" + key) for key in sys.argv[1:]))' "$@"
 }
 
 # sizes FILE...: of each.

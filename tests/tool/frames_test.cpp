@@ -2,6 +2,7 @@
 // Placement, conversion between pixel formats, and the arithmetic of Y4M headers.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <vector>
 
@@ -10,6 +11,7 @@
 #include "placement.h"
 #include "support/random.h"
 #include "y4m.h"
+#include "yuv.h"
 
 using ovrin_test::Random;
 using namespace tool;
@@ -102,6 +104,77 @@ TEST(Placement, AlwaysFits) {
         ASSERT_LE(p.y + p.picture.height, canvas.height);
         ASSERT_TRUE(p.picture.width == canvas.width || p.picture.height == canvas.height);
     }
+}
+
+namespace {
+
+struct Rgb {
+    double r, g, b;
+};
+
+// By the definition: kr and kb are the shares of red and of blue in luma.
+struct Meaning {
+    YuvMeaning name;
+    double kr, kb;
+    double black, luma, chroma;  // luma of black, and how far luma and chroma reach
+
+    std::vector<double> yuv(Rgb c) const {
+        const double y = kr * c.r + (1 - kr - kb) * c.g + kb * c.b;
+        return {black + luma * y / 255, 128 + chroma * (c.b - y) / (2 * (1 - kb)) / 255,
+                128 + chroma * (c.r - y) / (2 * (1 - kr)) / 255};
+    }
+    Rgb rgb(const std::vector<int>& yuv) const {
+        const double y = (yuv[0] - black) * 255 / luma;
+        const double r = y + 2 * (1 - kr) * (yuv[2] - 128) * 255 / chroma;
+        const double b = y + 2 * (1 - kb) * (yuv[1] - 128) * 255 / chroma;
+        return {r, (y - kr * r - kb * b) / (1 - kr - kb), b};
+    }
+};
+
+const Meaning kMeanings[] = {
+    {{Matrix::k601, Range::kFull}, 0.299, 0.114, 0, 255, 255},
+    {{Matrix::k601, Range::kLimited}, 0.299, 0.114, 16, 219, 224},
+    {{Matrix::k709, Range::kFull}, 0.2126, 0.0722, 0, 255, 255},
+    {{Matrix::k709, Range::kLimited}, 0.2126, 0.0722, 16, 219, 224},
+};
+
+double to_range(double value) {
+    return std::clamp(value, 0.0, 255.0);
+}
+
+// Of one pixel.
+std::vector<int> yuv_of(const std::vector<int>& rgb) {
+    return values(converted(of_bytes({1, 1}, PixelFormat::kRgb, rgb), PixelFormat::kI420));
+}
+
+}  // namespace
+
+TEST(Convert, BetweenRgbAndYuvIsAsDefined) {
+    Random random(3);
+    SCOPED_TRACE(random.trace());
+    for (const Meaning& meaning : kMeanings) {
+        set_yuv_meaning(meaning.name);
+        for (int i = 0; i < 20000; ++i) {
+            const std::vector<int> color = {random.between(0, 255), random.between(0, 255),
+                                            random.between(0, 255)};
+            const std::vector<int> yuv = yuv_of(color);
+            const std::vector<double> wanted =
+                meaning.yuv({double(color[0]), double(color[1]), double(color[2])});
+            for (size_t c = 0; c < 3; ++c) ASSERT_NEAR(yuv[c], to_range(wanted[c]), 0.51);
+            const std::vector<int> rgb =
+                values(converted(of_bytes({1, 1}, PixelFormat::kI420, color), PixelFormat::kRgb));
+            const Rgb right = meaning.rgb(color);
+            ASSERT_NEAR(rgb[0], to_range(right.r), 0.52);
+            ASSERT_NEAR(rgb[1], to_range(right.g), 0.52);
+            ASSERT_NEAR(rgb[2], to_range(right.b), 0.52);
+        }
+        for (int gray = 0; gray < 256; ++gray) {
+            const std::vector<int> yuv = yuv_of({gray, gray, gray});
+            ASSERT_EQ(yuv[1], 128);
+            ASSERT_EQ(yuv[2], 128);
+        }
+    }
+    set_yuv_meaning({});
 }
 
 TEST(Convert, BetweenI420AndNv21MovesChromaOnly) {
