@@ -46,7 +46,7 @@ struct Ratio {
     int32_t source_of(int32_t count) const { return count * source / destination; }
 };
 
-constexpr Ratio kRatios[] = {{2, 3}, {3, 2}, {2, 1}, {4, 1}};
+constexpr Ratio kRatios[] = {{2, 3}, {3, 2}, {2, 1}, {25, 8}, {4, 1}, {64, 15}, {18, 1}};
 
 std::string shape_of(int32_t bytes, const char* unit, const Ratio& ratio) {
     return std::to_string(bytes) + " " + unit + (bytes == 1 ? ", " : "s, ") + ratio.text();

@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: Apache-2.0
-// Quarter-point rows with AVX2. Byte shuffles stay inside 16-byte lanes, so each lane is a
-// destination vector with windows of its own; two lanes go at a time.
+// Quarter-point rows with AVX2. Byte shuffles stay inside 16-byte lanes, so that how many of them a
+// destination vector takes depends on how far its taps lie apart.
 #include <immintrin.h>
 
 #include "kernels/inline.h"
+#include "kernels/prefetch.h"
 #include "kernels/quarter_averages_x86_inl.h"
 #include "kernels/quarter_windows_inl.h"
 #include "kernels/sets.h"
@@ -14,149 +15,220 @@ namespace {
 
 constexpr int32_t kLane = 16;
 constexpr int32_t kVector = 32;
-constexpr int32_t kMaxWindows = 8;
 
-// Storage of a plan, for every two lanes.
-struct LanesEntry {
-    int32_t low;  // first bytes of the lanes' windows within a row
-    int32_t high;
-    int32_t masks;  // where in the plan lie, for each window, the masks of the left and right taps
+// What one window of source bytes makes. A window of a vector is shuffled once for what lies in its
+// low lane and what lies in its high one, and then both are joined.
+enum class Reach {
+    kNear,    // a window of 16 bytes makes a lane: enlarging
+    kMiddle,  // one of 32 bytes makes a lane, the left and the right taps by a shuffle each
+    kFar,     // one of 32 bytes makes up to half a lane: left and right taps side by side
+};
+
+constexpr int32_t window_bytes(Reach reach) {
+    return reach == Reach::kNear ? kLane : kVector;
+}
+
+// The windows of a vector: one for each lane, or for each half of one.
+constexpr int32_t window_count(Reach reach) {
+    return reach == Reach::kFar ? 4 : 2;
+}
+
+constexpr int32_t mask_count(Reach reach) {
+    return reach == Reach::kNear ? 2 : 4;
+}
+
+// Storage of a plan, for every destination vector.
+struct WindowsEntry {
+    int32_t bases[4];  // first bytes of the windows within a row
+    int32_t masks;     // where in the plan the vector's masks lie
 
     bool move(int64_t bytes, int32_t last_base) {
-        if (low + bytes > last_base || high + bytes > last_base) return false;
-        low += static_cast<int32_t>(bytes);
-        high += static_cast<int32_t>(bytes);
+        for (const int32_t base : bases) {
+            if (base + bytes > last_base) return false;
+        }
+        for (int32_t& base : bases) base += static_cast<int32_t>(bytes);
         return true;
     }
 };
 
-constexpr int32_t mask_bytes(int32_t windows) {
-    return windows * 2 * kVector;
-}
+struct Mask {
+    uint8_t lanes[2][kLane];
+};
 
-// The masks of one lane. A shuffle gives 0 where the mask's top bit is set: adding 0x70 with
-// saturation leaves that bit clear for offsets 0 to 15, inside the window, and sets it for others.
-void store_masks(uint8_t* masks, const WindowTaps& taps, int32_t windows) {
-    const __m128i left = _mm_load_si128(reinterpret_cast<const __m128i*>(taps.left));
-    const __m128i right = _mm_load_si128(reinterpret_cast<const __m128i*>(taps.right));
-    const __m128i outside = _mm_set1_epi8(0x70);
-    for (int32_t w = 0; w < windows; ++w, masks += 2 * kVector) {
-        const __m128i start = _mm_set1_epi8(static_cast<char>(w * kLane));
-        const __m128i left_mask = _mm_adds_epu8(_mm_sub_epi8(left, start), outside);
-        const __m128i right_mask = _mm_adds_epu8(_mm_sub_epi8(right, start), outside);
-        _mm_store_si128(reinterpret_cast<__m128i*>(masks), left_mask);
-        _mm_store_si128(reinterpret_cast<__m128i*>(masks + kVector), right_mask);
+// Notes that the bytes of a sample from `at` on come from those of the window from `offset` on.
+void put_tap(uint8_t* low_lane, uint8_t* high_lane, int32_t at, int32_t offset, int32_t bytes) {
+    for (int32_t c = 0; c < bytes; ++c, ++offset) {
+        uint8_t* lane = offset < kLane ? low_lane : high_lane;
+        lane[at + c] = static_cast<uint8_t>(offset % kLane);
     }
 }
 
-int32_t encode_lane(uint8_t* masks, const Tap* taps, int32_t count, const QuarterPlan& plan,
-                    int32_t windows) {
-    WindowTaps window;
-    locate_taps(window, taps, count, plan, windows * kLane);
-    store_masks(masks, window, windows);
-    return window.base;
-}
-
-void encode(uint8_t* masks, LanesEntry& entry, const Tap* taps, int32_t count,
-            const QuarterPlan& plan, int32_t windows) {
-    const int32_t lane = plan.vector_samples / 2;
-    const int32_t low = count < lane ? count : lane;
-    // A lane without a tap of its own stays where the other one is.
-    const int32_t high = count > lane ? lane : 0;
-    entry.low = encode_lane(masks, taps, low, plan, windows);
-    entry.high = encode_lane(masks + kLane, taps + high, count - high, plan, windows);
-}
-
-void fetch_lanes(const uint8_t* row, LanesEntry entry, int32_t window) {
-    _mm_prefetch(row + entry.low + window * kLane, _MM_HINT_T0);
-    _mm_prefetch(row + entry.high + window * kLane, _MM_HINT_T0);
-}
-
-__m256i load_lanes(const uint8_t* row, LanesEntry entry, int32_t window) {
-    const auto* low = reinterpret_cast<const __m128i*>(row + entry.low + window * kLane);
-    const auto* high = reinterpret_cast<const __m128i*>(row + entry.high + window * kLane);
-    return _mm256_inserti128_si256(_mm256_castsi128_si256(_mm_loadu_si128(low)),
-                                   _mm_loadu_si128(high), 1);
-}
-
-// Two lanes: twice the sums of the rows' quarters, then what is gathered for either tap. A cache
-// line holds four windows, so only every fourth one has its line fetched for the next rows.
-template <int kWindows, bool kPair>
-OVRIN_ALWAYS_INLINE __m256i gather(const QuarterRows& rows, const QuarterPlan& plan,
-                                   LanesEntry entry) {
-    const uint8_t* masks = plan.bytes + entry.masks;
-    __m256i left = _mm256_setzero_si256();
-    __m256i right = _mm256_setzero_si256();
-    for (int w = 0; w < kWindows; ++w) {
-        const __m256i top = clear_low_bits(load_lanes(rows.top, entry, w));
-        const __m256i sums =
-            kPair ? _mm256_avg_epu8(top, clear_low_bits(load_lanes(rows.bottom, entry, w)))
-                  : halve(top);
-        if (kWindows > 1 && w % 4 == 0) {
-            fetch_lanes(rows.next_top, entry, w);
-            if (kPair) fetch_lanes(rows.next_bottom, entry, w);
+template <Reach kReach>
+void encode(uint8_t* storage, WindowsEntry& entry, const Tap* taps, int32_t count,
+            const QuarterPlan& plan) {
+    const int32_t n = plan.sample_bytes;
+    const int32_t window_samples = plan.vector_samples / window_count(kReach);
+    const int32_t last_base = static_cast<int32_t>(plan.row_bytes) - window_bytes(kReach);
+    auto* masks = reinterpret_cast<Mask*>(storage);
+    memset(masks, 0x80, sizeof(Mask) * mask_count(kReach));  // a shuffle gives 0 for it
+    for (int32_t w = 0; w < window_count(kReach); ++w) {
+        const int32_t begin = w * window_samples;
+        // A window without samples lies where the last one begins.
+        const int32_t first = taps[begin < count ? begin : count - 1].left * n;
+        entry.bases[w] = first < last_base ? first : last_base;
+        for (int32_t i = 0; i < window_samples && begin + i < count; ++i) {
+            const int32_t left = n * taps[begin + i].left - entry.bases[w];
+            const int32_t right = n * taps[begin + i].right - entry.bases[w];
+            if (kReach == Reach::kNear) {
+                put_tap(masks[0].lanes[w], nullptr, n * i, left, n);
+                put_tap(masks[1].lanes[w], nullptr, n * i, right, n);
+            } else if (kReach == Reach::kMiddle) {
+                put_tap(masks[2 * w].lanes[0], masks[2 * w].lanes[1], n * i, left, n);
+                put_tap(masks[2 * w + 1].lanes[0], masks[2 * w + 1].lanes[1], n * i, right, n);
+            } else {
+                put_tap(masks[w].lanes[0], masks[w].lanes[1], n * i, left, n);
+                put_tap(masks[w].lanes[0], masks[w].lanes[1], kLane / 2 + n * i, right, n);
+            }
         }
-        const auto* mask = reinterpret_cast<const __m256i*>(masks + w * 2 * kVector);
-        left = _mm256_or_si256(left, _mm256_shuffle_epi8(sums, _mm256_load_si256(mask)));
-        right = _mm256_or_si256(right, _mm256_shuffle_epi8(sums, _mm256_load_si256(mask + 1)));
     }
-    return _mm256_avg_epu8(left, right);
+}
+
+OVRIN_ALWAYS_INLINE __m256i load_window(const uint8_t* window) {
+    return clear_low_bits(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(window)));
+}
+
+OVRIN_ALWAYS_INLINE __m256i load_window(const uint8_t* low, const uint8_t* high) {
+    const __m256i lanes = _mm256_inserti128_si256(
+        _mm256_castsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(low))),
+        _mm_loadu_si128(reinterpret_cast<const __m128i*>(high)), 1);
+    return clear_low_bits(lanes);
+}
+
+// Twice the sums of the rows' quarters.
+template <bool kPair, class... Bases>
+OVRIN_ALWAYS_INLINE __m256i sums_of(const QuarterRows& rows, Bases... base) {
+    const __m256i top = load_window(rows.top + base...);
+    return kPair ? _mm256_avg_epu8(top, load_window(rows.bottom + base...)) : halve(top);
+}
+
+// Both lanes of a in the low lane, and both lanes of b in the high one.
+OVRIN_ALWAYS_INLINE __m256i join(__m256i a, __m256i b) {
+    return _mm256_or_si256(_mm256_blend_epi32(a, b, 0xF0), _mm256_permute2x128_si256(a, b, 0x21));
+}
+
+template <Reach kReach, bool kPair>
+OVRIN_ALWAYS_INLINE __m256i gather(const QuarterRows& rows, const QuarterPlan& plan,
+                                   const WindowsEntry& entry) {
+    const auto* masks = reinterpret_cast<const __m256i*>(plan.bytes + entry.masks);
+    const auto shuffle = [&](__m256i window, int32_t mask) {
+        return _mm256_shuffle_epi8(window, _mm256_load_si256(masks + mask));
+    };
+    const auto sums = [&](int32_t w) { return sums_of<kPair>(rows, entry.bases[w]); };
+    if (kReach == Reach::kNear) {
+        const __m256i lanes = sums_of<kPair>(rows, entry.bases[0], entry.bases[1]);
+        return _mm256_avg_epu8(shuffle(lanes, 0), shuffle(lanes, 1));
+    }
+    if (kReach == Reach::kMiddle) {
+        const __m256i low = sums(0);
+        const __m256i high = sums(1);
+        return _mm256_avg_epu8(join(shuffle(low, 0), shuffle(high, 2)),
+                               join(shuffle(low, 1), shuffle(high, 3)));
+    }
+    const __m256i first = join(shuffle(sums(0), 0), shuffle(sums(2), 2));
+    const __m256i second = join(shuffle(sums(1), 1), shuffle(sums(3), 3));
+    return _mm256_avg_epu8(_mm256_unpacklo_epi64(first, second),
+                           _mm256_unpackhi_epi64(first, second));
+}
+
+// A shuffle that brings the samples of a lane's two halves together; zeros follow.
+__m256i order_of_halves(int32_t half_bytes) {
+    const auto all = [](int32_t value) { return _mm_set1_epi8(static_cast<char>(value)); };
+    const __m128i index = _mm_setr_epi8(0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15);
+    const __m128i gap =
+        _mm_and_si128(_mm_cmpgt_epi8(index, all(half_bytes - 1)), all(kLane / 2 - half_bytes));
+    const __m128i behind = _mm_cmpgt_epi8(index, all(2 * half_bytes - 1));
+    return _mm256_broadcastsi128_si256(_mm_or_si128(_mm_add_epi8(index, gap), behind));
 }
 
 template <bool kAdd>
-void put_lane(uint8_t* dst, __m128i samples) {
+OVRIN_ALWAYS_INLINE void put_lane(uint8_t* dst, __m128i samples) {
     auto* lane = reinterpret_cast<__m128i*>(dst);
     if (kAdd) samples = _mm_add_epi8(samples, _mm_loadu_si128(lane));
     _mm_storeu_si128(lane, samples);
 }
 
+// Lanes of so many bytes. Zeros follow a lane's samples up to 16 bytes.
 template <bool kAdd>
-void put_part(uint8_t* dst, __m128i samples, int32_t bytes) {
-    through_copy<kLane, kAdd>(dst, bytes, [&](uint8_t* copy) { put_lane<kAdd>(copy, samples); });
+OVRIN_ALWAYS_INLINE void put_lanes(uint8_t* dst, __m256i samples, int32_t lane_bytes) {
+    put_lane<kAdd>(dst, _mm256_castsi256_si128(samples));
+    put_lane<kAdd>(dst + lane_bytes, _mm256_extracti128_si256(samples, 1));
 }
 
-__m256i first_bytes_of_lanes(int32_t count) {
-    const __m128i index = _mm_setr_epi8(0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15);
-    return _mm256_broadcastsi128_si256(
-        _mm_cmplt_epi8(index, _mm_set1_epi8(static_cast<char>(count))));
+// Fetches the next rows, line by line in step with the windows, which may share lines.
+template <bool kPair>
+OVRIN_ALWAYS_INLINE int32_t fetch_until(const QuarterRows& rows, int32_t fetched, int32_t end) {
+    for (; fetched < end; fetched += kCacheLine) {
+        __builtin_prefetch(rows.next_top + fetched);
+        if (kPair) __builtin_prefetch(rows.next_bottom + fetched);
+    }
+    return fetched;
 }
 
-// Whole lanes are stored as long as they end inside the strip: what follows the samples of one is
+// Whole vectors are stored as long as they end inside the strip: what follows the samples of one is
 // stored by the next.
-template <int kWindows, bool kPair, bool kAdd>
+template <Reach kReach, bool kPair, bool kAdd>
 void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
     const QuarterRows rows = source;
-    const int32_t step = plan.vector_samples / 2 * plan.sample_bytes;
-    const __m256i kept = first_bytes_of_lanes(step);
-    const auto* entry = reinterpret_cast<const LanesEntry*>(plan.bytes);
+    const int32_t lane = plan.vector_samples / 2 * plan.sample_bytes;
+    const __m256i order = order_of_halves(lane / 2);
+    const auto* entry = reinterpret_cast<const WindowsEntry*>(plan.bytes);
+    int32_t fetched = entry->bases[0];
     int32_t rest = plan.samples * plan.sample_bytes;
     const auto next = [&]() __attribute__((always_inline)) {
-        __m256i samples = gather<kWindows, kPair>(rows, plan, *entry++);
-        return kAdd ? _mm256_and_si256(samples, kept) : samples;
+        const __m256i samples = gather<kReach, kPair>(rows, plan, *entry);
+        // Enlarging, rows come again.
+        if (kReach != Reach::kNear) {
+            const int32_t last_window = entry->bases[window_count(kReach) - 1];
+            fetched = fetch_until<kPair>(rows, fetched, last_window + kVector);
+        }
+        ++entry;
+        return kReach == Reach::kFar && lane < kLane ? _mm256_shuffle_epi8(samples, order)
+                                                     : samples;
     };
-    for (; rest >= step + kLane; rest -= 2 * step, dst += 2 * step) {
-        const __m256i samples = next();
-        put_lane<kAdd>(dst, _mm256_castsi256_si128(samples));
-        put_lane<kAdd>(dst + step, _mm256_extracti128_si256(samples, 1));
+    for (; rest >= lane + kLane; rest -= 2 * lane, dst += 2 * lane) {
+        put_lanes<kAdd>(dst, next(), lane);
     }
-    for (; rest > 0; rest -= 2 * step, dst += 2 * step) {
+    for (; rest > 0; rest -= 2 * lane, dst += 2 * lane) {
         const __m256i samples = next();
-        put_part<kAdd>(dst, _mm256_castsi256_si128(samples), rest < step ? rest : step);
-        if (rest <= step) break;
-        const int32_t high = rest - step;
-        put_part<kAdd>(dst + step, _mm256_extracti128_si256(samples, 1), high < step ? high : step);
+        through_copy<kVector, kAdd>(dst, rest < 2 * lane ? rest : 2 * lane,
+                                    [&](uint8_t* copy) { put_lanes<kAdd>(copy, samples, lane); });
     }
 }
 
-template <int kWindows>
-constexpr QuarterKernels quarter_kernels() {
-    return {run_windows<kWindows, true, false>, run_windows<kWindows, true, true>,
-            run_windows<kWindows, false, true>};
+template <Reach kReach>
+constexpr QuarterKernels kWindowKernels = {run_windows<kReach, true, false>,
+                                           run_windows<kReach, true, true>,
+                                           run_windows<kReach, false, true>};
+
+template <Reach kReach>
+const QuarterKernels& plan_windows(QuarterPlan& plan, const QuarterRowShape& shape,
+                                   QuarterColumns& columns, int32_t samples,
+                                   int32_t window_samples) {
+    plan.sample_bytes = shape.sample_bytes;
+    plan.vector_samples = window_samples * window_count(kReach);
+    plan.row_bytes = int64_t{shape.src_columns} * shape.sample_bytes;
+    plan_vectors<WindowsEntry>(
+        plan, shape, columns, samples, window_bytes(kReach),
+        mask_count(kReach) * static_cast<int32_t>(sizeof(Mask)),
+        [&](uint8_t* masks, WindowsEntry& entry, const Tap* taps, int32_t count) {
+            encode<kReach>(masks, entry, taps, count, plan);
+        });
+    return kWindowKernels<kReach>;
 }
 
-constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
-    quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>(),
-    quarter_kernels<5>(), quarter_kernels<6>(), quarter_kernels<7>(), quarter_kernels<8>()};
+bool fit_window(const QuarterRowShape& shape, int32_t samples, Reach reach) {
+    return windows_needed(shape, samples, window_bytes(reach), 1) == 1;
+}
 
 // From this reduction on, windows hold so few taps of samples of four bytes that these are loaded
 // one by one, with the scalar kernels' plan. Nothing is fetched for the next rows: so little lies
@@ -199,17 +271,18 @@ const QuarterKernels& plan_quarters_avx2(QuarterPlan& plan, const QuarterRowShap
         plan_quarters_scalar(plan, shape, columns, samples);
         return kWordKernels;
     }
-    const WindowShape lane = window_shape(shape, kLane, kMaxWindows);
-    if (lane.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
-    plan.sample_bytes = shape.sample_bytes;
-    plan.vector_samples = 2 * lane.samples;
-    plan.row_bytes = int64_t{shape.src_columns} * shape.sample_bytes;
-    plan_vectors<LanesEntry>(
-        plan, shape, columns, samples, lane.windows * kLane, mask_bytes(lane.windows),
-        [&](uint8_t* masks, LanesEntry& entry, const Tap* taps, int32_t count) {
-            encode(masks, entry, taps, count, plan, lane.windows);
-        });
-    return kQuarterKernels[lane.windows - 1];
+    const int32_t lane = kLane / shape.sample_bytes;
+    if (fit_window(shape, lane, Reach::kNear)) {
+        return plan_windows<Reach::kNear>(plan, shape, columns, samples, lane);
+    }
+    if (fit_window(shape, lane, Reach::kMiddle)) {
+        return plan_windows<Reach::kMiddle>(plan, shape, columns, samples, lane);
+    }
+    for (int32_t half = kLane / 2 / shape.sample_bytes; half > 0; --half) {
+        if (!fit_window(shape, half, Reach::kFar)) continue;
+        return plan_windows<Reach::kFar>(plan, shape, columns, samples, half);
+    }
+    return plan_quarters_scalar(plan, shape, columns, samples);
 }
 
 }  // namespace ovrin

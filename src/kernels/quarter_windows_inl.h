@@ -38,7 +38,8 @@ int32_t windows_needed(const QuarterRowShape& shape, int32_t samples, int32_t wi
 // As many samples in a vector as the windows allow: half and a quarter of a vector still beat
 // samples one by one. Of many samples only a multiple of four: simple ratios then repeat from
 // vector to vector.
-WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes, int32_t max_windows) {
+inline WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes,
+                                int32_t max_windows) {
     int32_t samples = vector_bytes / shape.sample_bytes;
     if (samples > 16) samples -= samples % 4;
     for (int32_t halvings = 0; halvings < 4 && samples > 1; ++halvings, samples /= 2) {
