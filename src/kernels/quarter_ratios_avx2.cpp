@@ -2,6 +2,9 @@
 // The simple ratios with AVX2, 32 destination bytes at a time.
 #include <immintrin.h>
 
+#include <type_traits>
+#include <utility>
+
 #include "kernels/quarter_averages_x86_inl.h"
 #include "kernels/quarter_ratios_inl.h"
 #include "kernels/sets.h"
@@ -129,59 +132,6 @@ struct FourToOne {
     }
 };
 
-// Every third sample from three vectors without a conflict: those of each lie where the others have
-// none, so that blends bring them together, and one shuffle brings them in order.
-template <int N>
-struct ThreeToOne {
-    static constexpr SimpleRatio kRatio = kThreeToOne;
-    static constexpr int32_t kSampleBytes = N;
-    static constexpr int32_t kDstBytes = 32;
-
-    template <bool kPair>
-    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
-        if (N == 4) {
-            const __m256i a = twice<kPair>(top, bottom, 0);
-            const __m256i b = twice<kPair>(top, bottom, 32);
-            const __m256i c = twice<kPair>(top, bottom, 64);
-            const __m256i left = _mm256_blend_epi32(_mm256_blend_epi32(a, b, 0x92), c, 0x24);
-            const __m256i right = _mm256_blend_epi32(_mm256_blend_epi32(b, c, 0x92), a, 0x24);
-            store_vector(
-                dst,
-                _mm256_avg_epu8(
-                    _mm256_permutevar8x32_epi32(left, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5)),
-                    _mm256_permutevar8x32_epi32(right, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7))));
-            return;
-        }
-        // Each lane makes 16 bytes of its own.
-        const __m256i a = twice<kPair>(top, bottom, 0, 48);
-        const __m256i b = twice<kPair>(top, bottom, 16, 64);
-        const __m256i c = twice<kPair>(top, bottom, 32, 80);
-        store_vector(dst, N == 1 ? bytes(a, b, c) : pairs(a, b, c));
-    }
-
-    static OVRIN_ALWAYS_INLINE __m256i bytes(__m256i a, __m256i b, __m256i c) {
-        const __m256i second = _mm256_broadcastsi128_si256(
-            _mm_setr_epi8(0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0));
-        const __m256i third = _mm256_broadcastsi128_si256(
-            _mm_setr_epi8(0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0, 0, -1, 0));
-        const __m256i left = _mm256_blendv_epi8(_mm256_blendv_epi8(a, c, second), b, third);
-        const __m256i right = _mm256_blendv_epi8(_mm256_blendv_epi8(c, b, second), a, third);
-        return _mm256_avg_epu8(shuffle_bytes(left, _mm_setr_epi8(0, 3, 6, 9, 12, 15, 2, 5, 8, 11,
-                                                                 14, 1, 4, 7, 10, 13)),
-                               shuffle_bytes(right, _mm_setr_epi8(2, 5, 8, 11, 14, 1, 4, 7, 10, 13,
-                                                                  0, 3, 6, 9, 12, 15)));
-    }
-
-    static OVRIN_ALWAYS_INLINE __m256i pairs(__m256i a, __m256i b, __m256i c) {
-        const __m256i left = _mm256_blend_epi16(_mm256_blend_epi16(a, b, 0x92), c, 0x24);
-        const __m256i right = _mm256_blend_epi16(_mm256_blend_epi16(b, c, 0x92), a, 0x24);
-        return _mm256_avg_epu8(shuffle_bytes(left, _mm_setr_epi8(0, 1, 6, 7, 12, 13, 2, 3, 8, 9, 14,
-                                                                 15, 4, 5, 10, 11)),
-                               shuffle_bytes(right, _mm_setr_epi8(4, 5, 10, 11, 0, 1, 6, 7, 12, 13,
-                                                                  2, 3, 8, 9, 14, 15)));
-    }
-};
-
 template <int N>
 struct ThreeToTwo {
     static constexpr SimpleRatio kRatio = kThreeToTwo;
@@ -214,13 +164,245 @@ struct ThreeToTwo {
     }
 };
 
+// Every third word from three vectors without a conflict: those of each lie where the others have
+// none, so that blends bring them together, and one shuffle brings them in order.
+struct ThreeToOneWords {
+    static constexpr SimpleRatio kRatio = kThreeToOne;
+    static constexpr int32_t kSampleBytes = 4;
+    static constexpr int32_t kDstBytes = 32;
+
+    template <bool kPair>
+    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
+        const __m256i a = twice<kPair>(top, bottom, 0);
+        const __m256i b = twice<kPair>(top, bottom, 32);
+        const __m256i c = twice<kPair>(top, bottom, 64);
+        const __m256i left = _mm256_blend_epi32(_mm256_blend_epi32(a, b, 0x92), c, 0x24);
+        const __m256i right = _mm256_blend_epi32(_mm256_blend_epi32(b, c, 0x92), a, 0x24);
+        store_vector(
+            dst,
+            _mm256_avg_epu8(
+                _mm256_permutevar8x32_epi32(left, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5)),
+                _mm256_permutevar8x32_epi32(right, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7))));
+    }
+};
+
+// 24 words of 16.
+struct TwoToThreeWords {
+    static constexpr SimpleRatio kRatio = kTwoToThree;
+    static constexpr int32_t kSampleBytes = 4;
+    static constexpr int32_t kDstBytes = 96;
+
+    template <bool kPair>
+    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
+        const __m256i first = twice<kPair>(top, bottom, 0);
+        const __m256i last = twice<kPair>(top, bottom, 32);
+        const __m256i middle = _mm256_permute2x128_si256(first, last, 0x21);
+        store_taps(dst, first, _mm256_setr_epi32(0, 0, 1, 2, 2, 3, 4, 4),
+                   _mm256_setr_epi32(0, 1, 1, 2, 3, 3, 4, 5));
+        store_taps(dst + 32, middle, _mm256_setr_epi32(1, 2, 2, 3, 4, 4, 5, 6),
+                   _mm256_setr_epi32(1, 2, 3, 3, 4, 5, 5, 6));
+        store_taps(dst + 64, last, _mm256_setr_epi32(2, 3, 4, 4, 5, 6, 6, 7),
+                   _mm256_setr_epi32(3, 3, 4, 5, 5, 6, 7, 7));
+    }
+
+    static OVRIN_ALWAYS_INLINE void store_taps(uint8_t* dst, __m256i words, __m256i left,
+                                               __m256i right) {
+        store_vector(dst, _mm256_avg_epu8(_mm256_permutevar8x32_epi32(words, left),
+                                          _mm256_permutevar8x32_epi32(words, right)));
+    }
+};
+
+// The other patterns gather the taps of each lane from a few windows of 16 source bytes. Windows
+// lie so that no two taps on the same side of their samples have the same place in different
+// windows: blends bring those of a side together, and one shuffle brings them in order. The
+// compiler works out which byte comes from which window.
+//
+// A shape says
+//
+//   kRatio, kSampleBytes
+//   kLaneSamples             the samples of a lane
+//   kBases[vector][lane][w]  where the windows begin that make so many vectors
+
+// How one side's taps get into a vector.
+template <int kWindows>
+struct Gathering {
+    alignas(32) uint8_t from[kWindows][32] = {};  // by place in a window: set where this one has it
+    alignas(32) uint8_t order[32] = {};
+    int32_t only = -1;  // the window that has all of them
+    bool fits = true;
+};
+
+// Notes the taps of a lane, at most one at a place.
+template <class Shape, int kWindows>
+constexpr void gather_lane(Gathering<kWindows>& gathering, const int32_t (&bases)[kWindows],
+                           int32_t first_byte, int32_t lane, bool right) {
+    bool is_taken[16] = {};
+    int32_t taken_by[16] = {};
+    for (int32_t i = 0; i < 16; ++i) {
+        const int32_t wanted =
+            i < Shape::kLaneSamples * Shape::kSampleBytes ? first_byte + i : first_byte;
+        const int32_t sample = wanted / Shape::kSampleBytes;
+        const Tap tap = Shape::kRatio.taps[sample % Shape::kRatio.dst];
+        const int32_t column =
+            sample / Shape::kRatio.dst * Shape::kRatio.src + (right ? tap.right : tap.left);
+        const int32_t byte = column * Shape::kSampleBytes + wanted % Shape::kSampleBytes;
+        bool is_found = false;
+        for (int32_t w = kWindows; !is_found && w-- > 0;) {
+            const int32_t place = byte - bases[w];
+            if (gathering.only >= 0 && w != gathering.only) continue;
+            if (place < 0 || place >= 16) continue;
+            if (is_taken[place] && taken_by[place] != byte) continue;
+            is_taken[place] = is_found = true;
+            taken_by[place] = byte;
+            gathering.from[w][16 * lane + place] = 0xFF;
+            gathering.order[16 * lane + i] = static_cast<uint8_t>(place);
+        }
+        if (!is_found) gathering.fits = false;
+    }
+}
+
+template <class Shape, int kWindows>
+constexpr Gathering<kWindows> gather_from(const int32_t (&bases)[2][kWindows], int32_t vector,
+                                          bool right, int32_t only) {
+    constexpr int32_t kLaneBytes = Shape::kLaneSamples * Shape::kSampleBytes;
+    Gathering<kWindows> gathering;
+    gathering.only = only;
+    for (int32_t lane = 0; lane < 2; ++lane) {
+        gather_lane<Shape>(gathering, bases[lane], (2 * vector + lane) * kLaneBytes, lane, right);
+    }
+    return gathering;
+}
+
+// By one window alone where one has all.
+template <class Shape, int kWindows>
+constexpr Gathering<kWindows> gathering_of(const int32_t (&bases)[2][kWindows], int32_t vector,
+                                           bool right) {
+    for (int32_t only = 0; only < kWindows; ++only) {
+        const Gathering<kWindows> gathering = gather_from<Shape>(bases, vector, right, only);
+        if (gathering.fits) return gathering;
+    }
+    return gather_from<Shape>(bases, vector, right, -1);
+}
+
+template <class Shape>
+struct Gathered {
+    static constexpr SimpleRatio kRatio = Shape::kRatio;
+    static constexpr int32_t kSampleBytes = Shape::kSampleBytes;
+    static constexpr int32_t kLaneBytes = Shape::kLaneSamples * kSampleBytes;
+    static constexpr int32_t kVectors = std::extent_v<decltype(Shape::kBases), 0>;
+    static constexpr int32_t kWindows = std::extent_v<decltype(Shape::kBases), 2>;
+    static constexpr int32_t kDstBytes = kVectors * 2 * kLaneBytes;
+
+    template <bool kPair>
+    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
+        store_vectors<kPair>(dst, top, bottom, std::make_integer_sequence<int32_t, kVectors>());
+    }
+
+    template <bool kPair, int32_t... kVector>
+    static OVRIN_ALWAYS_INLINE void store_vectors(uint8_t* dst, const uint8_t* top,
+                                                  const uint8_t* bottom,
+                                                  std::integer_sequence<int32_t, kVector...>) {
+        (store_one<kPair, kVector>(dst + kVector * 2 * kLaneBytes, top, bottom), ...);
+    }
+
+    template <bool kPair, int32_t kVector>
+    static OVRIN_ALWAYS_INLINE void store_one(uint8_t* dst, const uint8_t* top,
+                                              const uint8_t* bottom) {
+        constexpr auto& kBases = Shape::kBases[kVector];
+        __m256i windows[kWindows];
+        for (int32_t w = 0; w < kWindows; ++w) {
+            windows[w] = twice<kPair>(top, bottom, kBases[0][w], kBases[1][w]);
+        }
+        const __m256i samples =
+            _mm256_avg_epu8(gather<kVector, false>(windows), gather<kVector, true>(windows));
+        if (kLaneBytes == 16) return store_vector(dst, samples);
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), _mm256_castsi256_si128(samples));
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + kLaneBytes),
+                         _mm256_extracti128_si256(samples, 1));
+    }
+
+    template <int32_t kVector, bool kRight>
+    static OVRIN_ALWAYS_INLINE __m256i gather(const __m256i (&windows)[kWindows]) {
+        static constexpr Gathering<kWindows> kGathering =
+            gathering_of<Shape>(Shape::kBases[kVector], kVector, kRight);
+        static_assert(kGathering.fits);
+        __m256i taps = windows[kGathering.only < 0 ? 0 : kGathering.only];
+        for (int32_t w = 1; kGathering.only < 0 && w < kWindows; ++w) {
+            taps = _mm256_blendv_epi8(taps, windows[w], load_mask(kGathering.from[w]));
+        }
+        return _mm256_shuffle_epi8(taps, load_mask(kGathering.order));
+    }
+
+    static OVRIN_ALWAYS_INLINE __m256i load_mask(const uint8_t (&mask)[32]) {
+        return _mm256_load_si256(reinterpret_cast<const __m256i*>(mask));
+    }
+};
+
+template <class Shape>
+constexpr int32_t kOverrun<Gathered<Shape>> = 16 - Gathered<Shape>::kLaneBytes;
+
+template <int N>
+struct ThreeToOne {
+    static constexpr SimpleRatio kRatio = kThreeToOne;
+    static constexpr int32_t kSampleBytes = N;
+    static constexpr int32_t kLaneSamples = 16 / N;
+    static constexpr int32_t kBases[1][2][3] = {{{0, 16, 32}, {48, 64, 80}}};
+};
+
+template <int N>
+struct TwoToThree {
+    static constexpr SimpleRatio kRatio = kTwoToThree;
+    static constexpr int32_t kSampleBytes = N;
+    static constexpr int32_t kLaneSamples = 16 / N;
+    static constexpr int32_t kBases[3][2][1] = {{{0}, {10}}, {{20}, {32}}, {{42}, {48}}};
+};
+
+struct RgbTwoToOne {
+    static constexpr SimpleRatio kRatio = kTwoToOne;
+    static constexpr int32_t kSampleBytes = 3;
+    static constexpr int32_t kLaneSamples = 5;
+    static constexpr int32_t kBases[1][2][2] = {{{0, 15}, {29, 44}}};
+};
+
+struct RgbThreeToOne {
+    static constexpr SimpleRatio kRatio = kThreeToOne;
+    static constexpr int32_t kSampleBytes = 3;
+    static constexpr int32_t kLaneSamples = 5;
+    static constexpr int32_t kBases[1][2][3] = {{{0, 15, 30}, {44, 59, 74}}};
+};
+
+struct RgbFourToOne {
+    static constexpr SimpleRatio kRatio = kFourToOne;
+    static constexpr int32_t kSampleBytes = 3;
+    static constexpr int32_t kLaneSamples = 4;
+    static constexpr int32_t kBases[1][2][3] = {{{3, 19, 35}, {50, 65, 80}}};
+};
+
+struct RgbThreeToTwo {
+    static constexpr SimpleRatio kRatio = kThreeToTwo;
+    static constexpr int32_t kSampleBytes = 3;
+    static constexpr int32_t kLaneSamples = 4;
+    static constexpr int32_t kBases[1][2][2] = {{{0, 2}, {18, 20}}};
+};
+
+struct RgbTwoToThree {
+    static constexpr SimpleRatio kRatio = kTwoToThree;
+    static constexpr int32_t kSampleBytes = 3;
+    static constexpr int32_t kLaneSamples = 5;
+    static constexpr int32_t kBases[3][2][1] = {{{0}, {9}}, {{18}, {30}}, {{39}, {44}}};
+};
+
 }  // namespace
 
 const QuarterKernels* plan_simple_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
                                                 QuarterColumns& columns, int32_t samples) {
     return plan_patterns<TwoToOne<1>, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
-                         ThreeToTwo<4>, FourToOne<1>, FourToOne<2>, FourToOne<4>, ThreeToOne<1>,
-                         ThreeToOne<2>, ThreeToOne<4>>(plan, shape, columns, samples);
+                         ThreeToTwo<4>, FourToOne<1>, FourToOne<2>, FourToOne<4>,
+                         Gathered<ThreeToOne<1>>, Gathered<ThreeToOne<2>>, ThreeToOneWords,
+                         Gathered<TwoToThree<1>>, Gathered<TwoToThree<2>>, TwoToThreeWords,
+                         Gathered<RgbTwoToOne>, Gathered<RgbThreeToTwo>, Gathered<RgbFourToOne>,
+                         Gathered<RgbThreeToOne>, Gathered<RgbTwoToThree>>(plan, shape, columns,
+                                                                           samples);
 }
 
 }  // namespace ovrin

@@ -8,6 +8,8 @@
 //   kSampleBytes                     bytes of the samples that it is for
 //   kDstBytes                        what it makes at once: whole groups of kRatio.dst samples
 //   store<kPair>(dst, top, bottom)   makes them, of both rows or of the top one alone
+//
+// and says with kOverrun where that overwrites what follows.
 #pragma once
 
 #include <stddef.h>
@@ -68,37 +70,52 @@ OVRIN_ALWAYS_INLINE void fetch_next(const QuarterRows& rows, ptrdiff_t offset) {
     }
 }
 
-// Makes the pattern's vectors at dst; of those that are added, the first `done` bytes are there
-// already.
+// Bytes behind those that it makes which a pattern's store() may overwrite.
+template <class Pattern>
+constexpr int32_t kOverrun = 0;
+
+// Makes the pattern's bytes in a copy, and those from `done` on of what lies at dst.
 template <class Pattern, bool kPair, bool kAdd>
-OVRIN_ALWAYS_INLINE void make_vectors(uint8_t* dst, const QuarterRows& rows, ptrdiff_t offset,
-                                      ptrdiff_t done) {
-    const uint8_t* top = rows.top + offset;
-    const uint8_t* bottom = kPair ? rows.bottom + offset : top;
-    if (!kAdd) return Pattern::template store<kPair>(dst, top, bottom);
-    alignas(64) uint8_t sums[Pattern::kDstBytes];
-    Pattern::template store<kPair>(sums, top, bottom);
-    memset(sums, 0, static_cast<size_t>(done));
+OVRIN_ALWAYS_INLINE void make_through_copy(uint8_t* dst, const uint8_t* top, const uint8_t* bottom,
+                                           ptrdiff_t done) {
+    alignas(64) uint8_t copy[Pattern::kDstBytes + kOverrun<Pattern>];
+    Pattern::template store<kPair>(copy, top, bottom);
+    if (!kAdd) {
+        memcpy(dst + done, copy + done, static_cast<size_t>(Pattern::kDstBytes - done));
+        return;
+    }
+    memset(copy, 0, static_cast<size_t>(done));
     for (int32_t i = 0; i < Pattern::kDstBytes; ++i)
-        dst[i] = static_cast<uint8_t>(dst[i] + sums[i]);
+        dst[i] = static_cast<uint8_t>(dst[i] + copy[i]);
 }
 
 // The last vectors end where the strip ends, and share some bytes with those before them.
 template <class Pattern, bool kPair, bool kAdd>
 void run_pattern(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+    constexpr ptrdiff_t kStep = Pattern::kDstBytes;
     const QuarterRows rows = source;
     const ptrdiff_t bytes = ptrdiff_t{plan.samples} * Pattern::kSampleBytes;
-    const ptrdiff_t last = bytes - Pattern::kDstBytes;
-    ptrdiff_t offset = plan.first_byte;
+    const ptrdiff_t last = bytes - kStep;
+    const uint8_t* top = rows.top + plan.first_byte;
+    const uint8_t* bottom = kPair ? rows.bottom + plan.first_byte : top;
     ptrdiff_t done = 0;
-    for (; done <= last; done += Pattern::kDstBytes) {
-        fetch_next<Pattern, kPair>(rows, offset);
-        make_vectors<Pattern, kPair, kAdd>(dst + done, rows, offset, 0);
-        offset += src_bytes<Pattern>(Pattern::kDstBytes);
+    if (!kAdd) {
+        for (; done <= last - kOverrun<Pattern>; done += kStep) {
+            const ptrdiff_t offset = src_bytes<Pattern>(done);
+            fetch_next<Pattern, kPair>(rows, plan.first_byte + offset);
+            Pattern::template store<kPair>(dst + done, top + offset, bottom + offset);
+        }
+        if (done < bytes && kOverrun<Pattern> == 0) {
+            const ptrdiff_t offset = src_bytes<Pattern>(last);
+            return Pattern::template store<kPair>(dst + last, top + offset, bottom + offset);
+        }
     }
-    if (done == bytes) return;
-    make_vectors<Pattern, kPair, kAdd>(dst + last, rows, plan.first_byte + src_bytes<Pattern>(last),
-                                       done - last);
+    for (; done < bytes; done += kStep) {
+        const ptrdiff_t at = done < last ? done : last;
+        const ptrdiff_t offset = src_bytes<Pattern>(at);
+        fetch_next<Pattern, kPair>(rows, plan.first_byte + offset);
+        make_through_copy<Pattern, kPair, kAdd>(dst + at, top + offset, bottom + offset, done - at);
+    }
 }
 
 template <class Pattern>

@@ -122,12 +122,12 @@ struct SimpleRatio {
 
 std::vector<SimpleRatio> simple_ratios(const NamedKernels& set) {
     std::vector<SimpleRatio> all;
-    for (const int32_t n : {1, 2, 4}) {
-        for (const Ratio ratio : {Ratio{2, 1}, Ratio{3, 1}, Ratio{4, 1}, Ratio{3, 2}}) {
+    for (const int32_t n : {1, 2, 3, 4}) {
+        for (const Ratio ratio :
+             {Ratio{2, 1}, Ratio{3, 1}, Ratio{4, 1}, Ratio{3, 2}, Ratio{2, 3}}) {
             all.push_back({"avx2", n, ratio});
-            all.push_back({"neon", n, ratio});
+            if (n != 3) all.push_back({"neon", n, ratio});
         }
-        all.push_back({"neon", n, {2, 3}});
     }
     std::vector<SimpleRatio> of_set;
     std::copy_if(all.begin(), all.end(), std::back_inserter(of_set),
