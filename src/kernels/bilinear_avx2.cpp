@@ -48,6 +48,67 @@ void across(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
     }
 }
 
+// Pixels of four bytes that lie within eight source pixels: one permutation brings left and right
+// ones side by side, so that fixed shuffles do for the rest. Half the loads of windows for two.
+constexpr int32_t kGroupPixels = 4;
+constexpr int32_t kWindowPixels = 8;
+
+// The places of left and right pixels in a group's window, as a permutation wants them: those of
+// pixels 0 and 2 in the low lane, of 1 and 3 in the high one. False: the window does not reach.
+bool plan_group(BilinearPlan& plan, int32_t group, int64_t base) {
+    constexpr int32_t kFirst[kGroupPixels] = {0, 4, 2, 6};
+    const BilinearColumns& columns = *plan.columns;
+    int32_t places[kWindowPixels];
+    for (int32_t i = 0; i < kGroupPixels; ++i) {
+        const int32_t wanted = group * kGroupPixels + i;
+        const int32_t column = wanted < columns.count ? wanted : columns.count - 1;
+        const int64_t left = columns.index[column] - base;
+        if (left < 0 || left + columns.to_right >= kWindowPixels) return false;
+        places[kFirst[i]] = static_cast<int32_t>(left);
+        places[kFirst[i] + 1] = static_cast<int32_t>(left) + columns.to_right;
+        for (int32_t& pair : plan.weight_pairs[group * kGroupPixels + i]) {
+            pair = weight_pair(columns.weight[column]);
+        }
+    }
+    memcpy(plan.shuffles[group * 2], places, sizeof places);
+    plan.windows[group] = static_cast<int32_t>(base * 4);
+    return true;
+}
+
+bool plan_pixels(BilinearPlan& plan, const BilinearColumns& columns) {
+    plan.columns = &columns;
+    const WindowBases<4> windows(columns, columns.to_right, kWindowPixels * 4);
+    if (columns.sample_bytes != 4 || !windows.fit()) return false;
+    for (int32_t group = 0; group * kGroupPixels < columns.count; ++group) {
+        if (!plan_group(plan, group, windows.base(group * kGroupPixels) / 4)) return false;
+    }
+    return true;
+}
+
+// Left and right pixels as bytes side by side, widened, of the lanes' first or second one.
+OVRIN_ALWAYS_INLINE __m256i widen_pairs(__m256i pixels, int32_t first) {
+    const __m128i order = _mm_setr_epi8(0, -1, 4, -1, 1, -1, 5, -1, 2, -1, 6, -1, 3, -1, 7, -1);
+    const __m128i mine = _mm_adds_epu8(order, _mm_set1_epi8(static_cast<char>(first)));
+    return _mm256_shuffle_epi8(pixels, _mm256_broadcastsi128_si256(mine));
+}
+
+void across_pixels(BilinearSums& sums, const uint8_t* row, const BilinearPlan& plan) {
+    const int32_t count = plan.columns->count;
+    for (ptrdiff_t group = 0; group * kGroupPixels < count; ++group) {
+        const auto* window = reinterpret_cast<const __m256i*>(row + plan.windows[group]);
+        const auto* places = reinterpret_cast<const __m256i*>(plan.shuffles[group * 2]);
+        const auto* weights =
+            reinterpret_cast<const __m256i*>(plan.weight_pairs[group * kGroupPixels]);
+        auto* sum = reinterpret_cast<__m256i*>(sums.values + group * kGroupPixels * 4);
+        const __m256i pixels =
+            _mm256_permutevar8x32_epi32(_mm256_loadu_si256(window), _mm256_load_si256(places));
+        _mm256_store_si256(sum,
+                           _mm256_madd_epi16(widen_pairs(pixels, 0), _mm256_load_si256(weights)));
+        _mm256_store_si256(
+            sum + 1, _mm256_madd_epi16(widen_pairs(pixels, 8), _mm256_load_si256(weights + 1)));
+    }
+}
+
 // Eight destination bytes as 32-bit numbers: upper * (4096 - wy) + lower * wy with one
 // multiplication.
 __m256i blend_eight(const uint32_t* upper, const uint32_t* lower, __m256i wy) {
@@ -113,6 +174,7 @@ void copy_groups_of_8(uint8_t* dst, const uint8_t* row, const BilinearPlan& plan
 }  // namespace
 
 BilinearKernels plan_bilinear_avx2(BilinearPlan& plan, const BilinearColumns& columns) {
+    if (plan_pixels(plan, columns)) return {across_pixels, down};
     if (plan_quads(plan, columns, {16, 2, kStepQuads})) return {across<2>, down};
     if (plan_quads(plan, columns, {16, 1, kStepQuads})) return {across<1>, down};
     return {plan_bilinear_scalar(plan, columns).across, down};

@@ -51,45 +51,70 @@ struct WindowsEntry {
     }
 };
 
-struct Mask {
-    uint8_t lanes[2][kLane];
+constexpr uint8_t kNoByte = 0x80;  // a shuffle gives 0 for it
+
+// For every byte of a destination lane, the byte of its window that goes there.
+struct LaneOffsets {
+    alignas(kLane) uint8_t bytes[kLane + sizeof(uint32_t)];
+
+    LaneOffsets() { memset(bytes, kNoByte, sizeof bytes); }
+
+    // Samples go from `at` on; nothing goes behind them.
+    template <class FirstByte>
+    void put(int32_t at, int32_t samples, int32_t sample_bytes, const FirstByte& first_byte) {
+        uint8_t* end = bytes + at;
+        for (int32_t i = 0; i < samples; ++i, end += sample_bytes) put_bytes(end, first_byte(i));
+        memset(end, kNoByte, sizeof(uint32_t));
+    }
+
+    // As a mask for a lane that holds the window's bytes from `start` on. Adding 0x70 with
+    // saturation leaves the top bit clear for offsets 0 to 15 and sets it for all others.
+    void store(uint8_t* mask, int32_t start) const {
+        const __m128i offsets = _mm_load_si128(reinterpret_cast<const __m128i*>(bytes));
+        const __m128i inside = _mm_sub_epi8(offsets, _mm_set1_epi8(static_cast<char>(start)));
+        _mm_store_si128(reinterpret_cast<__m128i*>(mask),
+                        _mm_adds_epu8(inside, _mm_set1_epi8(0x70)));
+    }
 };
 
-// Notes that the bytes of a sample from `at` on come from those of the window from `offset` on.
-void put_tap(uint8_t* low_lane, uint8_t* high_lane, int32_t at, int32_t offset, int32_t bytes) {
-    for (int32_t c = 0; c < bytes; ++c, ++offset) {
-        uint8_t* lane = offset < kLane ? low_lane : high_lane;
-        lane[at + c] = static_cast<uint8_t>(offset % kLane);
-    }
-}
-
 template <Reach kReach>
-void encode(uint8_t* storage, WindowsEntry& entry, const Tap* taps, int32_t count,
+void encode(uint8_t* masks, WindowsEntry& entry, const Tap* taps, int32_t count,
             const QuarterPlan& plan) {
     const int32_t n = plan.sample_bytes;
     const int32_t window_samples = plan.vector_samples / window_count(kReach);
     const int32_t last_base = static_cast<int32_t>(plan.row_bytes) - window_bytes(kReach);
-    auto* masks = reinterpret_cast<Mask*>(storage);
-    memset(masks, 0x80, sizeof(Mask) * mask_count(kReach));  // a shuffle gives 0 for it
-    for (int32_t w = 0; w < window_count(kReach); ++w) {
-        const int32_t begin = w * window_samples;
-        // A window without samples lies where the last one begins.
-        const int32_t first = taps[begin < count ? begin : count - 1].left * n;
-        entry.bases[w] = first < last_base ? first : last_base;
-        for (int32_t i = 0; i < window_samples && begin + i < count; ++i) {
-            const int32_t left = n * taps[begin + i].left - entry.bases[w];
-            const int32_t right = n * taps[begin + i].right - entry.bases[w];
-            if (kReach == Reach::kNear) {
-                put_tap(masks[0].lanes[w], nullptr, n * i, left, n);
-                put_tap(masks[1].lanes[w], nullptr, n * i, right, n);
-            } else if (kReach == Reach::kMiddle) {
-                put_tap(masks[2 * w].lanes[0], masks[2 * w].lanes[1], n * i, left, n);
-                put_tap(masks[2 * w + 1].lanes[0], masks[2 * w + 1].lanes[1], n * i, right, n);
-            } else {
-                put_tap(masks[w].lanes[0], masks[w].lanes[1], n * i, left, n);
-                put_tap(masks[w].lanes[0], masks[w].lanes[1], kLane / 2 + n * i, right, n);
-            }
+    for (int32_t w = 0; w < window_count(kReach); ++w, taps += window_samples) {
+        const int32_t left = count - w * window_samples;
+        const int32_t samples = left < window_samples ? (left > 0 ? left : 0) : window_samples;
+        // A window without samples lies where the one before does.
+        if (samples > 0) {
+            const int32_t first = n * taps[0].left;
+            entry.bases[w] = first < last_base ? first : last_base;
+        } else {
+            entry.bases[w] = entry.bases[w - 1];
         }
+        const int32_t base = entry.bases[w];
+        const auto left_byte = [&](int32_t i) { return n * taps[i].left - base; };
+        const auto right_byte = [&](int32_t i) { return n * taps[i].right - base; };
+        LaneOffsets lefts;
+        lefts.put(0, samples, n, left_byte);
+        if (kReach == Reach::kFar) {
+            lefts.put(kLane / 2, samples, n, right_byte);
+            lefts.store(masks + w * kVector, 0);
+            lefts.store(masks + w * kVector + kLane, kLane);
+            continue;
+        }
+        LaneOffsets rights;
+        rights.put(0, samples, n, right_byte);
+        if (kReach == Reach::kNear) {
+            lefts.store(masks + w * kLane, 0);
+            rights.store(masks + kVector + w * kLane, 0);
+            continue;
+        }
+        lefts.store(masks + 2 * w * kVector, 0);
+        lefts.store(masks + 2 * w * kVector + kLane, kLane);
+        rights.store(masks + (2 * w + 1) * kVector, 0);
+        rights.store(masks + (2 * w + 1) * kVector + kLane, kLane);
     }
 }
 
@@ -166,7 +191,8 @@ OVRIN_ALWAYS_INLINE void put_lanes(uint8_t* dst, __m256i samples, int32_t lane_b
 
 // Fetches the next rows, line by line in step with the windows, which may share lines.
 template <bool kPair>
-OVRIN_ALWAYS_INLINE int32_t fetch_until(const QuarterRows& rows, int32_t fetched, int32_t end) {
+OVRIN_ALWAYS_INLINE ptrdiff_t fetch_until(const QuarterRows& rows, ptrdiff_t fetched,
+                                          ptrdiff_t end) {
     for (; fetched < end; fetched += kCacheLine) {
         __builtin_prefetch(rows.next_top + fetched);
         if (kPair) __builtin_prefetch(rows.next_bottom + fetched);
@@ -182,13 +208,13 @@ void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& pla
     const int32_t lane = plan.vector_samples / 2 * plan.sample_bytes;
     const __m256i order = order_of_halves(lane / 2);
     const auto* entry = reinterpret_cast<const WindowsEntry*>(plan.bytes);
-    int32_t fetched = entry->bases[0];
+    ptrdiff_t fetched = entry->bases[0];
     int32_t rest = plan.samples * plan.sample_bytes;
     const auto next = [&]() __attribute__((always_inline)) {
         const __m256i samples = gather<kReach, kPair>(rows, plan, *entry);
         // Enlarging, rows come again.
         if (kReach != Reach::kNear) {
-            const int32_t last_window = entry->bases[window_count(kReach) - 1];
+            const ptrdiff_t last_window = entry->bases[window_count(kReach) - 1];
             fetched = fetch_until<kPair>(rows, fetched, last_window + kVector);
         }
         ++entry;
@@ -218,8 +244,7 @@ const QuarterKernels& plan_windows(QuarterPlan& plan, const QuarterRowShape& sha
     plan.vector_samples = window_samples * window_count(kReach);
     plan.row_bytes = int64_t{shape.src_columns} * shape.sample_bytes;
     plan_vectors<WindowsEntry>(
-        plan, shape, columns, samples, window_bytes(kReach),
-        mask_count(kReach) * static_cast<int32_t>(sizeof(Mask)),
+        plan, shape, columns, samples, window_bytes(kReach), mask_count(kReach) * kVector,
         [&](uint8_t* masks, WindowsEntry& entry, const Tap* taps, int32_t count) {
             encode<kReach>(masks, entry, taps, count, plan);
         });

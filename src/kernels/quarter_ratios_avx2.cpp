@@ -311,7 +311,9 @@ struct Gathered {
         constexpr auto& kBases = Shape::kBases[kVector];
         __m256i windows[kWindows];
         for (int32_t w = 0; w < kWindows; ++w) {
-            windows[w] = twice<kPair>(top, bottom, kBases[0][w], kBases[1][w]);
+            const bool is_one = kBases[1][w] == kBases[0][w] + 16;
+            windows[w] = is_one ? twice<kPair>(top, bottom, kBases[0][w])
+                                : twice<kPair>(top, bottom, kBases[0][w], kBases[1][w]);
         }
         const __m256i samples =
             _mm256_avg_epu8(gather<kVector, false>(windows), gather<kVector, true>(windows));
@@ -382,7 +384,7 @@ struct RgbThreeToTwo {
     static constexpr SimpleRatio kRatio = kThreeToTwo;
     static constexpr int32_t kSampleBytes = 3;
     static constexpr int32_t kLaneSamples = 4;
-    static constexpr int32_t kBases[1][2][2] = {{{0, 2}, {18, 20}}};
+    static constexpr int32_t kBases[1][2][2] = {{{0, 4}, {16, 20}}};
 };
 
 struct RgbTwoToThree {

@@ -100,10 +100,10 @@ void run_pattern(uint8_t* dst, const QuarterRows& source, const QuarterPlan& pla
     const uint8_t* bottom = kPair ? rows.bottom + plan.first_byte : top;
     ptrdiff_t done = 0;
     if (!kAdd) {
-        for (; done <= last - kOverrun<Pattern>; done += kStep) {
-            const ptrdiff_t offset = src_bytes<Pattern>(done);
+        for (ptrdiff_t offset = 0; done <= last - kOverrun<Pattern>; done += kStep) {
             fetch_next<Pattern, kPair>(rows, plan.first_byte + offset);
             Pattern::template store<kPair>(dst + done, top + offset, bottom + offset);
+            offset += src_bytes<Pattern>(kStep);
         }
         if (done < bytes && kOverrun<Pattern> == 0) {
             const ptrdiff_t offset = src_bytes<Pattern>(last);
