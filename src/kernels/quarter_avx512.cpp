@@ -107,6 +107,10 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
 
 const QuarterKernels& plan_quarters_avx512(QuarterPlan& plan, const QuarterRowShape& shape,
                                            QuarterColumns& columns, int32_t samples) {
+    if (shape.sample_bytes == 4) {
+        const QuarterKernels* simple = plan_simple_quarters_avx2(plan, shape, columns, samples);
+        if (simple != nullptr) return *simple;
+    }
     const WindowShape vector = window_shape(shape, kVector, kMaxWindows);
     // Rows too short for these windows may have room for shorter ones.
     if (vector.windows == 0) return plan_quarters_avx2(plan, shape, columns, samples);

@@ -140,14 +140,6 @@ struct ThreeToTwo {
 
     template <bool kPair>
     static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
-        if (N == 4) {
-            // Words 0 to 3 and 2 to 5 of either lane's six.
-            const __m256i a = twice<kPair>(top, bottom, 0, 24);
-            const __m256i b = twice<kPair>(top, bottom, 8, 32);
-            store_vector(dst,
-                         _mm256_avg_epu8(shuffle_words<0x94>(a, b), shuffle_words<0xE9>(a, b)));
-            return;
-        }
         const __m256i a = reduce(twice<kPair>(top, bottom, 0), 0);
         const __m256i b = reduce(twice<kPair>(top, bottom, 16), 2);
         store_vector(dst, order_two(_mm256_packus_epi16(a, b)));
@@ -183,6 +175,26 @@ struct ThreeToOneWords {
             _mm256_avg_epu8(
                 _mm256_permutevar8x32_epi32(left, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5)),
                 _mm256_permutevar8x32_epi32(right, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7))));
+    }
+};
+
+// Likewise, of two vectors that share four words.
+struct ThreeToTwoWords {
+    static constexpr SimpleRatio kRatio = kThreeToTwo;
+    static constexpr int32_t kSampleBytes = 4;
+    static constexpr int32_t kDstBytes = 32;
+
+    template <bool kPair>
+    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
+        const __m256i a = twice<kPair>(top, bottom, 0);
+        const __m256i b = twice<kPair>(top, bottom, 16);
+        const __m256i left = _mm256_blend_epi32(a, b, 0x64);
+        const __m256i right = _mm256_blend_epi32(a, b, 0xD9);
+        store_vector(
+            dst,
+            _mm256_avg_epu8(
+                _mm256_permutevar8x32_epi32(left, _mm256_setr_epi32(0, 1, 3, 4, 2, 7, 5, 6)),
+                _mm256_permutevar8x32_epi32(right, _mm256_setr_epi32(1, 2, 0, 5, 3, 4, 6, 7))));
     }
 };
 
@@ -399,7 +411,7 @@ struct RgbTwoToThree {
 const QuarterKernels* plan_simple_quarters_avx2(QuarterPlan& plan, const QuarterRowShape& shape,
                                                 QuarterColumns& columns, int32_t samples) {
     return plan_patterns<TwoToOne<1>, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
-                         ThreeToTwo<4>, FourToOne<1>, FourToOne<2>, FourToOne<4>,
+                         ThreeToTwoWords, FourToOne<1>, FourToOne<2>, FourToOne<4>,
                          Gathered<ThreeToOne<1>>, Gathered<ThreeToOne<2>>, ThreeToOneWords,
                          Gathered<TwoToThree<1>>, Gathered<TwoToThree<2>>, TwoToThreeWords,
                          Gathered<RgbTwoToOne>, Gathered<RgbThreeToTwo>, Gathered<RgbFourToOne>,
