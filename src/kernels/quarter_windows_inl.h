@@ -63,8 +63,8 @@ void put_bytes(uint8_t* offsets, int32_t first) {
     memcpy(offsets, &bytes, sizeof bytes);
 }
 
-void locate_taps(WindowTaps& window, const Tap* taps, int32_t count, const QuarterPlan& plan,
-                 int32_t span) {
+inline void locate_taps(WindowTaps& window, const Tap* taps, int32_t count, const QuarterPlan& plan,
+                        int32_t span) {
     const int32_t n = plan.sample_bytes;
     const int32_t first = n * taps[0].left;
     const int32_t last_base = static_cast<int32_t>(plan.row_bytes) - span;
