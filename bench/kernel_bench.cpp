@@ -53,7 +53,7 @@ std::string shape_of(int32_t bytes, const char* unit, const Ratio& ratio) {
 }
 
 std::vector<uint8_t> noise(size_t bytes) {
-    std::minstd_rand random(1);
+    std::minstd_rand random(1);  // NOLINT(cert-msc32-c,cert-msc51-cpp): the same each time
     std::vector<uint8_t> result(bytes);
     for (uint8_t& byte : result) byte = static_cast<uint8_t>(random() >> 8);
     return result;
@@ -72,8 +72,8 @@ Planned plan_quarter(const Kernels& set, int32_t bytes, const Ratio& ratio,
                      ovrin::QuarterKernel* ovrin::QuarterKernels::*which) {
     const int32_t source = ratio.source_of(kQuarterSamples);
     auto run = std::make_shared<QuarterRun>();
-    run->top = run->bottom = noise(static_cast<size_t>(source * bytes));
-    run->dst.resize(static_cast<size_t>(kQuarterSamples * bytes));
+    run->top = run->bottom = noise(static_cast<size_t>(source) * static_cast<size_t>(bytes));
+    run->dst.resize(static_cast<size_t>(kQuarterSamples) * static_cast<size_t>(bytes));
     ovrin::QuarterColumns columns = {{ovrin::quarter_point(source), source, kQuarterSamples},
                                      {ovrin::three_quarter_point(source), source, kQuarterSamples}};
     const ovrin::QuarterRowShape shape = {bytes, source, kQuarterSamples};
@@ -110,9 +110,9 @@ void add_quarter_cases(std::vector<KernelCase>& cases) {
 // ---- Bilinear ----
 
 struct BilinearRun {
-    ovrin::BilinearColumns columns;
     ovrin::BilinearPlan plan;
     ovrin::BilinearSums sums[2];
+    ovrin::BilinearColumns columns;
     std::vector<uint8_t> row, dst;
 };
 
@@ -129,8 +129,9 @@ std::shared_ptr<BilinearRun> bilinear_run(int32_t bytes, const Ratio& ratio) {
     for (ovrin::BilinearSums& sums : run->sums) {
         for (uint32_t& value : sums.values) value = 100 * ovrin::kBilinearOne;
     }
-    run->row = noise(static_cast<size_t>((ratio.source_of(columns.count) + 2) * bytes));
-    run->dst.resize(static_cast<size_t>(columns.count * bytes));
+    run->row =
+        noise(static_cast<size_t>(ratio.source_of(columns.count) + 2) * static_cast<size_t>(bytes));
+    run->dst.resize(static_cast<size_t>(columns.count) * static_cast<size_t>(bytes));
     return run;
 }
 
@@ -285,6 +286,7 @@ int rows_per_sample(const Planned& planned, double least) {
 // Seconds per row: the median over rounds, in each of which every set is sampled once.
 std::vector<double> measure_sets(const std::vector<Planned>& sets, const Effort& effort) {
     std::vector<int> rows;
+    rows.reserve(sets.size());
     for (const Planned& planned : sets) {
         rows.push_back(rows_per_sample(planned, effort.least_seconds));
     }
@@ -295,6 +297,7 @@ std::vector<double> measure_sets(const std::vector<Planned>& sets, const Effort&
         }
     }
     std::vector<double> medians;
+    medians.reserve(samples.size());
     for (const Samples& set : samples) medians.push_back(quartiles(set).median);
     return medians;
 }
@@ -311,6 +314,7 @@ std::vector<KernelCase> all_kernel_cases() {
 void print_case(Table& table, const KernelCase& test, const NamedKernels* sets, int32_t count,
                 const Effort& effort) {
     std::vector<Planned> planned;
+    planned.reserve(static_cast<size_t>(count));
     for (int32_t i = 0; i < count; ++i) planned.push_back(test.plan(*sets[i].kernels));
     const std::vector<double> seconds = measure_sets(planned, effort);
     std::vector<std::string> cells = {test.kernel, test.shape};

@@ -82,7 +82,10 @@ void begin_run() {
 Sets::Sets() {
     count = ovrin::available_kernels(sets);
     const char* most = std::getenv("OVRIN_FUZZ_SETS");
-    if (most != nullptr) count = std::clamp(std::atoi(most), 1, count);
+    if (most != nullptr) {
+        const long wanted = std::strtol(most, nullptr, 10);
+        count = static_cast<int32_t>(std::clamp<long>(wanted, 1, count));
+    }
 }
 
 const Sets& all_sets() {

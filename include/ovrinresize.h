@@ -17,6 +17,9 @@
  *  - Band records come from a walk that starts at the first band, as "Bands" below says; other
  *    values are not checked. The source height, and band_rows, each times the destination height,
  *    fit 32 bits.
+ *  - Floating-point numbers are rounded to the nearest, and their exceptions are not trapped, as
+ *    threads start out. In another rounding mode the bilinear and the Lanczos engine give other
+ *    bytes. Flushing to zero and the precision of the x87 make no difference.
  *  - No byte outside the pictures is read or written. Buffers need no alignment beyond that of
  *    their type.
  */
