@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# test.sh BUILD: tests the wheel in the folder BUILD, installed where nothing else of ours is; then the
-# module compiled with sanitizers.
+# test.sh BUILD: tests the wheel in the folder BUILD, installed where nothing else of ours is, and the
+# example that runs on a cluster; then the module compiled with sanitizers.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 build=$(cd "$1" && pwd)
@@ -43,11 +43,15 @@ check_types() {
     PYTHONPATH=$(echo "$build"/venv/lib/python3*/site-packages) stubtest ovrinresize._native
     mypy --cache-dir="$build/mypy" --strict --python-executable "$build/venv/bin/python" \
         "$here/tests/typed_program.py"
+    # Pillow and tqdm have no types.
+    (cd "$here/../../examples/batch" && mypy --cache-dir="$build/mypy" --strict --ignore-missing-imports \
+        --allow-untyped-calls \
+        --python-executable "$build/venv/bin/python" thumbnails.py measure.py)
 }
 
-# run_tests PYTHON
+# run_tests PYTHON [FOLDER]
 run_tests() {
-    (cd "$here/tests" && "$1" -m pytest -q --rootdir="$here" --durations=5)
+    (cd "${2:-$here/tests}" && "$1" -m pytest -q -c "$here/pyproject.toml" --rootdir="$PWD" --durations=5 .)
 }
 
 # The sanitizer's library must come first, before that of Python; what Python never frees is no leak.
@@ -66,4 +70,5 @@ install_wheel
 check_files
 check_types
 run_tests "$build/venv/bin/python"
+run_tests "$build/venv/bin/python" "$here/../../examples/batch"
 run_sanitized_tests
