@@ -13,13 +13,13 @@ set -euo pipefail
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 
 fuzzers=(packed canvas planar semi_planar nearest bilinear bilinear_bands lanczos lanczos_bands
-    walkers tasks drivers pool)
+    walkers tasks drivers pool cpp)
 readers=(png jpeg pnm y4m exif icc geometry template)
 # Runs of a quick check: about as long for each but those with threads, or a tenth of that under
 # sanitizers.
 declare -A quick=([packed]=100000 [canvas]=100000 [planar]=80000 [semi_planar]=100000
     [nearest]=150000 [bilinear]=40000 [bilinear_bands]=50000 [lanczos]=1000 [lanczos_bands]=150000
-    [walkers]=40000 [tasks]=100000 [drivers]=500 [pool]=40000 [png]=60000 [jpeg]=60000
+    [walkers]=40000 [tasks]=100000 [drivers]=500 [pool]=40000 [cpp]=40000 [png]=60000 [jpeg]=60000
     [pnm]=100000 [y4m]=100000 [exif]=100000 [icc]=2000 [geometry]=200000 [template]=200000)
 # Bytes of their longest inputs, where the usual ones are too short for a file.
 declare -A longest=([png]=512 [jpeg]=1024 [pnm]=128 [y4m]=256 [exif]=512 [icc]=512)

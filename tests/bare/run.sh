@@ -2,7 +2,7 @@
 # SPDX-License-Identifier: Apache-2.0
 # run.sh FOLDER PACKAGES: what users do, in a Debian 12 that has nothing but its base. The system is made
 # in FOLDER/root, which takes root's rights and a network, with the apt sources of this one. PACKAGES
-# holds our Debian packages: they are installed, used, and purged.
+# holds our Debian packages: they are installed, used, and purged. Then docs/first-programs.md is followed.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 folder=$1
@@ -49,3 +49,9 @@ rm -rf "$root/root/packages/"{root,_CPack_Packages}
 mkdir "$root/root/consumer"
 cp "$here/../package/consumer/consumer.c" "$here/packages.sh" "$root/root/consumer"
 inside "bash consumer/packages.sh packages"
+
+mkdir "$root/root/libovrinresize"
+git -C "$here/../.." ls-files -z | (cd "$here/../.." && xargs -0 tar -cf -) | tar -xf - -C "$root/root/libovrinresize"
+awk -f "$here/guide.awk" "$here/../../docs/first-programs.md" >"$root/root/guide.sh"
+inside "bash -e guide.sh"
+echo "The guide's programs print what it says"
