@@ -172,6 +172,12 @@ TEST(QuarterFaults, DriversMakeThreadsForTwoBandsOrMore) {
     };
     const Source two(9, 64), one(9, 47);  // bands of 32 rows, the nearest whole number of them
     const auto target = on_canvas(8, 32);
+    uint32_t pixels[8 * 32];
+    const auto run_packed = [&](const Source& source) {
+        ovrin_resize_rgba8888_tps(source.bytes.data(), pixels, source.w, source.h, 8, 32);
+    };
+    EXPECT_EQ(threads([&] { run_packed(two); }), 4);
+    EXPECT_EQ(threads([&] { run_packed(one); }), 0);
     EXPECT_EQ(threads([&] { run_rgba(two, target, true); }), 4);
     EXPECT_EQ(threads([&] { run_yuv420(two, 8, 32, true); }), 4);
     EXPECT_EQ(threads([&] { run_nv21(two, 8, 32, true); }), 4);
