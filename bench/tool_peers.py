@@ -61,6 +61,8 @@ def album_commands(tool, folder):
         "vipsthumbnail, two side by side": ["sh", "-c", f"{halves} {' '.join(vips)}", "sh", *album],
         "mogrify": [*mogrify, *album],
         "mogrify, jpeg:size": ["mogrify", "-define", "jpeg:size=400x300", *mogrify[1:], *album],
+        "mogrify, jpeg:size, two side by side": [
+            "sh", "-c", f"{halves} mogrify -define jpeg:size=400x300 {' '.join(mogrify[1:])}", "sh", *album],
         "ffmpeg": ["ffmpeg", "-v", "error", "-y", "-i", f"{folder}/album/%03d.jpg", "-vf", "scale=200:-1",
                    "-q:v", "3", f"{folder}/ffmpeg/%03d.jpg"],
     }
@@ -121,7 +123,7 @@ def print_table(log):
             runs.setdefault((task, name), []).append((float(seconds), float(megabytes)))
     for (task, name), values in sorted(runs.items(), key=lambda item: list(TASKS).index(item[0][0])):
         seconds = [value[0] for value in values]
-        print(f"{task:<6} {name:<32} {statistics.median(seconds):8.3f} s   "
+        print(f"{task:<6} {name:<37} {statistics.median(seconds):8.3f} s   "
               f"({min(seconds):.3f} to {max(seconds):.3f}, {len(seconds)} runs) "
               f"{max(value[1] for value in values):7.0f} MB")
 
