@@ -57,11 +57,13 @@ std::string channels_of(const Picture& frame, FileKind kind) {
 
 Info look_at(const std::string& file, const std::optional<RawLayout>& raw) {
     const auto source = open_source(file, raw);
-    const Metadata& metadata = source->metadata();
-    Info info = {file, source->kind(), source->size(), orientation_of(metadata), metadata, "", 0};
+    Info info = {file, source->kind(), source->size(), orientation_of(source->metadata()), {}, "",
+                 0};
     Picture frame;
     for (; source->next(&frame); ++info.frames) info.channels = channels_of(frame, info.kind);
     if (info.frames == 0) throw Error("holds no frame");
+    // Not all of it is known before.
+    info.metadata = source->metadata();
     return info;
 }
 
