@@ -7,6 +7,8 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
+#include <memory>
+#include <optional>
 
 #include "metadata.h"
 #include "picture.h"
@@ -18,9 +20,42 @@ Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata);
 void encode_png(const Picture& picture, const Metadata& metadata, FILE* out);
 
 bool is_jpeg(const uint8_t* data, size_t size);
-// A file that ends early gives a picture all the same; the metadata says so.
+
+// How to decode a picture.
+struct Decoding {
+    bool in_planes = false;  // as the file holds them, otherwise RGBA
+    // 1, 2, 4 or 8: each sample is about the mean of so many in both directions; what an uneven
+    // size leaves at the right and at the bottom is left out.
+    int32_t reduction = 1;
+};
+
+// A JPEG whose header has been read.
+class JpegReader {
+public:
+    explicit JpegReader(Bytes file);
+    ~JpegReader();
+
+    Size size() const { return size_; }
+    const Metadata& metadata() const { return metadata_; }
+
+    // The format of the picture in planes; nothing where there is none for it.
+    std::optional<PixelFormat> planes(int32_t reduction) const;
+
+    // Once. A file that ends early gives a picture all the same; the metadata says so then.
+    Picture read(const Decoding& decoding);
+
+private:
+    struct Decoder;
+
+    Bytes file_;
+    std::unique_ptr<Decoder> decoder_;
+    Size size_;
+    Metadata metadata_;
+};
+
 Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata);
-// quality: 1 to 100. Alpha is dropped.
+// A picture in I420 or gray is written without a trip through RGB. quality: 1 to 100. Alpha is
+// dropped.
 void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out);
 
 // PBM, PGM, PPM (P1 to P6) and PAM (P7), which hold no metadata. Of several pictures the first.

@@ -226,6 +226,10 @@ void keep_to_calling_thread() {
     may_start_threads = false;
 }
 
+int32_t threads_of_picture() {
+    return may_start_threads ? int32_t{kThreadsOfPicture} : 1;
+}
+
 int white_of(Engine engine) {
     return engine == Engine::kQuarter ? 252 : 255;
 }

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: Apache-2.0
-// The library's resamplers by name, and one made of them. All calls of the library are here.
+// The library's resamplers by name, and one made of them. All calls of the library are here and in
+// lanczos.h.
 #pragma once
 
 #include <string>
@@ -32,6 +33,9 @@ void keep_to_calling_thread();
 
 // Threads that work while the library resizes one picture: its own four, and the calling one.
 constexpr int64_t kThreadsOfPicture = 5;
+
+// That, or 1 where they keep to the calling one.
+int32_t threads_of_picture();
 
 // What the engine makes of white and of full alpha, 255.
 int white_of(Engine engine);

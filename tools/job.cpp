@@ -92,6 +92,66 @@ FileKind kind_of_out(const Options& options, const Source& source) {
     return kind;
 }
 
+// How much of a picture's detail its decoder may leave out: no more than the first halvings of the
+// thumbnail engine would.
+int32_t reduction_for(const Source& source, Engine engine, Size picture) {
+    constexpr int32_t kMost = 8;
+    int32_t reduction = 1;
+    if (engine != Engine::kThumbnail || !source.is_reducible()) return reduction;
+    for (int32_t n = 2; n <= kMost; n *= 2) {
+        const Size size = {source.size().width / n, source.size().height / n};
+        const bool is_all = size.width == picture.width && size.height == picture.height;
+        const bool is_left_to_halve =
+            size.width / 2 >= picture.width && size.height / 2 >= picture.height;
+        if (is_all || is_left_to_halve) reduction = n;
+    }
+    return reduction;
+}
+
+bool has_whole_chroma(PixelFormat format, Size size) {
+    const Plane chroma = planes_of(format, size).back();
+    return size.width % chroma.across == 0 && size.height % chroma.down == 0;
+}
+
+// The format of the result where the planes of a file are resized one by one and written as they
+// are; nothing where the way leads through RGB. Planes of pictures with odd sides would not lie
+// exactly on each other.
+std::optional<PixelFormat> format_in_planes(const Options& options, const Source& source,
+                                            const Resizing& how, int32_t reduction, FileKind out,
+                                            const Metadata& metadata) {
+    const std::optional<PixelFormat> planes = source.planes(reduction);
+    const bool is_jpeg = out.container == Container::kJpeg;
+    if (!planes || (!is_jpeg && !is_420(out.format))) return {};
+    if (how.engine != Engine::kThumbnail && how.engine != Engine::kLanczos) return {};
+    if (how.placement.on_canvas && options.background) return {};
+    if (!options.yuv.is_that_of_jpeg()) return {};
+
+    const bool stays_gray = *planes == PixelFormat::kGray && is_jpeg && fits_gray(metadata);
+    const PixelFormat format = stays_gray ? PixelFormat::kGray : PixelFormat::kI420;
+    const Size reduced = {source.size().width / reduction, source.size().height / reduction};
+    const Placement& placement = how.placement;
+    const bool is_even = has_whole_chroma(*planes, reduced) &&
+                         has_whole_chroma(format, placement.picture) &&
+                         has_whole_chroma(format, placement.result) &&
+                         has_whole_chroma(format, {placement.x, placement.y});
+    if (!is_even) return {};
+    return format;
+}
+
+// Lets the source decode no more than is needed.
+void choose_decoding(const Options& options, const Metadata& metadata, Source* source,
+                     Resizing* how, FileKind* out) {
+    const Placement stored = stored_placement(how->placement, how->orientation);
+    const int32_t reduction = reduction_for(*source, how->engine, stored.picture);
+    const std::optional<PixelFormat> format =
+        format_in_planes(options, *source, *how, reduction, *out, metadata);
+    source->decode_as({format.has_value(), reduction});
+    if (!format) return;
+    how->format = *format;
+    how->fills_alpha = false;
+    if (out->container == Container::kJpeg) out->format = *format;
+}
+
 void judge_damage(const Options& options, const std::string& damage) {
     if (damage.empty()) return;
     if (options.strict) throw Error(options.in + ": " + damage);
@@ -103,13 +163,11 @@ void judge_damage(const Options& options, const std::string& damage) {
 void run(const Options& options) {
     const auto source =
         concerning(options.in, [&] { return open_source(options.in, raw_layout(options)); });
-    judge_damage(options, source->metadata().damage);
     if (!options.quiet && !source->remark().empty()) {
         say((options.in + ": " + source->remark()).c_str());
     }
     const PixelFormat format = source->kind().format;
-    const FileKind out_kind =
-        concerning(options.out, [&] { return kind_of_out(options, *source); });
+    FileKind out_kind = concerning(options.out, [&] { return kind_of_out(options, *source); });
     const PixelFormat format_of_result = result_format(format, out_kind);
     const Orientation orientation =
         options.rotate ? orientation_of(source->metadata()) : Orientation::kUpright;
@@ -117,17 +175,19 @@ void run(const Options& options) {
     const Placement placement = place(options.wish, upright, format_of_result);
     const Engine engine = engine_for(options, *source, upright, placement.picture);
     check_engine(engine, format);
-    const Resizing how = {engine,
-                          placement,
-                          format_of_result,
-                          orientation,
-                          background_of(options, out_kind),
-                          canvas_of(options, format),
-                          options.premultiply,
-                          is_image_file(source->kind())};
+    Resizing how = {engine,
+                    placement,
+                    format_of_result,
+                    orientation,
+                    background_of(options, out_kind),
+                    canvas_of(options, format),
+                    options.premultiply,
+                    is_image_file(source->kind())};
+    const SinkSettings settings = settings_of(options, *source, placement);
+    choose_decoding(options, settings.metadata, source.get(), &how, &out_kind);
 
     OutputFile file(options.out);
-    Sink sink(out_kind, settings_of(options, *source, placement), file.stream());
+    Sink sink(out_kind, settings, file.stream());
     Picture frame;
     Picture result;
     Stopwatch resizing;
@@ -137,6 +197,7 @@ void run(const Options& options) {
         const auto next = [&] { return source->next(&frame); };
         for (int64_t number = 1; number <= options.frames.last && concerning(options.in, next);
              ++number) {
+            judge_damage(options, source->metadata().damage);
             if (number < options.frames.first) continue;
             concerning(options.in, [&] { resizing.time([&] { resize(how, &frame, &result); }); });
             concerning(options.out, [&] { sink.write(result); });
@@ -148,8 +209,8 @@ void run(const Options& options) {
                     (options.frames.first > 1 ? ": holds no such frame" : ": holds no frame"));
     }
     file.commit();
-    const Report report = {options.in, options.out, format, upright,
-                           placement,  engine,      frames, resizing.milliseconds()};
+    const Report report = {options.in, options.out, how.format, upright,
+                           placement,  engine,      frames,     resizing.milliseconds()};
     if (options.verbose) std::cerr << in_words(report);
     if (options.json) std::cout << as_json(report);
 }

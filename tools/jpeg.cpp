@@ -2,10 +2,13 @@
 // JPEG by libjpeg-turbo. The library reports errors by a callback that must not return, so each
 // group of its calls stands in a function of its own that setjmp guards. Those functions hold plain
 // data only: a long jump runs no destructors.
+#include <algorithm>
+#include <array>
 #include <csetjmp>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <utility>
 // jpeglib.h needs size_t and FILE from the headers above.
 #include <jerror.h>
 #include <jpeglib.h>
@@ -76,14 +79,14 @@ jpeg_error_mgr* init_errors(ErrorState* state) {
     return &state->manager;
 }
 
-struct Decoder {
-    Decoder() : codec() { codec.err = init_errors(&errors); }
-    ~Decoder() {
+struct Decompressor {
+    Decompressor() : codec() { codec.err = init_errors(&errors); }
+    ~Decompressor() {
         jpeg_destroy_decompress(&codec);
         free(icc);
     }
-    Decoder(const Decoder&) = delete;
-    Decoder& operator=(const Decoder&) = delete;
+    Decompressor(const Decompressor&) = delete;
+    Decompressor& operator=(const Decompressor&) = delete;
 
     jpeg_decompress_struct codec;
     JOCTET* icc = nullptr;
@@ -101,7 +104,11 @@ struct Encoder {
     ErrorState errors;
 };
 
-bool read_header(Decoder* decoder, const uint8_t* data, size_t size) {
+Error error(const char* what, const ErrorState& state) {
+    return Error(std::string(what) + ": " + state.message);
+}
+
+bool read_header(Decompressor* decoder, const uint8_t* data, size_t size) {
     if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
     jpeg_decompress_struct* const codec = &decoder->codec;
     jpeg_create_decompress(codec);
@@ -113,7 +120,7 @@ bool read_header(Decoder* decoder, const uint8_t* data, size_t size) {
     return true;
 }
 
-Bytes read_exif(const Decoder& decoder) {
+Bytes read_exif(const Decompressor& decoder) {
     for (auto marker = decoder.codec.marker_list; marker != nullptr; marker = marker->next) {
         if (marker->marker == kExifMarker && marker->data_length > kExifHeadBytes &&
             memcmp(marker->data, kExifHead, kExifHeadBytes) == 0) {
@@ -135,10 +142,15 @@ std::optional<Density> read_density(const jpeg_decompress_struct& codec) {
     return Density{false, x, y};
 }
 
-Metadata read_metadata(const Decoder& decoder) {
+bool is_cmyk(const jpeg_decompress_struct& codec) {
+    return codec.jpeg_color_space == JCS_CMYK || codec.jpeg_color_space == JCS_YCCK;
+}
+
+Metadata read_metadata(const Decompressor& decoder) {
     Metadata metadata;
     metadata.exif = read_exif(decoder);
-    metadata.icc = Bytes(decoder.icc, decoder.icc + decoder.icc_bytes);
+    // One for inks fits no result.
+    if (!is_cmyk(decoder.codec)) metadata.icc = Bytes(decoder.icc, decoder.icc + decoder.icc_bytes);
     metadata.density = read_density(decoder.codec);
     if (!metadata.exif.empty() && metadata.icc.empty() && exif_claims_srgb(metadata.exif)) {
         metadata.srgb_intent = 0;
@@ -146,18 +158,144 @@ Metadata read_metadata(const Decoder& decoder) {
     return metadata;
 }
 
-bool read_rows(Decoder* decoder, uint8_t* rgba) {
+// ---- Reading ----
+
+bool start(Decompressor* decoder, const Decoding& decoding) {
     if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
     jpeg_decompress_struct* const codec = &decoder->codec;
-    codec->out_color_space = JCS_EXT_RGBA;
+    codec->scale_num = 1;
+    codec->scale_denom = static_cast<unsigned>(decoding.reduction);
+    if (decoding.in_planes) {
+        codec->raw_data_out = TRUE;
+        codec->do_fancy_upsampling = FALSE;
+        codec->out_color_space = codec->jpeg_color_space;
+    } else {
+        codec->out_color_space = is_cmyk(*codec) ? JCS_CMYK : JCS_EXT_RGBA;
+    }
     jpeg_start_decompress(codec);
+    return true;
+}
+
+// Four bytes a pixel. spare: room for one of the codec's rows, which may be longer and more.
+bool read_rows(Decompressor* decoder, Size size, uint8_t* pixels, uint8_t* spare) {
+    if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
+    jpeg_decompress_struct* const codec = &decoder->codec;
+    const size_t row_bytes = static_cast<size_t>(size.width) * 4;
+    const auto rows = static_cast<JDIMENSION>(size.height);
+    const bool fits = codec->output_width == static_cast<JDIMENSION>(size.width);
     while (codec->output_scanline < codec->output_height) {
-        JSAMPROW row = rgba + size_t{codec->output_scanline} * codec->output_width * 4;
+        const JDIMENSION y = codec->output_scanline;
+        uint8_t* const to = pixels + y * row_bytes;
+        JSAMPROW row = fits && y < rows ? to : spare;
         jpeg_read_scanlines(codec, &row, 1);
+        if (!fits && y < rows) memcpy(to, spare, row_bytes);
     }
     jpeg_finish_decompress(codec);
     return true;
 }
+
+// Ink covers what is behind it. Programs that leave Adobe's marker store paper as 255, others as 0.
+void cmyk_to_rgba(Picture* picture, bool is_inverted) {
+    uint8_t* const end = picture->bytes() + picture->byte_count();
+    for (uint8_t* pixel = picture->bytes(); pixel != end; pixel += 4) {
+        const auto paper = [&](int i) { return is_inverted ? pixel[i] : 255 - pixel[i]; };
+        const int black = paper(3);
+        for (int i = 0; i < 3; ++i) {
+            pixel[i] = static_cast<uint8_t>((paper(i) * black + 127) / 255);
+        }
+        pixel[3] = 255;
+    }
+}
+
+// ---- Planes ----
+
+constexpr int kMostRows = 2 * DCTSIZE;
+
+// What the library reads or writes at once: a few rows of each plane, in whole blocks.
+struct Strip {
+    // the_rows: of the first plane. the_widths: of each, in samples.
+    Strip(const std::vector<Plane>& planes, int32_t the_rows,
+          const std::array<size_t, 3>& the_widths)
+        : rows(the_rows), widths(the_widths) {
+        size_t bytes = 0;
+        for (size_t i = 0; i < planes.size(); ++i) {
+            bytes += widths[i] * static_cast<size_t>(rows / planes[i].down);
+        }
+        samples.resize(bytes);
+        uint8_t* at = samples.data();
+        for (size_t i = 0; i < planes.size(); ++i) {
+            for (int y = 0; y < rows / planes[i].down; ++y, at += widths[i]) lines[i][y] = at;
+            arrays[i] = lines[i];
+        }
+    }
+
+    int32_t rows;
+    std::array<size_t, 3> widths;
+    Bytes samples;
+    JSAMPROW lines[3][kMostRows] = {};
+    JSAMPARRAY arrays[3] = {};
+};
+
+// The layout of the planes; nothing where ours are others.
+std::optional<PixelFormat> planes_of(const jpeg_decompress_struct& codec, int32_t reduction) {
+    const auto has_sampling = [&](int i, int across, int down) {
+        return codec.comp_info[i].h_samp_factor == across &&
+               codec.comp_info[i].v_samp_factor == down;
+    };
+    const bool has_square_luma = has_sampling(0, 1, 1) || has_sampling(0, 2, 2);
+    if (!has_square_luma && !has_sampling(0, 2, 1)) return {};
+    if (codec.jpeg_color_space == JCS_GRAYSCALE) return PixelFormat::kGray;
+    if (codec.jpeg_color_space != JCS_YCbCr || !has_sampling(1, 1, 1) || !has_sampling(2, 1, 1)) {
+        return {};
+    }
+    if (!has_square_luma) return PixelFormat::kI422;
+    // The codec reduces chroma by as much less as it has been before.
+    const bool is_full = has_sampling(0, 1, 1) || reduction > 1;
+    return is_full ? PixelFormat::kI444 : PixelFormat::kI420;
+}
+
+Strip strip_for(const jpeg_decompress_struct& codec, const std::vector<Plane>& planes,
+                int32_t reduction) {
+    const int block = DCTSIZE / reduction;
+    std::array<size_t, 3> widths = {};
+    for (size_t i = 0; i < planes.size(); ++i) {
+        const jpeg_component_info& component = codec.comp_info[i];
+        const int samples =
+            codec.max_h_samp_factor * block / (component.h_samp_factor * planes[i].across);
+        widths[i] = size_t{component.width_in_blocks} * static_cast<size_t>(samples);
+    }
+    return Strip(planes, codec.max_v_samp_factor * block, widths);
+}
+
+// Copies what of the strip's rows lies in the picture; `top`: of its first plane.
+void take_strip(const Strip& strip, const Plane* planes, size_t count, int32_t top,
+                uint8_t* picture) {
+    for (size_t i = 0; i < count; ++i) {
+        const Plane& plane = planes[i];
+        const auto width = static_cast<size_t>(plane.size.width);
+        const int32_t first = top / plane.down;
+        const int32_t rows = std::min(strip.rows / plane.down, plane.size.height - first);
+        for (int32_t y = 0; y < rows; ++y) {
+            memcpy(picture + plane.offset + static_cast<size_t>(first + y) * width,
+                   strip.lines[i][y], width);
+        }
+    }
+}
+
+bool read_planes(Decompressor* decoder, Strip* strip, const Plane* planes, size_t count,
+                 uint8_t* picture) {
+    if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
+    jpeg_decompress_struct* const codec = &decoder->codec;
+    while (codec->output_scanline < codec->output_height) {
+        const auto top = static_cast<int32_t>(codec->output_scanline);
+        jpeg_read_raw_data(codec, strip->arrays, static_cast<JDIMENSION>(strip->rows));
+        take_strip(*strip, planes, count, top, picture);
+    }
+    jpeg_finish_decompress(codec);
+    return true;
+}
+
+// ---- Writing ----
 
 void set_density(jpeg_compress_struct* codec, const Density& density) {
     const double unit = density.is_absolute ? kInchesPerMeter : 1;
@@ -184,43 +322,93 @@ struct Encoding {
     const Picture& picture;
     const Metadata& metadata;
     int quality;
-    uint8_t* gray_row;  // room for one; null where colours are written
+    bool is_gray;
+    uint8_t* gray_row;    // of a gray RGBA picture: room for one
+    Strip* strip;         // of planes
+    const Plane* planes;  // of planes
+    size_t plane_count;
 };
 
 JSAMPROW row_of(const Encoding& encoding, size_t y) {
     const auto width = static_cast<size_t>(encoding.picture.size.width);
     const uint8_t* const rgba = encoding.picture.bytes() + y * width * 4;
     // The library's type lacks const; it does not write to rows given to it.
-    if (encoding.gray_row == nullptr) return const_cast<uint8_t*>(rgba);
+    if (!encoding.is_gray) return const_cast<uint8_t*>(rgba);
     for (size_t x = 0; x < width; ++x) encoding.gray_row[x] = rgba[4 * x];
     return encoding.gray_row;
+}
+
+// Blocks that the picture does not fill repeat its last samples.
+void fill_strip(const Encoding& encoding, int32_t top) {
+    const Strip& strip = *encoding.strip;
+    for (size_t i = 0; i < encoding.plane_count; ++i) {
+        const Plane& plane = encoding.planes[i];
+        const auto width = static_cast<size_t>(plane.size.width);
+        for (int32_t y = 0; y < strip.rows / plane.down; ++y) {
+            const int32_t from = std::min(top / plane.down + y, plane.size.height - 1);
+            uint8_t* const to = strip.lines[i][y];
+            memcpy(to, encoding.picture.bytes() + plane.offset + static_cast<size_t>(from) * width,
+                   width);
+            memset(to + width, to[width - 1], strip.widths[i] - width);
+        }
+    }
+}
+
+void write_pixels(jpeg_compress_struct* codec, const Encoding& encoding) {
+    while (codec->next_scanline < codec->image_height) {
+        if (encoding.strip != nullptr) {
+            fill_strip(encoding, static_cast<int32_t>(codec->next_scanline));
+            jpeg_write_raw_data(codec, encoding.strip->arrays,
+                                static_cast<JDIMENSION>(encoding.strip->rows));
+        } else {
+            JSAMPROW row = row_of(encoding, codec->next_scanline);
+            jpeg_write_scanlines(codec, &row, 1);
+        }
+    }
 }
 
 bool write_picture(Encoder* encoder, const Encoding& encoding, FILE* out) {
     if (setjmp(encoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
     jpeg_compress_struct* const codec = &encoder->codec;
-    const bool is_gray = encoding.gray_row != nullptr;
+    const bool has_planes = encoding.strip != nullptr;
     jpeg_create_compress(codec);
     jpeg_stdio_dest(codec, out);
     codec->image_width = static_cast<JDIMENSION>(encoding.picture.size.width);
     codec->image_height = static_cast<JDIMENSION>(encoding.picture.size.height);
-    codec->input_components = is_gray ? 1 : 4;
-    codec->in_color_space = is_gray ? JCS_GRAYSCALE : JCS_EXT_RGBX;
-    jpeg_set_defaults(codec);
+    if (encoding.is_gray) {
+        codec->input_components = 1;
+        codec->in_color_space = JCS_GRAYSCALE;
+    } else {
+        codec->input_components = has_planes ? 3 : 4;
+        codec->in_color_space = has_planes ? JCS_YCbCr : JCS_EXT_RGBX;
+    }
+    jpeg_set_defaults(codec);  // 4:2:0
     jpeg_set_quality(codec, encoding.quality, TRUE);
+    codec->raw_data_in = has_planes ? TRUE : FALSE;
     if (encoding.metadata.density) set_density(codec, *encoding.metadata.density);
     jpeg_start_compress(codec, TRUE);
     write_metadata(codec, encoding.picture, encoding.metadata);
-    while (codec->next_scanline < codec->image_height) {
-        JSAMPROW row = row_of(encoding, codec->next_scanline);
-        jpeg_write_scanlines(codec, &row, 1);
-    }
+    write_pixels(codec, encoding);
     jpeg_finish_compress(codec);
     return true;
 }
 
-Error error(const char* what, const ErrorState& state) {
-    return Error(std::string(what) + ": " + state.message);
+void encode(const Encoding& encoding, FILE* out) {
+    Encoder encoder;
+    if (!write_picture(&encoder, encoding, out)) throw error("cannot write JPEG", encoder.errors);
+}
+
+void encode_planes(const Picture& picture, const Metadata& metadata, int quality, FILE* out) {
+    const std::vector<Plane> planes = tool::planes_of(picture.format, picture.size);
+    const bool is_gray = picture.format == PixelFormat::kGray;
+    std::array<size_t, 3> widths = {};
+    for (size_t i = 0; i < planes.size(); ++i) {
+        const auto width = static_cast<size_t>(planes[i].size.width);
+        widths[i] = (width + DCTSIZE - 1) / DCTSIZE * DCTSIZE;
+    }
+    Strip strip(planes, is_gray ? DCTSIZE : 2 * DCTSIZE, widths);
+    encode({picture, metadata, quality, is_gray, nullptr, &strip, planes.data(), planes.size()},
+           out);
 }
 
 }  // namespace
@@ -229,29 +417,63 @@ bool is_jpeg(const uint8_t* data, size_t size) {
     return size >= 3 && data[0] == 0xFF && data[1] == 0xD8 && data[2] == 0xFF;
 }
 
+struct JpegReader::Decoder : Decompressor {};
+
+JpegReader::JpegReader(Bytes file)
+    : file_(std::move(file)), decoder_(std::make_unique<Decoder>()), size_() {
+    if (!read_header(decoder_.get(), file_.data(), file_.size())) {
+        throw error("damaged JPEG", decoder_->errors);
+    }
+    const jpeg_decompress_struct& codec = decoder_->codec;
+    size_ = checked_size(codec.image_width, codec.image_height);
+    metadata_ = read_metadata(*decoder_);
+}
+
+JpegReader::~JpegReader() = default;
+
+std::optional<PixelFormat> JpegReader::planes(int32_t reduction) const {
+    return planes_of(decoder_->codec, reduction);
+}
+
+Picture JpegReader::read(const Decoding& decoding) {
+    const jpeg_decompress_struct& codec = decoder_->codec;
+    const PixelFormat format =
+        decoding.in_planes ? planes(decoding.reduction).value() : PixelFormat::kRgba;
+    Picture picture({size_.width / decoding.reduction, size_.height / decoding.reduction}, format);
+    picture.is_gray = codec.jpeg_color_space == JCS_GRAYSCALE;
+    bool is_read = start(decoder_.get(), decoding);
+    if (is_read && decoding.in_planes) {
+        const std::vector<Plane> planes = tool::planes_of(format, picture.size);
+        Strip strip = strip_for(codec, planes, decoding.reduction);
+        is_read =
+            read_planes(decoder_.get(), &strip, planes.data(), planes.size(), picture.bytes());
+    } else if (is_read) {
+        Bytes spare(size_t{codec.output_width} * 4);
+        is_read = read_rows(decoder_.get(), picture.size, picture.bytes(), spare.data());
+        if (is_cmyk(codec)) cmyk_to_rgba(&picture, codec.saw_Adobe_marker != FALSE);
+    }
+    const int lost = decoder_->errors.lost;
+    if (!is_read || (lost != 0 && lost != JWRN_JPEG_EOF)) {
+        throw error("damaged JPEG", decoder_->errors);
+    }
+    if (lost == JWRN_JPEG_EOF) metadata_.damage = "the JPEG ends early, and the rest is made up";
+    return picture;
+}
+
 Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata) {
-    Decoder decoder;
-    if (!read_header(&decoder, data, size)) throw error("damaged JPEG", decoder.errors);
-    const J_COLOR_SPACE colors = decoder.codec.jpeg_color_space;
-    if (colors == JCS_CMYK || colors == JCS_YCCK) throw Error("CMYK JPEG is not supported");
-    Picture picture(checked_size(decoder.codec.image_width, decoder.codec.image_height));
-    picture.is_gray = colors == JCS_GRAYSCALE;
-    *metadata = read_metadata(decoder);
-    const bool is_read = read_rows(&decoder, picture.bytes());
-    const int lost = decoder.errors.lost;
-    if (!is_read || (lost != 0 && lost != JWRN_JPEG_EOF))
-        throw error("damaged JPEG", decoder.errors);
-    if (lost == JWRN_JPEG_EOF) metadata->damage = "the JPEG ends early, and the rest is made up";
+    JpegReader reader(Bytes(data, data + size));
+    Picture picture = reader.read({});
+    *metadata = reader.metadata();
     return picture;
 }
 
 void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out) {
-    Encoder encoder;
-    Bytes gray_row;
-    if (is_gray_file(picture, metadata)) gray_row.resize(static_cast<size_t>(picture.size.width));
-    const Encoding encoding = {picture, metadata, quality,
-                               gray_row.empty() ? nullptr : gray_row.data()};
-    if (!write_picture(&encoder, encoding, out)) throw error("cannot write JPEG", encoder.errors);
+    if (picture.format != PixelFormat::kRgba) {
+        return encode_planes(picture, metadata, quality, out);
+    }
+    const bool is_gray = is_gray_file(picture, metadata);
+    Bytes gray_row(is_gray ? static_cast<size_t>(picture.size.width) : 0);
+    encode({picture, metadata, quality, is_gray, gray_row.data(), nullptr, nullptr, 0}, out);
 }
 
 }  // namespace tool

@@ -32,8 +32,12 @@ Orientation orientation_of(const Metadata& metadata) {
     return value >= 1 && value <= 8 ? static_cast<Orientation>(value) : Orientation::kUpright;
 }
 
+bool fits_gray(const Metadata& metadata) {
+    return metadata.icc.empty() || is_gray_profile(metadata.icc);
+}
+
 bool is_gray_file(const Picture& picture, const Metadata& metadata) {
-    return picture.is_gray && (metadata.icc.empty() || is_gray_profile(metadata.icc));
+    return picture.is_gray && fits_gray(metadata);
 }
 
 bool has_fitting_profile(const Picture& picture, const Metadata& metadata) {

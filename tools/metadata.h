@@ -44,7 +44,10 @@ Metadata resized_metadata(const Metadata& source, Size size, bool is_turned);
 // Of the picture as it is stored; kUpright where nothing or nonsense is said.
 Orientation orientation_of(const Metadata& metadata);
 
-// Whether a picture is to be written as a grey one. Profiles for colours fit no grey file.
+// Whether a file of greys can say this. Profiles for colours fit no grey file.
+bool fits_gray(const Metadata& metadata);
+
+// Whether a picture is to be written as a grey one.
 bool is_gray_file(const Picture& picture, const Metadata& metadata);
 
 // Whether there is a profile that fits the picture: one for greys does not fit colours.

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <utility>
+#include <vector>
 
 namespace tool {
 
@@ -36,6 +37,36 @@ Steps steps_of(Orientation orientation) {
     return {};
 }
 
+template <class Sample>
+void turn(const Sample* stored, Size size, Steps steps, Sample* upright) {
+    // From one upright sample to the one right of it or below, in the stored picture.
+    const ptrdiff_t width = size.width;
+    const ptrdiff_t height = size.height;
+    const ptrdiff_t stored_right = steps.flips_x ? -1 : 1;
+    const ptrdiff_t stored_down = steps.flips_y ? -width : width;
+    const ptrdiff_t right = steps.swaps ? stored_down : stored_right;
+    const ptrdiff_t down = steps.swaps ? stored_right : stored_down;
+    const ptrdiff_t first =
+        (steps.flips_x ? width - 1 : 0) + (steps.flips_y ? (height - 1) * width : 0);
+
+    // In squares, whose stored rows stay in the cache while they are read as columns.
+    constexpr ptrdiff_t kSquare = 32;
+    const Sample* const from = stored + first;
+    const ptrdiff_t columns = steps.swaps ? height : width;
+    const ptrdiff_t rows = steps.swaps ? width : height;
+    for (ptrdiff_t top = 0; top < rows; top += kSquare) {
+        for (ptrdiff_t left = 0; left < columns; left += kSquare) {
+            const ptrdiff_t bottom = std::min(top + kSquare, rows);
+            const ptrdiff_t end = std::min(left + kSquare, columns);
+            for (ptrdiff_t y = top; y < bottom; ++y) {
+                for (ptrdiff_t x = left; x < end; ++x) {
+                    upright[y * columns + x] = from[x * right + y * down];
+                }
+            }
+        }
+    }
+}
+
 }  // namespace
 
 bool lies_on_its_side(Orientation orientation) {
@@ -48,36 +79,18 @@ Size turned(Size size, Orientation orientation) {
 }
 
 Picture turned(const Picture& stored, Orientation orientation) {
-    const Steps steps = steps_of(orientation);
-    Picture upright(turned(stored.size, orientation));
+    Picture upright(turned(stored.size, orientation), stored.format);
     upright.has_alpha = stored.has_alpha;
     upright.is_gray = stored.is_gray;
-
-    // From one upright pixel to the one right of it or below, in the stored picture.
-    const ptrdiff_t width = stored.size.width;
-    const ptrdiff_t height = stored.size.height;
-    const ptrdiff_t stored_right = steps.flips_x ? -1 : 1;
-    const ptrdiff_t stored_down = steps.flips_y ? -width : width;
-    const ptrdiff_t right = steps.swaps ? stored_down : stored_right;
-    const ptrdiff_t down = steps.swaps ? stored_right : stored_down;
-    const ptrdiff_t first =
-        (steps.flips_x ? width - 1 : 0) + (steps.flips_y ? (height - 1) * width : 0);
-
-    // In squares, whose stored rows stay in the cache while they are read as columns.
-    constexpr int32_t kSquare = 32;
-    const uint32_t* const from = stored.words.data() + first;
-    uint32_t* const to = upright.words.data();
-    const auto [columns, rows] = upright.size;
-    for (int32_t top = 0; top < rows; top += kSquare) {
-        for (int32_t left = 0; left < columns; left += kSquare) {
-            const int32_t bottom = std::min(top + kSquare, rows);
-            const int32_t end = std::min(left + kSquare, columns);
-            for (int32_t y = top; y < bottom; ++y) {
-                for (int32_t x = left; x < end; ++x) {
-                    to[ptrdiff_t{y} * columns + x] = from[x * right + y * down];
-                }
-            }
-        }
+    const Steps steps = steps_of(orientation);
+    if (stored.format == PixelFormat::kRgba) {
+        turn(stored.words.data(), stored.size, steps, upright.words.data());
+        return upright;
+    }
+    const std::vector<Plane> from = planes_of(stored.format, stored.size);
+    const std::vector<Plane> to = planes_of(upright.format, upright.size);
+    for (size_t i = 0; i < from.size(); ++i) {
+        turn(stored.bytes() + from[i].offset, from[i].size, steps, upright.bytes() + to[i].offset);
     }
     return upright;
 }

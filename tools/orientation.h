@@ -26,7 +26,8 @@ bool lies_on_its_side(Orientation orientation);
 // The upright picture's size from the stored one's, and the other way round.
 Size turned(Size size, Orientation orientation);
 
-// The stored picture set upright. RGBA.
+// The stored picture set upright. RGBA, or planes that as well cover it with its sides swapped:
+// 4:2:0 (I420), 4:4:4 or gray.
 Picture turned(const Picture& stored, Orientation orientation);
 
 // Where the stored picture goes on a stored canvas, so that both turned are as `upright` says.

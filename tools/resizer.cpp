@@ -31,7 +31,9 @@ void resize_and_place(const Resizing& resizing, const Placement& placement, Pict
 
 // Turns the smaller of the two, and drops what is no longer needed: memory for two is enough.
 void resize_and_turn(const Resizing& resizing, Picture* frame, Picture* result) {
-    if (frame->size.pixels() < resizing.placement.result.pixels()) {
+    // Planes of another format than the result's may not fit the turned picture.
+    if (frame->format == resizing.format &&
+        frame->size.pixels() < resizing.placement.result.pixels()) {
         *frame = turned(*frame, resizing.orientation);
         return resize_and_place(resizing, resizing.placement, frame, result);
     }

@@ -40,6 +40,34 @@ private:
     std::optional<Picture> picture_;
 };
 
+class Jpeg : public Source {
+public:
+    explicit Jpeg(Input input)
+        : Source(std::move(input), {Container::kJpeg, PixelFormat::kRgba}),
+          reader_(std::make_unique<JpegReader>(input_.read_all())) {
+        size_ = reader_->size();
+        metadata_ = reader_->metadata();
+    }
+
+    std::optional<PixelFormat> planes(int32_t reduction) const override {
+        return reader_->planes(reduction);
+    }
+    bool is_reducible() const override { return true; }
+    void decode_as(const Decoding& decoding) override { decoding_ = decoding; }
+
+    bool next(Picture* frame) override {
+        if (reader_ == nullptr) return false;
+        *frame = reader_->read(decoding_);
+        metadata_.damage = reader_->metadata().damage;
+        reader_.reset();
+        return true;
+    }
+
+private:
+    std::unique_ptr<JpegReader> reader_;
+    Decoding decoding_;
+};
+
 class Raw : public Source {
 public:
     Raw(Input input, const RawLayout& layout)
@@ -121,8 +149,7 @@ std::unique_ptr<Source> open_source(const std::string& path, const std::optional
     const std::vector<uint8_t> head = input.peek(kPeekBytes);
     const auto is = [&head](auto recognise) { return recognise(head.data(), head.size()); };
     if (is(is_png)) return std::make_unique<Still>(std::move(input), Container::kPng, decode_png);
-    if (is(is_jpeg))
-        return std::make_unique<Still>(std::move(input), Container::kJpeg, decode_jpeg);
+    if (is(is_jpeg)) return std::make_unique<Jpeg>(std::move(input));
     if (is(is_pnm)) {
         const Container container = head[1] == '7' ? Container::kPam : Container::kPnm;
         return std::make_unique<Still>(std::move(input), container, decode_pnm);

@@ -6,6 +6,7 @@
 #include <optional>
 #include <string>
 
+#include "codecs.h"
 #include "file_kind.h"
 #include "input.h"
 #include "metadata.h"
@@ -25,6 +26,12 @@ class Source {
 public:
     virtual ~Source() = default;
 
+    // What decode_as() can ask for: the format of planes, at a reduction.
+    virtual std::optional<PixelFormat> planes(int32_t /*reduction*/) const { return {}; }
+    virtual bool is_reducible() const { return false; }
+    // Before the first frame is read.
+    virtual void decode_as(const Decoding& /*decoding*/) {}
+
     // Reads the next frame into *frame, which is empty or holds the one before; false at the end.
     virtual bool next(Picture* frame) = 0;
 
@@ -32,6 +39,7 @@ public:
     Size size() const { return size_; }
     // Of Y4M only.
     const std::optional<Y4mHeader>& y4m_header() const { return y4m_header_; }
+    // The damage of a picture is known when it has been read.
     const Metadata& metadata() const { return metadata_; }
     // What the user should know of how frames are read; empty: nothing.
     const std::string& remark() const { return remark_; }

@@ -1,9 +1,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "thumbnail.h"
 
-#include <vector>
-
 #include "engine.h"
+#include "lanczos.h"
 
 namespace tool {
 
@@ -65,9 +64,13 @@ void resize_thumbnail(uint8_t* src, Size from, uint8_t* dst, Size to, int32_t ch
     if (from.width == twice.width && from.height == twice.height) {
         return halve(src, from, dst, channels);
     }
-    std::vector<uint8_t> rest(twice.pixels() * static_cast<size_t>(channels));
-    resize_lanczos(src, from, rest.data(), twice, channels);
-    halve(rest.data(), twice, dst, channels);
+    const size_t row_bytes = static_cast<size_t>(to.width) * static_cast<size_t>(channels);
+    lanczos_in_bands(src, from, twice, channels, threads_of_picture(),
+                     [=](int32_t first_row, int32_t rows, const uint8_t* samples) {
+                         uint8_t* const result =
+                             dst + static_cast<size_t>(first_row / 2) * row_bytes;
+                         halve(samples, {twice.width, rows}, result, channels);
+                     });
 }
 
 }  // namespace tool

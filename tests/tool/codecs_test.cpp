@@ -112,7 +112,10 @@ Bytes png_of(int depth, int colors, const Bytes& row) {
     });
 }
 
-Bytes jpeg_of(J_COLOR_SPACE colors, int channels) {
+// change: what is asked of the library besides, once its defaults are set.
+Bytes jpeg_of(
+    J_COLOR_SPACE colors, int channels,
+    void (*change)(jpeg_compress_struct*) = [](jpeg_compress_struct*) {}) {
     return written([&](FILE* out) {
         jpeg_compress_struct codec = {};
         jpeg_error_mgr errors = {};
@@ -124,6 +127,7 @@ Bytes jpeg_of(J_COLOR_SPACE colors, int channels) {
         codec.input_components = channels;
         codec.in_color_space = colors;
         jpeg_set_defaults(&codec);
+        change(&codec);
         jpeg_start_compress(&codec, TRUE);
         Bytes samples(static_cast<size_t>(8 * channels), 200);
         JSAMPROW row = samples.data();
@@ -199,11 +203,71 @@ TEST(Codecs, PngOfOtherDepthsBecomesEightBitRgba) {
               (Bytes{0, 0, 0, 255, 255, 255, 255, 255}));
 }
 
-TEST(Codecs, GrayJpegIsReadAndCmykIsRefused) {
+TEST(Codecs, GrayAndCmykJpegAreRead) {
     const Bytes gray = jpeg_of(JCS_GRAYSCALE, 1);
     EXPECT_EQ(pixels_of(decode_jpeg(gray.data(), gray.size()))[0], 200);
-    const Bytes cmyk = jpeg_of(JCS_CMYK, 4);
-    EXPECT_THROW(decode_jpeg(cmyk.data(), cmyk.size()), tool::Error);
+    const auto first_of = [](const Bytes& file) {
+        const Bytes pixels = pixels_of(decode_jpeg(file.data(), file.size()));
+        return Bytes(pixels.begin(), pixels.begin() + 4);
+    };
+    // All inks 200. The library writes Adobe's marker, with which 255 is paper.
+    const Bytes inverted = {157, 157, 157, 255};
+    EXPECT_EQ(first_of(jpeg_of(JCS_CMYK, 4)), inverted);
+    EXPECT_EQ(first_of(jpeg_of(
+                  JCS_CMYK, 4,
+                  [](jpeg_compress_struct* codec) { jpeg_set_colorspace(codec, JCS_YCCK); })),
+              inverted);
+    EXPECT_EQ(
+        first_of(jpeg_of(JCS_CMYK, 4,
+                         [](jpeg_compress_struct* codec) { codec->write_Adobe_marker = FALSE; })),
+        (Bytes{12, 12, 12, 255}));
+}
+
+TEST(Codecs, JpegInPlanesIsThePictureReduced) {
+    const tool::Size size = {83, 61};
+    const Bytes file = encoded(kCodecs[1], gradient(size));
+    for (const int32_t reduction : {1, 2, 4, 8}) {
+        tool::JpegReader reader(file);
+        const tool::PixelFormat format = reader.planes(reduction).value();
+        EXPECT_EQ(format, reduction == 1 ? tool::PixelFormat::kI420 : tool::PixelFormat::kI444);
+        const Picture planes = reader.read({true, reduction});
+        EXPECT_EQ(planes.format, format);
+        EXPECT_EQ(tool::to_string(planes.size), tool::to_string({83 / reduction, 61 / reduction}));
+        const Picture rgb = tool::converted(planes, tool::PixelFormat::kRgba);
+        const Picture direct = tool::JpegReader(file).read({false, reduction});
+        ASSERT_EQ(tool::to_string(direct.size), tool::to_string(planes.size));
+        for (size_t i = 0; i < direct.byte_count(); ++i) {
+            ASSERT_NEAR(direct.bytes()[i], rgb.bytes()[i], 6)
+                << "byte " << i << " of " << reduction;
+        }
+        // And what it should be: the gradient in the middle of each sample.
+        const auto at = [&](int32_t x, int32_t y) {
+            return direct.bytes() + 4 * (y * direct.size.width + x);
+        };
+        for (int32_t y = 0; y < direct.size.height; ++y) {
+            for (int32_t x = 0; x < direct.size.width; ++x) {
+                const double middle = (x + 0.5) * reduction - 0.5;
+                ASSERT_NEAR(at(x, y)[0], middle * 255 / size.width, 12) << x << "," << y;
+            }
+        }
+    }
+}
+
+TEST(Codecs, JpegFromPlanesHoldsThem) {
+    // Sides that are no multiples of a block, nor even.
+    for (const tool::Size size : {tool::Size{1, 1}, tool::Size{16, 16}, tool::Size{37, 19}}) {
+        for (const auto format : {tool::PixelFormat::kI420, tool::PixelFormat::kGray}) {
+            const Picture planes = tool::converted(gradient(size), format);
+            const Bytes file = written([&](FILE* out) { tool::encode_jpeg(planes, {}, 100, out); });
+            tool::JpegReader reader(file);
+            EXPECT_EQ(reader.planes(1), format);
+            const Picture again = reader.read({true, 1});
+            ASSERT_EQ(again.byte_count(), planes.byte_count());
+            for (size_t i = 0; i < planes.byte_count(); ++i) {
+                ASSERT_NEAR(again.bytes()[i], planes.bytes()[i], 3) << "byte " << i;
+            }
+        }
+    }
 }
 
 TEST(Codecs, PnmHeadersAndDepths) {

@@ -145,8 +145,25 @@ make_videos() {
     head -c 100000 in_yuv420p10le.y4m >cut.y4m
 }
 
+# The scene as JPEG with chroma of each size, and in inks.
+make_jpegs() {
+    local factors
+    for factors in 1x1 2x1 2x2 1x2 4x1; do
+        convert upright.png -quality 95 -sampling-factor "$factors" "chroma_$factors.jpg"
+    done
+    convert upright.png -crop 399x299+0+0 +repage -quality 95 -sampling-factor 2x2 odd_sides.jpg
+    convert upright.png -quality 95 -sampling-factor 2x2 -interlace JPEG in_passes.jpg
+    convert upright.png -colorspace CMYK -quality 95 cmyk.jpg
+    exiftool -q -q "-ICC_Profile<=$profiles/ITULab.icc" -o cmyk_profile.jpg cmyk.jpg
+    head -c $(($(stat -c %s chroma_2x2.jpg) * 7 / 10)) chroma_2x2.jpg >cut_2x2.jpg
+    for n in 1 2 3 4 5 6 7 8; do
+        convert "photo$n.jpg" -sampling-factor 2x2 "photo_2x2_$n.jpg"
+    done
+}
+
 # What only the table of inputs needs.
 make_inputs() {
+    make_jpegs
     make_netpbm
     make_videos
 }
@@ -214,6 +231,18 @@ samples() {
 # head_of FILE: its first two bytes.
 head_of() {
     head -c 2 "$1"
+}
+
+# way IN OUT OPTION...: the format in which the tool resizes it.
+way() {
+    "$tool" "$@" -v 2>&1 >/dev/null | sed -n 's/^\([a-z0-9]*\) [0-9]*x.*/\1/p'
+}
+
+# alike FILE REFERENCE DB: whether both, of the same size, are that near to each other.
+alike() {
+    local psnr
+    psnr=$(compare -metric PSNR "$1" "$2" null: 2>&1)
+    awk -v psnr="$psnr" -v db="$3" 'BEGIN { print (psnr == "inf" || psnr >= db) ? "yes" : "no: " psnr " dB" }'
 }
 
 # pixel FILE X,Y: its channels, 0 to 255, alpha where the file has it.
