@@ -542,7 +542,33 @@ inline Status no_memory(const char* name, int64_t bytes) {
     return fail(ErrorCode::kNoMemory, name, ": no memory for ", bytes, " bytes");
 }
 
+inline Status no_memory_in_library() {
+    return fail(ErrorCode::kNoMemory, "the library has no memory for its work");
+}
+
 }  // namespace detail
+
+// Runs write(), which calls C functions that store every byte of dst, and tells whether they did.
+// Those report no lack of memory but leave dst alone then: a mark in its first bytes is still
+// there. When it is, write() runs again on another mark, as the picture itself may begin like the
+// first one. False leaves dst as it was.
+template <class Write>
+bool has_written(uint8_t* dst, size_t bytes, const Write& write) {
+    constexpr size_t kMarked = 16;
+    const size_t marked = bytes < kMarked ? bytes : kMarked;
+    uint8_t before[kMarked];
+    memcpy(before, dst, marked);
+    constexpr uint8_t kSeeds[] = {0x5A, 0xA5};
+    for (const uint8_t seed : kSeeds) {
+        uint8_t mark[kMarked];
+        for (size_t i = 0; i < marked; ++i) mark[i] = static_cast<uint8_t>(seed + 29 * i);
+        memcpy(dst, mark, marked);
+        write();
+        if (memcmp(dst, mark, marked) != 0) return true;
+    }
+    memcpy(dst, before, marked);
+    return false;
+}
 
 // A packed picture that owns its memory.
 class Picture {
@@ -1077,24 +1103,27 @@ inline void quarter_by_bands(const RowCall& rows, uint8_t* dst) {
     }
 }
 
-inline void sample_rows(const RowCall& rows, const View& result) {
-    uint8_t* const bytes = result.planes[0].data;
-    if (rows.fits_record()) {
-        quarter_by_record(rows, bytes);
-    } else {
-        memset(bytes, 0, result.planes[0].bytes);
-        quarter_by_bands(rows, bytes);
-    }
+// False when the library found no memory.
+inline bool sample_rows(const RowCall& rows, const View& result) {
+    const Plane all = result.planes[0];
+    return has_written(all.data, all.bytes, [&] {
+        if (rows.fits_record()) {
+            quarter_by_record(rows, all.data);
+        } else {
+            memset(all.data, 0, all.bytes);
+            quarter_by_bands(rows, all.data);
+        }
+    });
 }
 
 // Into memory of the result's size, and from there into dst.
 inline Status sample_rows_and_copy(const RowCall& rows, const Yuv<uint8_t>& dst) {
     const size_t bytes = rows.result(nullptr).planes[0].bytes;
     Memory memory;
-    memory.reset(calloc(bytes, 1));
+    memory.reset(malloc(bytes));
     if (memory.is_empty()) return no_memory("dst", count(bytes));
     const View result = rows.result(memory.get());
-    sample_rows(rows, result);
+    if (!sample_rows(rows, result)) return no_memory_in_library();
     Yuv<const uint8_t> samples{ConstView(result)};
     if (rows.src.chroma == Chroma::kUv) {
         const ConstPlane first = samples.v;
@@ -1113,7 +1142,7 @@ inline Status quarter_rows(const RowCall& rows, const View& dst) {
     if (!same_size || !is_packed_as(to, size, rows.src.chroma)) {
         return sample_rows_and_copy(rows, to);
     }
-    sample_rows(rows, result);
+    if (!sample_rows(rows, result)) return no_memory_in_library();
     if (to.chroma != rows.src.chroma) {
         swap_pairs(to.first_chroma(),
                    int64_t{half_rounded_up(size.width)} * half_rounded_up(size.height));
@@ -1169,8 +1198,9 @@ inline Status resize_rows_apart(const Call& call, const ConstView& src, const Vi
 // buffer is longer than the picture, they read what is there, as in C; where it is not long enough
 // they read a copy, in which the last row is repeated.
 //
-// When the library itself finds no memory, the result is incomplete and the status still ok: the C
-// functions report nothing.
+// When the library itself finds no memory for its work, the status says so, and nothing is written.
+// One case does not show: of a large Lanczos result on threads, rows for which a thread found no
+// memory are 0.
 inline Status resize(const ConstView& src, const View& dst, Filter filter = Filter::kQuarter,
                      Threads threads = Threads::kAuto) {
     Status status = detail::check_pair(src, dst, "dst");
@@ -1188,7 +1218,12 @@ inline Status resize(const ConstView& src, const View& dst, Filter filter = Filt
         const size_t bytes = picture_bytes(dst.format, dst.width, dst.height);
         return detail::no_memory("dst", detail::count(bytes));
     }
-    detail::run(call, from, to.data);
+    const auto run = [&] { detail::run(call, from, to.data); };
+    if (filter == Filter::kNearest) {
+        run();  // needs no memory, and does not store every byte
+    } else if (!has_written(to.data, picture_bytes(dst.format, dst.width, dst.height), run)) {
+        return detail::no_memory_in_library();
+    }
     to.finish();
     return status;
 }
@@ -1435,16 +1470,24 @@ inline Status draw(const Fitted& fitted, Threads threads = Threads::kAuto) {
     // nothing.
     const bool one = threads == Threads::kOne || fitted.target.canvas_height < fitted.target.dst_x;
     const uint8_t* const* planes = fitted.planes;
-    ovrin_resize_target target = fitted.target;
-    if (fitted.format == Format::kRgba8888) {
-        detail::choose(threads, ovrin_resize_rgba8888_keep_ratio, ovrin_resize_rgba_keep_ratio_sg,
-                       ovrin_resize_rgba_keep_ratio_tps)(planes[0], w, h, &target);
-    } else if (fitted.format == Format::kI420) {
-        const auto function = one ? ovrin_resize_y_u_v_sg : ovrin_resize_y_u_v_tps;
-        function(planes[0], planes[1], planes[2], nullptr, w, h, 0, 0, &target);
-    } else {
-        const auto function = one ? ovrin_resize_y_nv_sg : ovrin_resize_y_nv_tps;
-        function(planes[0], planes[1], nullptr, w, h, 0, 0, &target);
+    const auto run = [&] {
+        ovrin_resize_target target = fitted.target;
+        if (fitted.format == Format::kRgba8888) {
+            detail::choose(threads, ovrin_resize_rgba8888_keep_ratio,
+                           ovrin_resize_rgba_keep_ratio_sg,
+                           ovrin_resize_rgba_keep_ratio_tps)(planes[0], w, h, &target);
+        } else if (fitted.format == Format::kI420) {
+            const auto function = one ? ovrin_resize_y_u_v_sg : ovrin_resize_y_u_v_tps;
+            function(planes[0], planes[1], planes[2], nullptr, w, h, 0, 0, &target);
+        } else {
+            const auto function = one ? ovrin_resize_y_nv_sg : ovrin_resize_y_nv_tps;
+            function(planes[0], planes[1], nullptr, w, h, 0, 0, &target);
+        }
+    };
+    const int32_t canvas_w = fitted.target.canvas_width;
+    const size_t bytes = picture_bytes(fitted.format, canvas_w, fitted.target.canvas_height);
+    if (!has_written(static_cast<uint8_t*>(fitted.target.dst), bytes, run)) {
+        return detail::no_memory_in_library();
     }
     return status;
 }

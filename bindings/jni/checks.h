@@ -50,6 +50,14 @@ public:
     // What a call of the C++ layer has come to: missing memory throws OutOfMemoryError.
     void outcome(const ovrin::Status& status);
 
+    // Runs call(), which stores every byte of dst unless the library lacks memory; then
+    // OutOfMemoryError is thrown, and dst is as it was.
+    template <class Call>
+    void write(uint8_t* dst, int64_t bytes, const Call& call) {
+        if (!ok_ || ovrin::has_written(dst, static_cast<size_t>(bytes), call)) return;
+        outcome({ovrin::ErrorCode::kNoMemory, "the library has no memory for its work"});
+    }
+
 private:
     struct Range {
         uintptr_t begin;

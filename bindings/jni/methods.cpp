@@ -87,8 +87,9 @@ void JNICALL i420(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h, jobj
     Checks checks(env);
     const Buffers buffers =
         checked_buffers(checks, src, {src_w, src_h}, dst, {dst_w, dst_h}, yuv420_bytes, 1, 1);
-    if (!checks.ok()) return;
-    ovrin_resize_yuv420(buffers.src, buffers.dst, src_w, src_h, dst_w, dst_h);
+    checks.write(buffers.dst, yuv420_bytes({dst_w, dst_h}), [&] {
+        ovrin_resize_yuv420(buffers.src, buffers.dst, src_w, src_h, dst_w, dst_h);
+    });
 }
 
 void JNICALL nv21(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h, jobject dst, jint dst_w,
@@ -96,8 +97,8 @@ void JNICALL nv21(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h, jobj
     Checks checks(env);
     const Buffers buffers =
         checked_buffers(checks, src, {src_w, src_h}, dst, {dst_w, dst_h}, yuv420_bytes, 1, 1);
-    if (!checks.ok()) return;
-    ovrin_resize_nv21(buffers.src, buffers.dst, src_w, src_h, dst_w, dst_h);
+    checks.write(buffers.dst, yuv420_bytes({dst_w, dst_h}),
+                 [&] { ovrin_resize_nv21(buffers.src, buffers.dst, src_w, src_h, dst_w, dst_h); });
 }
 
 // ---- Into a canvas -----------------------------------------------------------------------------
@@ -117,6 +118,11 @@ ovrin_resize_target target_of(const Placement& placement, Size src_size, int32_t
     target.dst_x = placement.x;
     target.dst_y = placement.y;
     return target;
+}
+
+// The threaded functions for planes compare x with the canvas's height, and would draw nothing.
+bool is_turned_down_by_threads(const Placement& placement) {
+    return placement.canvas.height < placement.x;
 }
 
 // Everything but the buffers.
@@ -155,9 +161,14 @@ void JNICALL i420_in_canvas(JNIEnv* env, jclass, jobject src_y, jobject src_u, j
     const uint8_t* from_u = checks.source(src_u, "source U plane", chroma_bytes);
     const uint8_t* from_v = checks.source(src_v, "source V plane", chroma_bytes);
     uint8_t* canvas = checks.destination(dst, yuv420_bytes(placement.canvas));
-    if (!checks.ok()) return;
     const ovrin_resize_target target = target_of(placement, size, src_stride, canvas);
-    ovrin_resize_y_u_v_keep_ratio(from_y, from_u, from_v, src_w, src_h, &target);
+    checks.write(canvas, yuv420_bytes(placement.canvas), [&] {
+        if (is_turned_down_by_threads(placement)) {
+            ovrin_resize_y_u_v_sg(from_y, from_u, from_v, nullptr, src_w, src_h, 0, 0, &target);
+        } else {
+            ovrin_resize_y_u_v_keep_ratio(from_y, from_u, from_v, src_w, src_h, &target);
+        }
+    });
 }
 
 void JNICALL nv21_in_canvas(JNIEnv* env, jclass, jobject src_y, jobject src_vu, jint src_w,
@@ -172,9 +183,14 @@ void JNICALL nv21_in_canvas(JNIEnv* env, jclass, jobject src_y, jobject src_vu, 
     const uint8_t* from_vu =
         checks.source(src_vu, "source VU plane", 2 * strided_chroma(size, src_stride));
     uint8_t* canvas = checks.destination(dst, yuv420_bytes(placement.canvas));
-    if (!checks.ok()) return;
     const ovrin_resize_target target = target_of(placement, size, src_stride, canvas);
-    ovrin_resize_y_nv21_keep_ratio(from_y, from_vu, src_w, src_h, &target);
+    checks.write(canvas, yuv420_bytes(placement.canvas), [&] {
+        if (is_turned_down_by_threads(placement)) {
+            ovrin_resize_y_nv_sg(from_y, from_vu, nullptr, src_w, src_h, 0, 0, &target);
+        } else {
+            ovrin_resize_y_nv21_keep_ratio(from_y, from_vu, src_w, src_h, &target);
+        }
+    });
 }
 
 // ---- Engines -----------------------------------------------------------------------------------
@@ -211,10 +227,10 @@ void JNICALL bilinear(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h, 
     const BilinearMode& mode = kBilinearModes[mode_number];
     const uint8_t* from =
         checks.source(src, kSource, mode.source_bytes(src_size, dst_size, format));
-    uint8_t* to =
-        checks.destination(dst, format == kPixels ? rgba_bytes(dst_size) : yuv420_bytes(dst_size));
-    if (!checks.ok()) return;
-    mode.resize(from, to, src_w, src_h, dst_w, dst_h, format, nullptr);
+    const int64_t bytes = format == kPixels ? rgba_bytes(dst_size) : yuv420_bytes(dst_size);
+    uint8_t* to = checks.destination(dst, bytes);
+    checks.write(to, bytes,
+                 [&] { mode.resize(from, to, src_w, src_h, dst_w, dst_h, format, nullptr); });
 }
 
 void JNICALL lanczos(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h, jobject dst,
@@ -222,8 +238,9 @@ void JNICALL lanczos(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h, j
     Checks checks(env);
     const Buffers buffers =
         checked_buffers(checks, src, {src_w, src_h}, dst, {dst_w, dst_h}, rgba_bytes, 1, 1);
-    if (!checks.ok()) return;
-    ovrin_resize_lanczos(buffers.src, buffers.dst, src_w, src_h, dst_w, dst_h, 4);
+    checks.write(buffers.dst, rgba_bytes({dst_w, dst_h}), [&] {
+        ovrin_resize_lanczos(buffers.src, buffers.dst, src_w, src_h, dst_w, dst_h, 4);
+    });
 }
 
 void JNICALL lanczos_components(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h,
@@ -233,8 +250,9 @@ void JNICALL lanczos_components(JNIEnv* env, jclass, jobject src, jint src_w, ji
     const Buffers buffers = checked_buffers(
         checks, src, {src_w, src_h}, dst, {dst_w, dst_h},
         [&](Size size) { return components * size.pixels(); }, 1, 1);
-    if (!checks.ok()) return;
-    ov_lanczos(buffers.src, src_w, src_h, buffers.dst, dst_w, dst_h, components);
+    checks.write(buffers.dst, components * Size{dst_w, dst_h}.pixels(), [&] {
+        ov_lanczos(buffers.src, src_w, src_h, buffers.dst, dst_w, dst_h, components);
+    });
 }
 
 void JNICALL lanczos_full_chroma(JNIEnv* env, jclass, jobject src, jint src_w, jint src_h,
@@ -242,8 +260,8 @@ void JNICALL lanczos_full_chroma(JNIEnv* env, jclass, jobject src, jint src_w, j
     Checks checks(env);
     const Buffers buffers =
         checked_buffers(checks, src, {src_w, src_h}, dst, {dst_w, dst_h}, full_chroma_bytes, 1, 1);
-    if (!checks.ok()) return;
-    ov_lanczos_nv(buffers.src, src_w, src_h, buffers.dst, dst_w, dst_h);
+    checks.write(buffers.dst, full_chroma_bytes({dst_w, dst_h}),
+                 [&] { ov_lanczos_nv(buffers.src, src_w, src_h, buffers.dst, dst_w, dst_h); });
 }
 
 // ---- Registration ------------------------------------------------------------------------------

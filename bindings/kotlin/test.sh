@@ -1,13 +1,16 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
-# test.sh BUILD: tests the binding with the native libraries in the folder BUILD.
+# test.sh BUILD SANITIZED_BUILD: tests the binding with the native libraries in the folder BUILD, then once
+# more with those of the other folder, which g++ has built with its address sanitizer.
 set -euo pipefail
 here=$(dirname "${BASH_SOURCE[0]}")
 root=$here/../..
 build=$(cd "$1" && pwd)
+sanitized=$(cd "$2" && pwd)
 source "$here/compiler/compiler.sh"
 
-calls=${OVRIN_TEST_CALLS:-100000}
+calls=1000000
+sanitized_calls=100000
 seed=${OVRIN_TEST_SEED:-1}
 classes=$build/test-classes
 # JUnit, as Debian installs it.
@@ -49,17 +52,39 @@ test_classes() {
     (cd "$classes" && grep -lr 'Lorg/junit/Test;' . | grep -v '\$' | sed 's,^\./,,; s,/,.,g; s,\.class$,,' | sort)
 }
 
-# run NAME CLASS ARGUMENT...: what -Xcheck:jni has to say goes to either stream.
+# run NAME LIBRARIES CALLS CLASS ARGUMENT...: what -Xcheck:jni has to say goes to either stream.
 run() {
-    local output=$build/$1.out
-    java -Xcheck:jni -Djava.library.path="$build" -Dovrin.expected="$build/expected.txt" \
-        -Dovrin.calls="$calls" -Dovrin.seed="$seed" \
-        -classpath "$class_path" "${@:2}" >"$output" 2>&1 || {
-        cat "$output"
-        fail "$2 gave $?"
-    }
-    cat "$output"
+    local output=$build/$1.out status=0
+    java -Xcheck:jni -Djava.library.path="$2" -Dovrin.expected="$build/expected.txt" \
+        -Dovrin.calls="$3" -Dovrin.seed="$seed" -Dovrin.faults="$build/libfaults.so" \
+        -classpath "$class_path" "${@:4}" >"$output" 2>&1 || status=$?
+    grep -v '^\.\+$' "$output"
+    ((status == 0)) || fail "$4 gave $status"
     ! grep -Ei 'warning|fatal' "$output" || fail "-Xcheck:jni complains"
+}
+
+# run_tests NAME LIBRARIES CALLS CLASS...
+run_tests() {
+    run "$1" "$2" "$3" org.junit.runner.JUnitCore "${@:4}"
+    grep -q '^OK (' "$build/$1.out" || fail "the tests did not reach their end"
+}
+
+make_faults() {
+    local jni_h
+    jni_h=$(dirname "$(find /usr/lib/jvm/*/include "${JAVA_HOME:-/nonexistent}" -name jni.h 2>/dev/null |
+        head -n 1)")
+    gcc -std=c11 -Wall -Wextra -Werror -O1 -shared -fPIC -I "$jni_h" -I "$jni_h/linux" \
+        "$here/test/faults.c" -o "$build/libfaults.so"
+}
+
+# The virtual machine handles faults of its own in compiled code, so the sanitizer must not; and it keeps
+# memory until it ends, which is no leak of ours: those are counted by faults.c.
+run_sanitized() {
+    local runtime
+    runtime=$(g++ -print-file-name=libasan.so):$(g++ -print-file-name=libubsan.so)
+    nm -D "$sanitized/libovrinresize_jni.so" | grep -q __asan_report || fail "no sanitizer in $sanitized"
+    LD_PRELOAD=$runtime ASAN_OPTIONS=handle_segv=0:detect_leaks=0:halt_on_error=1 \
+        UBSAN_OPTIONS=halt_on_error=1:print_stacktrace=1 run_tests sanitized "$sanitized" "$sanitized_calls" "$@"
 }
 
 # The library that Java loads exports nothing but its entry, and needs no C++ run-time library.
@@ -79,8 +104,11 @@ bash "$here/compile.sh" "$build"
 take_example
 compile_tests
 make_known_results
-mapfile -t tests < <(test_classes)
-run tests org.junit.runner.JUnitCore "${tests[@]}"
-grep -q '^OK (' "$build/tests.out" || fail "the tests did not reach their end"
-run example ExampleKt
+make_faults
+mapfile -t tests < <(test_classes | grep -v '\.Memory')
+run_tests tests "$build" "$calls" "${tests[@]}"
+run_sanitized "${tests[@]}"
+mapfile -t memory_tests < <(test_classes | grep '\.Memory')
+LD_PRELOAD=$build/libfaults.so run_tests memory "$build" "$calls" "${memory_tests[@]}"
+run example "$build" "$calls" ExampleKt
 diff "$build/example.expected" "$build/example.out" || fail "the example prints something else"

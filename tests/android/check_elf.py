@@ -2,8 +2,9 @@
 # SPDX-License-Identifier: Apache-2.0
 """check_elf.py LIBRARY IMPORTS DECLARED: what Android's loader and packaging ask of a library.
 
-IMPORTS lists the names that may be imported, DECLARED those that must be exported. Says for each
-rule whether it holds; ends with 1 if one does not."""
+IMPORTS lists the names that may be imported, each with the library that has it; these are the libraries
+that must be needed. DECLARED lists the names that must be exported. Says for each rule whether it
+holds; ends with 1 if one does not."""
 import os
 import re
 import sys
@@ -88,8 +89,8 @@ def rule_soname(lib, _):
         yield f"{lib.soname()}, not the file's name"
 
 
-def rule_needed(lib, _):
-    if sorted(lib.needed()) != ["libc.so", "libm.so"]:
+def rule_needed(lib, lists):
+    if sorted(lib.needed()) != sorted(lists["libraries"]):
         yield f"needs {lib.needed()}"
     if lib.values("DT_RPATH") or lib.values("DT_RUNPATH"):
         yield "has a path to search"
@@ -221,7 +222,8 @@ def read_lists(imports, declared):
     with open(imports, encoding="utf-8") as file:
         lines = [line.split() for line in file if not line.startswith("#")]
     with open(declared, encoding="utf-8") as file:
-        return {"imports": {line[1] for line in lines}, "declared": set(file.read().split())}
+        return {"imports": {line[1] for line in lines}, "libraries": {line[0] for line in lines},
+                "declared": set(file.read().split())}
 
 
 def complaints(path, lists):

@@ -8,6 +8,7 @@ here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
 source_dir=$here/../..
 directory=$(realpath -m "$1")
 library=$directory/lib/libovrinresize.so
+jni_library=$directory/lib/libovrinresize_jni.so
 small_pages=$directory/twins/small-pages/libovrinresize.so
 golden_file=$source_dir/tests/golden/golden.txt
 
@@ -43,13 +44,19 @@ clang -E "$source_dir/include/ovrinresize.h" | awk -f "$here/../package/declared
     >"$directory/declared.txt"
 "$here/check_elf.py" "$library" "$here/imports.txt" "$directory/declared.txt"
 
+heading "what Android asks of the binding's library"
+sed 's/^/libovrinresize.so /' "$directory/declared.txt" >"$directory/of-core.txt"
+echo JNI_OnLoad >"$directory/declared-jni.txt"
+"$here/check_elf.py" "$jni_library" <(cat "$here/imports_jni.txt" "$directory/of-core.txt") \
+    "$directory/declared-jni.txt"
+
 heading "files that Android would not take"
 rm -rf "$directory/twins"
 "$here/check_elf_test.py" "$directory/lib" "$here/imports.txt" "$directory/declared.txt" \
     "$directory/twins"
 
 heading "a loader for it"
-bash "$here/loader.sh" "$directory/android_loader"
+bash "$here/loader.sh" "$directory/android_loader" "$directory/android_jni_loader"
 
 same=0 different=1 refused=3
 ends_with $same cortex-a53 4096 "$library"
@@ -60,6 +67,9 @@ ends_with $same cortex-a53 4096 "$small_pages"
 ends_with $refused max 16384 "$small_pages"
 ends_with $refused cortex-a53 4096 "$directory/twins/long-relro/libovrinresize.so"
 ends_with $refused cortex-a53 4096 "$directory/twins/imports-another/libovrinresize.so"
+heading "the binding's library, bound to that"
+qemu-aarch64 -cpu cortex-a53 -p 4096 "$directory/android_jni_loader" "$library" "$jni_library"
+qemu-aarch64 -cpu max -p 16384 "$directory/android_jni_loader" "$library" "$jni_library"
 # A single other hash is noticed.
 sed '$s/ .*/ 0123456789abcdef/' "$golden_file" >"$directory/other-golden.txt"
 ends_with $different cortex-a53 4096 "$library" "$directory/other-golden.txt"

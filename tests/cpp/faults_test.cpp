@@ -79,8 +79,8 @@ TEST(CppFaults, NoMemoryForRowsApart) {
     std::vector<uint8_t> dst(ovrin::picture_bytes(ovrin::Format::kI420, 3, 3), 7);
     const ovrin::ConstPlane y(src.data(), src.size(), 9);
     const ovrin::ConstPlane u(src.data(), src.size(), 16, 2);
-    const auto refused = [&](faults::Kind kind) {
-        faults::fail(kind, 1);
+    const auto refused = [&](int nth) {
+        faults::fail(faults::Kind::kMalloc, nth);
         const ovrin::Status status =
             resize(ovrin::i420_view(y, u, u, 8, 8), ovrin::i420_view(dst.data(), dst.size(), 3, 3));
         EXPECT_TRUE(faults::has_failed());
@@ -88,9 +88,87 @@ TEST(CppFaults, NoMemoryForRowsApart) {
         EXPECT_EQ(dst, std::vector<uint8_t>(dst.size(), 7));
         return status;
     };
-    EXPECT_STREQ(refused(faults::Kind::kMalloc).text, "src: no memory for 32 bytes");
-    EXPECT_STREQ(refused(faults::Kind::kCalloc).text, "dst: no memory for 24 bytes");
+    EXPECT_STREQ(refused(1).text, "src: no memory for 32 bytes");
+    EXPECT_STREQ(refused(2).text, "dst: no memory for 24 bytes");
     EXPECT_EQ(faults::live_blocks(), 0);
+}
+
+// What the library itself is refused: one request after the other, alone and with all that follow.
+// Either the picture is whole, or the status says that nothing was written.
+template <class Make>
+void refuse_each(Make make, size_t bytes, bool must_fail) {
+    std::vector<uint8_t> expected(bytes, 7);
+    ASSERT_TRUE(make(expected.data()).ok());
+    int refusals = 0;
+    for (const faults::Kind kind : faults::kAllKinds) {
+        for (const bool and_all_later : {false, true}) {
+            for (int nth = 1;; ++nth) {
+                std::vector<uint8_t> dst(bytes, 7);
+                faults::fail(kind, nth, and_all_later);
+                const ovrin::Status status = make(dst.data());
+                const bool failed = faults::has_failed();
+                faults::reset();
+                if (!failed) break;
+                refusals += status.ok() ? 0 : 1;
+                EXPECT_TRUE(status.ok() || status.code == ErrorCode::kNoMemory);
+                EXPECT_EQ(dst, status.ok() ? expected : std::vector<uint8_t>(bytes, 7))
+                    << faults::name(kind) << " " << nth;
+            }
+        }
+    }
+    EXPECT_EQ(refusals > 0, must_fail);
+    EXPECT_EQ(faults::live_blocks(), 0);
+}
+
+TEST(CppFaults, LibraryWithoutMemory) {
+    const std::vector<uint8_t> src(90 * 1100 * 4, 100);
+    const auto yuv = [&](uint8_t* dst) {
+        return resize(ovrin::i420_view(src.data(), src.size(), 33, 40),
+                      ovrin::i420_view(dst, 10 * 10 * 3 / 2, 10, 10));
+    };
+    refuse_each(yuv, 150, true);
+    const auto nv21_in_threads = [&](uint8_t* dst) {
+        return resize(ovrin::nv21_view(src.data(), src.size(), 90, 1100),
+                      ovrin::nv21_view(dst, 21 * 100 + 22 * 50, 21, 100));
+    };
+    refuse_each(nv21_in_threads, 21 * 100 + 22 * 50, true);
+    const auto rgba = [&](uint8_t* dst) {
+        return resize(ovrin::rgba_view(src.data(), src.size(), 90, 1100),
+                      ovrin::rgba_view(dst, 21 * 100 * 4, 21, 100));
+    };
+    refuse_each(rgba, 21 * 100 * 4, false);
+    const auto bilinear = [&](uint8_t* dst) {
+        return resize(ovrin::rgba_view(src.data(), src.size(), 40, 40),
+                      ovrin::rgba_view(dst, 400, 10, 10), Filter::kBilinear);
+    };
+    refuse_each(bilinear, 400, true);
+    const auto canvas = [&](uint8_t* dst) {
+        return draw(fit(ovrin::i420_view(src.data(), src.size(), 32, 16),
+                        ovrin::i420_view(dst, 96, 8, 8), ovrin::Fit::kContain));
+    };
+    refuse_each(canvas, 96, true);
+    const auto camera = [&](uint8_t* dst) {
+        const ovrin::ConstPlane y(src.data(), src.size(), 40);
+        const ovrin::ConstPlane u(src.data(), src.size(), 40, 2);
+        const ovrin::ConstPlane v(src.data() + 1, src.size() - 1, 40, 2);
+        return resize(ovrin::i420_view(y, u, v, 32, 16), ovrin::nv21_as_i420_view(dst, 96, 8, 8));
+    };
+    refuse_each(camera, 96, true);
+}
+
+// A picture that begins like the mark is a picture.
+TEST(CppFaults, PicturesMayBeginLikeTheMark) {
+    for (const int seed : {0x5A, 0xA5}) {
+        std::vector<uint8_t> src(64);
+        for (size_t i = 0; i < src.size(); ++i)
+            src[i] = static_cast<uint8_t>(seed + 29 * int(i % 4));
+        uint8_t dst[4] = {};
+        const ovrin::Status status = resize(ovrin::rgba_view(src.data(), src.size(), 4, 4),
+                                            ovrin::rgba_view(dst, 4, 1, 1), Filter::kLanczos);
+        EXPECT_TRUE(status.ok());
+        EXPECT_EQ(std::vector<uint8_t>(dst, dst + 4),
+                  std::vector<uint8_t>(src.data(), src.data() + 4));
+    }
 }
 
 }  // namespace

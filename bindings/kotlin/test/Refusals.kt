@@ -287,6 +287,23 @@ class Messages {
         }
     }
 
+    /** On wide canvases, too, where the library's threads would draw nothing. */
+    @Test
+    fun tallPicturesOnWideCanvases() {
+        val source = Size(4, 1024)
+        val placement = Placement(Size(100, 10), Size(4, 8), 60, 0)
+        for (format in listOf(PixelFormat.I420, PixelFormat.NV21)) {
+            val canvas = direct(format.bytes(placement.canvas))
+            val from = picture(format.bytes(source).toInt())
+            if (format == PixelFormat.I420) {
+                Resizer.i420InCanvas(from, source, canvas, placement)
+            } else {
+                Resizer.nv21InCanvas(from, source, canvas, placement)
+            }
+            check((0 until 8).all { canvas.get(100 * it + 60).toInt() != 0 }) { "$format was not drawn" }
+        }
+    }
+
     @Test
     fun placements() {
         fun fits(source: Size, canvas: Size, expected: String) {

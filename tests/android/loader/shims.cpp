@@ -109,6 +109,7 @@ void* find_shim(const char* name) {
         entry("calloc", calloc),
         entry("free", free),
         entry("malloc", malloc),
+        entry("memcmp", memcmp),
         entry("memcpy", memcpy),
         entry("memset", memset),
         entry("pthread_cond_broadcast", cond_broadcast),
@@ -122,7 +123,9 @@ void* find_shim(const char* name) {
         entry("pthread_mutex_unlock", mutex_unlock),
         entry("pthread_self", pthread_self),
         entry("sin", static_cast<double (*)(double)>(sin)),
+        entry("strlen", static_cast<size_t (*)(const char*)>(strlen)),
         entry("usleep", usleep),
+        entry("vsnprintf", vsnprintf),
     };
     for (const Entry& known : entries) {
         if (strcmp(known.name, name) == 0) return known.address;

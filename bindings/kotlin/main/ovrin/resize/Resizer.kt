@@ -15,8 +15,9 @@ import java.nio.ByteBuffer
  * - What does not fit throws [IllegalArgumentException] before anything is written.
  * - Nothing is kept between calls. Any number of threads may resize at once; nobody else may use the
  *   buffers of a call until it returns.
- * - The library does not report a lack of memory: most functions then leave the destination as it
- *   was.
+ * - A lack of memory throws [OutOfMemoryError], and the destination is as it was. Two cases do not
+ *   show: of a large [lanczos] result, rows for which a thread found none are 0, and the chroma of
+ *   [lanczosFullChroma] keeps what it held.
  *
  * Resizing without a further name in the function ([rgba], [rgb], [i420], [nv21] and what goes into
  * a canvas) takes four pixels of the source for each of the result, and drops their two low bits:

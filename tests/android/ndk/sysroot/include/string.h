@@ -11,6 +11,7 @@ extern "C" {
 void* memcpy(void* to, const void* from, size_t size);
 void* memmove(void* to, const void* from, size_t size);
 void* memset(void* to, int byte, size_t size);
+size_t strlen(const char* text);
 int memcmp(const void* a, const void* b, size_t size);
 
 #ifdef __cplusplus
