@@ -190,6 +190,8 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     const uint8_t chance = in.byte();
     const Fault fault = chance < 192 ? Fault::kNone : static_cast<Fault>(1 + chance % 4);
     const Sizes s = short_sizes(in);
+    const ovrin::NamedKernels& set = all_sets().sets[in.byte() % all_sets().count];
+    ovrin::force_kernels(*set.kernels);
     Pixels pixels(in);
     Picture src(in, pixels, format, s.src_w, s.src_h);
     Picture dst(in, pixels, format, s.dst_w, s.dst_h);
@@ -203,9 +205,10 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     const ovrin::Status status = ovrin::resize(from, to, filter, threads);
 
     require(status.ok() == wanted, wanted ? status.text : "the layer takes what it should not",
-            "any");
-    require(status.ok() == (status.text[0] == '\0'), "a status without its sentence", "any");
-    for (size_t i = 0; i < dst.buffers.size(); ++i) dst.buffers[i].check(expected[i].data(), "any");
-    for (const Buffer& buffer : src.buffers) buffer.check_unchanged("any");
+            set.name);
+    require(status.ok() == (status.text[0] == '\0'), "a status without its sentence", set.name);
+    for (size_t i = 0; i < dst.buffers.size(); ++i)
+        dst.buffers[i].check(expected[i].data(), set.name);
+    for (const Buffer& buffer : src.buffers) buffer.check_unchanged(set.name);
     return 0;
 }

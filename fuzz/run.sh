@@ -72,7 +72,7 @@ for name in "${fuzzers[@]}"; do
     # The memory sanitizer does not know that permutations of 32-bit words move what is not
     # initialised along with the rest; bilinear rows end in such.
     unset OVRIN_FUZZ_SETS
-    case $build-$name in *msan-bilinear* | *msan-drivers) export OVRIN_FUZZ_SETS=1 ;; esac
+    case $build-$name in *msan-bilinear* | *msan-cpp | *msan-drivers) export OVRIN_FUZZ_SETS=1 ;; esac
     # shellcheck disable=SC2046,SC2086 # lists
     if ! "build/$build/fuzz/fuzz_$name" -max_len="${longest[$name]:-96}" -len_control=0 -timeout=60 -print_final_stats=1 -verbosity=1 \
         -artifact_prefix="$work/crashes/$name-" $(limits "$name") $corpora >"$log" 2>&1; then
