@@ -81,7 +81,12 @@ private:
             const std::string text = noise;
             for (size_t i; (i = name.find(text)) != std::string::npos;) name.erase(i, text.size());
         }
-        return name.substr(0, name.find('('));
+        // Template arguments may have parentheses too.
+        size_t end = 0;
+        for (int depth = 0; end < name.size() && (depth > 0 || name[end] != '('); ++end) {
+            depth += name[end] == '<' ? 1 : name[end] == '>' ? -1 : 0;
+        }
+        return name.substr(0, end);
     }
 
     std::vector<char> image_;
