@@ -76,12 +76,26 @@ void check_metadata(const tool::Metadata& metadata, tool::Size size) {
     }
 }
 
-void read(const std::string& path) {
-    const auto source = tool::open_source(path, {});
+// Lets the source decode as the tool may ask it to, and returns the size that the frames then have.
+tool::Size choose_decoding(uint8_t choice, tool::Source* source) {
     const tool::Size size = source->size();
-    require(size.width > 0 && size.height > 0 && int64_t(size.pixels()) <= kMostPixels,
+    tool::Decoding decoding;
+    if (source->is_reducible()) decoding.reduction = 1 << (choice >> 1 & 3);
+    const tool::Size reduced = {size.width / decoding.reduction, size.height / decoding.reduction};
+    if (reduced.width == 0 || reduced.height == 0) return size;
+    const bool is_even = reduced.width % 2 == 0 && reduced.height % 2 == 0;
+    decoding.in_planes = (choice & 1) != 0 && is_even && source->planes(decoding.reduction);
+    source->decode_as(decoding);
+    return reduced;
+}
+
+void read(const std::string& path, uint8_t choice) {
+    const auto source = tool::open_source(path, {});
+    require(source->size().width > 0 && source->size().height > 0 &&
+                int64_t(source->size().pixels()) <= kMostPixels,
             "a size out of bounds");
-    check_metadata(source->metadata(), size);
+    check_metadata(source->metadata(), source->size());
+    const tool::Size size = choose_decoding(choice, source.get());
     tool::Picture frame;
     while (source->next(&frame)) {
         require(frame.size.width == size.width && frame.size.height == size.height,
@@ -105,6 +119,6 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     memcpy(content.data(), kMagic, kMagicBytes);
     if (memcmp(kMagic, kPngMagic, kMagicBytes) == 0) mend_checksums(&content);
     const std::string& path = file.holding(content);
-    succeeds([&] { read(path); });
+    succeeds([&] { read(path, content.back()); });
     return 0;
 }
