@@ -128,6 +128,7 @@ std::vector<SimpleRatio> simple_ratios(const NamedKernels& set) {
             all.push_back({"avx2", n, ratio});
             if (n != 3) all.push_back({"neon", n, ratio});
         }
+        if (n != 3) all.push_back({"neon", n, {4, 3}});
     }
     std::vector<SimpleRatio> of_set;
     std::copy_if(all.begin(), all.end(), std::back_inserter(of_set),
