@@ -39,7 +39,8 @@ struct BilinearPlan {
 };
 
 // A source row, blended horizontally for the columns of a strip: for every destination byte a sum
-// with 12 fractional bits, shifted to where the kernels want it. What lies past the last one up to a vector may be overwritten.
+// with 12 fractional bits, shifted to where the kernels want it. What lies past the last one up to
+// a vector may be overwritten.
 struct BilinearSums {
     alignas(64) uint32_t values[kBilinearColumns * 4];
 };
