@@ -7,6 +7,9 @@ LLVM's models set different costs for one and the same access: on the A55 an ldr
 one cycle, an ld1 two, as the processor's path of 64 bits does, and an ldp six for twice as much; on
 the N1 an str costs twice as much as an st1. So all of them become ld1 and st1, one vector each.
 
+LLVM's N1 takes half a cycle for a multiplication of vectors of 32 bits by one element, and two for
+one by a vector; the processor takes two for both. So all become the latter.
+
 And a load into one lane waits as long for the register's other lanes as for its address. Processors
 load first and then insert, so that is what such a load becomes.
 """
@@ -18,6 +21,7 @@ import sys
 WHOLE = re.compile(
     r"(ld|st)(?:r|ur|p|np) q(\d+)(?:, q(\d+))?, \[(\w+)(?:, ([wx]\d+))?[^]]*\](!|, .*)?$")
 LANE = re.compile(r"ld[1-4] {(.*)}\[(\d+)\], \[(\w+)\](, .*)?$")
+BY_ELEMENT = re.compile(r"((?:mul|mla|mls|sqr?dmulh) v\d+\.(4s|8h), v\d+\.\w+, v\d+)\.[sh]\[\d+\]$")
 PREFETCH_BELOW = re.compile(r"prfm (.*, #?-\d+\])$")
 LANE_BYTES = {"b": 1, "h": 2, "s": 4, "d": 8}
 LOAD_OF = {1: "b", 2: "h", 4: "s", 8: "d"}
@@ -58,6 +62,8 @@ def even_out(lines):
             yield from whole_vectors(found)
         elif found := LANE.match(line):
             yield from lanes(found, spare)
+        elif found := BY_ELEMENT.match(line):
+            yield f"{found[1]}.{found[2]}"
         elif found := PREFETCH_BELOW.match(line):
             # g++ leaves it to its assembler to say so.
             yield "prfum " + found[1]

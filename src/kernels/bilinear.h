@@ -32,14 +32,15 @@ struct BilinearPlan {
     alignas(64) uint8_t shuffles[kBilinearQuads][16];
     union {
         alignas(64) int32_t weight_pairs[kBilinearQuads][4];
-        int16_t right_weights[kBilinearColumns * 4];
+        int16_t left_weights[kBilinearColumns * 4];
     };
 
     int32_t bytes() const { return columns->count * columns->sample_bytes; }
 };
 
 // A source row, blended horizontally for the columns of a strip: for every destination byte a sum
-// with 12 fractional bits. What lies past the last one up to a vector may be overwritten.
+// with 12 fractional bits, shifted to where the kernels want it. What lies past the last one up to
+// a vector may be overwritten.
 struct BilinearSums {
     alignas(64) uint32_t values[kBilinearColumns * 4];
 };
@@ -53,12 +54,13 @@ struct BilinearNext {
 // Row kernels for a plan. For every column i, with the weight wx, and every byte c of a sample of N
 // bytes, modulo 2^32:
 //
-//   across  sums[N*i + c] = left * (4096 - wx) + right * wx
+//   across  sums[N*i + c] = (left * (4096 - wx) + right * wx) << sum_shift
 //   copy    dst[N*i + c] = left
 //
 //   left = row[N*index + c], right = row[N*(index + to_right) + c], index being column i's
 //
-// and for every byte i of the strip, with wy the weight of the lower row:
+// and for every byte i of the strip, with wy the weight of the lower row and upper and lower sums
+// that `across` makes, before they are shifted:
 //
 //   down    dst[i] = (upper[i] * (4096 - wy) + lower[i] * wy) >> 24
 //
@@ -72,6 +74,7 @@ using BilinearCopy = void(uint8_t* dst, const uint8_t* row, const BilinearPlan& 
 struct BilinearKernels {
     BilinearAcross* across;
     BilinearDown* down;
+    int32_t sum_shift = 0;
 };
 
 // Plans columns that are to be blended, whose indices never decrease, and returns the kernels to

@@ -12,9 +12,11 @@
 // source row these are the rounding of the weight to single precision and at most five operations,
 // however a set arranges them: such a sum lies within 6 u * 255 H of the exact one. The seven row
 // sums are added to 0.5 by seven fused operations, with rounded weights: at most 8 u * 255 V H more
-// from the terms, and 7 u * 0.5 from the 0.5. Together 14 u * 255 V H + 3.5 u. Calling it 14.5 u *
-// (255 V H + 1) leaves 0.5 u * 255 V H for products of errors and for the rounding of the chain and
-// of this bound itself, which take less than a thousandth of that.
+// from the terms, and 7 u * 0.5 from the 0.5. Together 14 u * 255 V H + 3.5 u. A set may begin with
+// 0 instead and measure from whole numbers: then 0.5 less the distance is off by u / 2, and nothing
+// else by more. Calling it 14.5 u * (255 V H + 1) leaves 0.5 u * 255 V H for products of errors and
+// for the rounding of the chain and of this bound itself, which take less than a thousandth of
+// that.
 #pragma once
 
 #include <string.h>

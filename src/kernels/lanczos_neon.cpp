@@ -12,6 +12,20 @@ namespace {
 
 constexpr int32_t kVectorBytes = 16;
 
+// From 2^23 to 2^24 floats are the whole numbers: in the lowest byte of 2^23, whose topmost byte is
+// the only other one that is not 0, a byte makes 2^23 more than itself. Lookups and subtractions
+// use all vector units of a processor, conversions often one.
+constexpr float kWholes = 8388608.0F;
+constexpr uint8_t kTopOfWholes = 0x4B;
+constexpr uint8_t kTop = 16;  // where the lookup finds it
+constexpr uint8_t k0 = 0xFF;
+constexpr uint8_t kAsWholes[4][kVectorBytes] = {
+    {0, k0, k0, kTop, 1, k0, k0, kTop, 2, k0, k0, kTop, 3, k0, k0, kTop},
+    {4, k0, k0, kTop, 5, k0, k0, kTop, 6, k0, k0, kTop, 7, k0, k0, kTop},
+    {8, k0, k0, kTop, 9, k0, k0, kTop, 10, k0, k0, kTop, 11, k0, k0, kTop},
+    {12, k0, k0, kTop, 13, k0, k0, kTop, 14, k0, k0, kTop, 15, k0, k0, kTop},
+};
+
 // What follows goes through four pixels in step: processors that work in order would wait for each
 // sum to be ready before they add to it.
 
@@ -54,7 +68,7 @@ uint8x16_t narrow(uint32x4_t a, uint32x4_t b, uint32x4_t c, uint32x4_t d) {
 class NeonRows {
 public:
     NeonRows(const float* const* rows, const double* weights, float uncertain)
-        : low_(vdupq_n_f32(0.0F)), high_(low_), uncertain_(vdupq_n_f32(uncertain)) {
+        : low_(vdupq_n_f32(0.0F)), high_(low_), certain_(vdupq_n_f32(0.5F - uncertain)) {
         float floats[kLanczosTaps + 1] = {};
         for (int32_t r = 0; r < kLanczosTaps; ++r) {
             rows_[r] = rows[r];
@@ -78,9 +92,10 @@ public:
 private:
     // Stores four pixels and tells which of them are uncertain.
     uint32x4_t add_group(uint8_t* dst, int32_t x) const {
-        const float32x4_t half = vdupq_n_f32(0.5F);
-        float32x4_t values[kGroup] = {half, half, half, half};
-        add_row<0>(values, rows_[0] + x * kPixel, low_);
+        float32x4_t values[kGroup];
+        for (int32_t k = 0; k < kGroup; ++k) {
+            values[k] = vmulq_laneq_f32(vld1q_f32(rows_[0] + (x + k) * kPixel), low_, 0);
+        }
         add_row<1>(values, rows_[1] + x * kPixel, low_);
         add_row<2>(values, rows_[2] + x * kPixel, low_);
         add_row<3>(values, rows_[3] + x * kPixel, low_);
@@ -88,12 +103,16 @@ private:
         add_row<5>(values, rows_[5] + x * kPixel, high_);
         add_row<6>(values, rows_[6] + x * kPixel, high_);
         // Below and above, results are 0 and 255 anyway, and so are these: far from others.
-        for (float32x4_t& value : values) value = vmaxq_f32(value, half);
-        for (float32x4_t& value : values) value = vminq_f32(value, vdupq_n_f32(255.5F));
-        const auto whole = [&](int32_t i) { return vcvtq_u32_f32(values[i]); };
-        vst1q_u8(dst, narrow(whole(0), whole(1), whole(2), whole(3)));
+        for (float32x4_t& value : values) value = vmaxq_f32(value, vdupq_n_f32(0.0F));
+        for (float32x4_t& value : values) value = vminq_f32(value, vdupq_n_f32(255.0F));
+        // Rounded to whole numbers, which lie in the low bits.
+        const float32x4_t base = vdupq_n_f32(kWholes);
+        const float32x4_t wholes[kGroup] = {vaddq_f32(values[0], base), vaddq_f32(values[1], base),
+                                            vaddq_f32(values[2], base), vaddq_f32(values[3], base)};
+        const auto bits = [&](int32_t i) { return vreinterpretq_u32_f32(wholes[i]); };
+        vst1q_u8(dst, narrow(bits(0), bits(1), bits(2), bits(3)));
         const auto near = [&](int32_t i) {
-            return vcltq_f32(vabdq_f32(values[i], vrndnq_f32(values[i])), uncertain_);
+            return vcgtq_f32(vabdq_f32(values[i], vsubq_f32(wholes[i], base)), certain_);
         };
         return vpmaxq_u32(vpmaxq_u32(near(0), near(1)), vpmaxq_u32(near(2), near(3)));
     }
@@ -101,7 +120,7 @@ private:
     const float* rows_[kLanczosTaps];
     float32x4_t low_;
     float32x4_t high_;
-    float32x4_t uncertain_;
+    float32x4_t certain_;  // the largest distance from a whole number that decides
 };
 
 // The chain of one pixel, two components per vector.
@@ -153,13 +172,12 @@ struct Neon {
 
     static constexpr int32_t kConverted = kVectorBytes;
     static void convert(float* floats, const uint8_t* bytes) {
-        const uint8x16_t sixteen = vld1q_u8(bytes);
-        const uint16x8_t low = vmovl_u8(vget_low_u8(sixteen));
-        const uint16x8_t high = vmovl_high_u8(sixteen);
-        vst1q_f32(floats, vcvtq_f32_u32(vmovl_u16(vget_low_u16(low))));
-        vst1q_f32(floats + 4, vcvtq_f32_u32(vmovl_high_u16(low)));
-        vst1q_f32(floats + 8, vcvtq_f32_u32(vmovl_u16(vget_low_u16(high))));
-        vst1q_f32(floats + 12, vcvtq_f32_u32(vmovl_high_u16(high)));
+        const uint8x16x2_t table = {{vld1q_u8(bytes), vdupq_n_u8(kTopOfWholes)}};
+        const float32x4_t base = vdupq_n_f32(kWholes);
+        for (int32_t k = 0; k < 4; ++k) {
+            const uint8x16_t whole = vqtbl2q_u8(table, vld1q_u8(kAsWholes[k]));
+            vst1q_f32(floats + 4 * k, vsubq_f32(vreinterpretq_f32_u8(whole), base));
+        }
     }
 
     static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,

@@ -3,6 +3,7 @@
 // offsets outside them, or leaves the byte as it is.
 #include <arm_neon.h>
 #include <stddef.h>
+#include <string.h>
 
 #include "kernels/inline.h"
 #include "kernels/quarter_windows_inl.h"
@@ -132,12 +133,71 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
     quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>(),
     quarter_kernels<5>(), quarter_kernels<6>(), quarter_kernels<7>(), quarter_kernels<8>()};
 
+// From this reduction on, windows hold so few taps of samples of four bytes that these are loaded
+// one by one, with the scalar kernels' plan.
+constexpr int32_t kMinWordReduction = 7;
+
+// The left and the right taps of four samples in one row.
+class WordTaps {
+public:
+    OVRIN_ALWAYS_INLINE WordTaps(const uint8_t* row, const Tap* taps)
+        : left_(vdupq_n_u32(0)), right_(left_) {
+        const auto* words = reinterpret_cast<const uint32_t*>(row);
+        load<0>(words, taps);
+        load<1>(words, taps);
+        load<2>(words, taps);
+        load<3>(words, taps);
+    }
+
+    OVRIN_ALWAYS_INLINE uint8x16_t add_quarters_to(uint8x16_t sums) const {
+        sums = vsraq_n_u8(sums, vreinterpretq_u8_u32(left_), 2);
+        return vsraq_n_u8(sums, vreinterpretq_u8_u32(right_), 2);
+    }
+
+private:
+    template <int kLane>
+    OVRIN_ALWAYS_INLINE void load(const uint32_t* words, const Tap* taps) {
+        left_ = vld1q_lane_u32(words + taps[kLane].left, left_, kLane);
+        right_ = vld1q_lane_u32(words + taps[kLane].right, right_, kLane);
+    }
+
+    uint32x4_t left_;
+    uint32x4_t right_;
+};
+
+template <bool kPair>
+OVRIN_ALWAYS_INLINE uint8x16_t gather_words(const QuarterRows& rows, const Tap* taps) {
+    const uint8x16_t sums = WordTaps(rows.top, taps).add_quarters_to(vdupq_n_u8(0));
+    return kPair ? WordTaps(rows.bottom, taps).add_quarters_to(sums) : sums;
+}
+
+template <bool kPair, bool kAdd>
+void run_words(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+    const QuarterRows rows = source;
+    const int32_t samples = plan.samples;
+    int32_t i = 0;
+    for (; i + 4 <= samples; i += 4, dst += kVector) {
+        put<kAdd>(dst, gather_words<kPair>(rows, plan.taps + i));
+    }
+    if (i == samples) return;
+    Tap last[4];
+    for (int32_t k = 0; k < 4; ++k) last[k] = plan.taps[i + k < samples ? i + k : i];
+    put_part<kAdd>(dst, gather_words<kPair>(rows, last), 4 * (samples - i));
+}
+
+constexpr QuarterKernels kWordKernels = {run_words<true, false>, run_words<true, true>,
+                                         run_words<false, true>};
+
 }  // namespace
 
 const QuarterKernels& plan_quarters_neon(QuarterPlan& plan, const QuarterRowShape& shape,
                                          QuarterColumns& columns, int32_t samples) {
     const QuarterKernels* simple = plan_simple_quarters_neon(plan, shape, columns, samples);
     if (simple != nullptr) return *simple;
+    if (shape.sample_bytes == 4 && shape.src_columns / kMinWordReduction >= shape.dst_columns) {
+        plan_quarters_scalar(plan, shape, columns, samples);
+        return kWordKernels;
+    }
     const WindowShape vector = window_shape(shape, kVector, kMaxWindows);
     if (vector.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
     plan_offsets<kVector>(plan, shape, vector, columns, samples);

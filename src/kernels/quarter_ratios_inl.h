@@ -33,6 +33,7 @@ constexpr SimpleRatio kTwoToOne = {2, 1, {{0, 1}}};
 constexpr SimpleRatio kThreeToOne = {3, 1, {{0, 2}}};
 constexpr SimpleRatio kFourToOne = {4, 1, {{1, 3}}};
 constexpr SimpleRatio kThreeToTwo = {3, 2, {{0, 1}, {1, 2}}};
+constexpr SimpleRatio kFourToThree = {4, 3, {{0, 1}, {1, 2}, {3, 3}}};
 constexpr SimpleRatio kTwoToThree = {2, 3, {{0, 0}, {0, 1}, {1, 1}}};
 
 // Whether the columns that come next have these taps: from one group to the next the points move by

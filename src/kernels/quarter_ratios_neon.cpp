@@ -41,6 +41,21 @@ OVRIN_ALWAYS_INLINE uint8x16x3_t load_by_three(const uint8_t* samples) {
 }
 
 template <int N>
+OVRIN_ALWAYS_INLINE uint8x16x4_t load_by_four(const uint8_t* samples) {
+    if constexpr (N == 1) {
+        return vld4q_u8(samples);
+    } else if constexpr (N == 2) {
+        const uint16x8x4_t v = vld4q_u16(reinterpret_cast<const uint16_t*>(samples));
+        return {{vreinterpretq_u8_u16(v.val[0]), vreinterpretq_u8_u16(v.val[1]),
+                 vreinterpretq_u8_u16(v.val[2]), vreinterpretq_u8_u16(v.val[3])}};
+    } else {
+        const uint32x4x4_t v = vld4q_u32(reinterpret_cast<const uint32_t*>(samples));
+        return {{vreinterpretq_u8_u32(v.val[0]), vreinterpretq_u8_u32(v.val[1]),
+                 vreinterpretq_u8_u32(v.val[2]), vreinterpretq_u8_u32(v.val[3])}};
+    }
+}
+
+template <int N>
 OVRIN_ALWAYS_INLINE void store_by_two(uint8_t* dst, uint8x16x2_t samples) {
     if constexpr (N == 1) {
         vst2q_u8(dst, samples);
@@ -99,59 +114,94 @@ OVRIN_ALWAYS_INLINE uint8x16_t add_quarters(uint8x16_t sums, uint8x16_t samples)
     return vsraq_n_u8(sums, samples, 2);
 }
 
+// The quarters of both rows, or of the top one, vector by vector.
+template <bool kPair, class Vectors>
+OVRIN_ALWAYS_INLINE Vectors add_rows(Vectors top, const Vectors& bottom) {
+    for (size_t i = 0; i < sizeof top.val / sizeof top.val[0]; ++i) {
+        top.val[i] = quarters(top.val[i]);
+        if (kPair) top.val[i] = add_quarters(top.val[i], bottom.val[i]);
+    }
+    return top;
+}
+
+// The same of 16 bytes in memory.
+template <bool kPair>
+OVRIN_ALWAYS_INLINE uint8x16_t load_quarters(const uint8_t* top, const uint8_t* bottom) {
+    const uint8x16_t sums = quarters(vld1q_u8(top));
+    return kPair ? add_quarters(sums, vld1q_u8(bottom)) : sums;
+}
+
+// The same for both rows without adding shifts: large processors shift in only one of their vector
+// units, so what makes one vector of four this way takes less time.
+OVRIN_ALWAYS_INLINE uint8x16_t load_halved(const uint8_t* top, const uint8_t* bottom) {
+    const uint8x16_t high_bits = vdupq_n_u8(0xFC);
+    const uint8x16_t twice =
+        vhaddq_u8(vandq_u8(vld1q_u8(top), high_bits), vandq_u8(vld1q_u8(bottom), high_bits));
+    return vshrq_n_u8(twice, 1);
+}
+
+// Makes two groups of vectors before it stores either.
+template <class Pattern>
+struct TwoInStep {
+    template <bool kPair>
+    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
+        constexpr ptrdiff_t kHalf = Pattern::kDstBytes / 2;
+        constexpr ptrdiff_t kHalfSrc = src_bytes<Pattern>(kHalf);
+        const auto first = Pattern::template make<kPair>(top, bottom);
+        const auto second = Pattern::template make<kPair>(top + kHalfSrc, bottom + kHalfSrc);
+        Pattern::put(dst, first);
+        Pattern::put(dst + kHalf, second);
+    }
+
+    static OVRIN_ALWAYS_INLINE void put(uint8_t* dst, uint8x16_t samples) {
+        vst1q_u8(dst, samples);
+    }
+};
+
+// Neighbouring bytes are added after the rows are.
+struct BytesTwoToOne : TwoInStep<BytesTwoToOne> {
+    static constexpr SimpleRatio kRatio = kTwoToOne;
+    static constexpr int32_t kSampleBytes = 1;
+    static constexpr int32_t kDstBytes = 64;
+
+    template <bool kPair>
+    static OVRIN_ALWAYS_INLINE uint8x16x2_t make(const uint8_t* top, const uint8_t* bottom) {
+        const auto load = [&](int32_t i) { return load_quarters<kPair>(top + i, bottom + i); };
+        const uint8x16_t last = kPair ? load_halved(top + 48, bottom + 48) : load(48);
+        return {{vpaddq_u8(load(0), load(16)), vpaddq_u8(load(32), last)}};
+    }
+
+    static OVRIN_ALWAYS_INLINE void put(uint8_t* dst, uint8x16x2_t samples) {
+        vst1q_u8(dst, samples.val[0]);
+        vst1q_u8(dst + 16, samples.val[1]);
+    }
+};
+
 template <int N>
-struct TwoToOne {
+struct TwoToOne : TwoInStep<TwoToOne<N>> {
     static constexpr SimpleRatio kRatio = kTwoToOne;
     static constexpr int32_t kSampleBytes = N;
     static constexpr int32_t kDstBytes = 32;
 
     template <bool kPair>
-    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16_t first = reduce<kPair>(top, bottom);
-        const uint8x16_t second = reduce<kPair>(top + 32, bottom + 32);
-        vst1q_u8(dst, first);
-        vst1q_u8(dst + 16, second);
-    }
-
-    template <bool kPair>
-    static OVRIN_ALWAYS_INLINE uint8x16_t reduce(const uint8_t* top, const uint8_t* bottom) {
-        if constexpr (N == 1) {
-            uint8x16_t a = quarters(vld1q_u8(top));
-            uint8x16_t b = quarters(vld1q_u8(top + 16));
-            if constexpr (kPair) {
-                a = add_quarters(a, vld1q_u8(bottom));
-                b = add_quarters(b, vld1q_u8(bottom + 16));
-            }
-            return vpaddq_u8(a, b);
-        } else {
-            const uint8x16x2_t upper = load_by_two<N>(top);
-            uint8x16_t sums = add_quarters(quarters(upper.val[0]), upper.val[1]);
-            if constexpr (kPair) {
-                const uint8x16x2_t lower = load_by_two<N>(bottom);
-                sums = add_quarters(add_quarters(sums, lower.val[0]), lower.val[1]);
-            }
-            return sums;
-        }
+    static OVRIN_ALWAYS_INLINE uint8x16_t make(const uint8_t* top, const uint8_t* bottom) {
+        const uint8x16x2_t upper = load_by_two<N>(top);
+        const uint8x16_t sums = add_quarters(quarters(upper.val[0]), upper.val[1]);
+        if (!kPair) return sums;
+        const uint8x16x2_t lower = load_by_two<N>(bottom);
+        return add_quarters(add_quarters(sums, lower.val[0]), lower.val[1]);
     }
 };
 
 // Only the second of every two samples counts; the others are left out before anything is shifted.
 template <int N>
-struct FourToOne {
+struct FourToOne : TwoInStep<FourToOne<N>> {
     static constexpr SimpleRatio kRatio = kFourToOne;
     static constexpr int32_t kSampleBytes = N;
     static constexpr int32_t kDstBytes = 32;
 
     template <bool kPair>
-    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16_t first = reduce<kPair>(top, bottom);
-        const uint8x16_t second = reduce<kPair>(top + 64, bottom + 64);
-        vst1q_u8(dst, first);
-        vst1q_u8(dst + 16, second);
-    }
-
-    template <bool kPair>
-    static OVRIN_ALWAYS_INLINE uint8x16_t reduce(const uint8_t* top, const uint8_t* bottom) {
+    static OVRIN_ALWAYS_INLINE uint8x16_t make(const uint8_t* top, const uint8_t* bottom) {
         uint8x16_t a = quarters(odd_samples(top));
         uint8x16_t b = quarters(odd_samples(top + 32));
         if constexpr (kPair) {
@@ -168,86 +218,71 @@ struct FourToOne {
 };
 
 template <int N>
-struct ThreeToOne {
+struct ThreeToOne : TwoInStep<ThreeToOne<N>> {
     static constexpr SimpleRatio kRatio = kThreeToOne;
     static constexpr int32_t kSampleBytes = N;
     static constexpr int32_t kDstBytes = 32;
 
     template <bool kPair>
-    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16_t first = reduce<kPair>(top, bottom);
-        const uint8x16_t second = reduce<kPair>(top + 48, bottom + 48);
-        vst1q_u8(dst, first);
-        vst1q_u8(dst + 16, second);
-    }
-
-    template <bool kPair>
-    static OVRIN_ALWAYS_INLINE uint8x16_t reduce(const uint8_t* top, const uint8_t* bottom) {
+    static OVRIN_ALWAYS_INLINE uint8x16_t make(const uint8_t* top, const uint8_t* bottom) {
         const uint8x16x3_t upper = load_by_three<N>(top);
-        uint8x16_t sums = add_quarters(quarters(upper.val[0]), upper.val[2]);
-        if constexpr (kPair) {
-            const uint8x16x3_t lower = load_by_three<N>(bottom);
-            sums = add_quarters(add_quarters(sums, lower.val[0]), lower.val[2]);
-        }
-        return sums;
+        const uint8x16_t sums = add_quarters(quarters(upper.val[0]), upper.val[2]);
+        if (!kPair) return sums;
+        const uint8x16x3_t lower = load_by_three<N>(bottom);
+        return add_quarters(add_quarters(sums, lower.val[0]), lower.val[2]);
     }
 };
 
 template <int N>
-struct ThreeToTwo {
+struct ThreeToTwo : TwoInStep<ThreeToTwo<N>> {
     static constexpr SimpleRatio kRatio = kThreeToTwo;
     static constexpr int32_t kSampleBytes = N;
     static constexpr int32_t kDstBytes = 64;
 
     template <bool kPair>
-    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16x2_t first = reduce<kPair>(top, bottom);
-        const uint8x16x2_t second = reduce<kPair>(top + 48, bottom + 48);
-        store_by_two<N>(dst, first);
-        store_by_two<N>(dst + 32, second);
+    static OVRIN_ALWAYS_INLINE uint8x16x2_t make(const uint8_t* top, const uint8_t* bottom) {
+        const uint8x16x3_t sums = add_rows<kPair>(load_by_three<N>(top), load_by_three<N>(bottom));
+        return {{vaddq_u8(sums.val[0], sums.val[1]), vaddq_u8(sums.val[1], sums.val[2])}};
     }
 
-    template <bool kPair>
-    static OVRIN_ALWAYS_INLINE uint8x16x2_t reduce(const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16x3_t upper = load_by_three<N>(top);
-        uint8x16_t left = quarters(upper.val[0]);
-        uint8x16_t middle = quarters(upper.val[1]);
-        uint8x16_t right = quarters(upper.val[2]);
-        if constexpr (kPair) {
-            const uint8x16x3_t lower = load_by_three<N>(bottom);
-            left = add_quarters(left, lower.val[0]);
-            middle = add_quarters(middle, lower.val[1]);
-            right = add_quarters(right, lower.val[2]);
-        }
-        return {{vaddq_u8(left, middle), vaddq_u8(middle, right)}};
+    static OVRIN_ALWAYS_INLINE void put(uint8_t* dst, uint8x16x2_t samples) {
+        store_by_two<N>(dst, samples);
     }
 };
 
 template <int N>
-struct TwoToThree {
+struct FourToThree : TwoInStep<FourToThree<N>> {
+    static constexpr SimpleRatio kRatio = kFourToThree;
+    static constexpr int32_t kSampleBytes = N;
+    static constexpr int32_t kDstBytes = 96;
+
+    template <bool kPair>
+    static OVRIN_ALWAYS_INLINE uint8x16x3_t make(const uint8_t* top, const uint8_t* bottom) {
+        const uint8x16x4_t sums = add_rows<kPair>(load_by_four<N>(top), load_by_four<N>(bottom));
+        return {{vaddq_u8(sums.val[0], sums.val[1]), vaddq_u8(sums.val[1], sums.val[2]),
+                 vaddq_u8(sums.val[3], sums.val[3])}};
+    }
+
+    static OVRIN_ALWAYS_INLINE void put(uint8_t* dst, uint8x16x3_t samples) {
+        store_by_three<N>(dst, samples);
+    }
+};
+
+template <int N>
+struct TwoToThree : TwoInStep<TwoToThree<N>> {
     static constexpr SimpleRatio kRatio = kTwoToThree;
     static constexpr int32_t kSampleBytes = N;
     static constexpr int32_t kDstBytes = 96;
 
     template <bool kPair>
-    static OVRIN_ALWAYS_INLINE void store(uint8_t* dst, const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16x3_t first = enlarge<kPair>(top, bottom);
-        const uint8x16x3_t second = enlarge<kPair>(top + 32, bottom + 32);
-        store_by_three<N>(dst, first);
-        store_by_three<N>(dst + 48, second);
+    static OVRIN_ALWAYS_INLINE uint8x16x3_t make(const uint8_t* top, const uint8_t* bottom) {
+        const uint8x16x2_t sums = add_rows<kPair>(load_by_two<N>(top), load_by_two<N>(bottom));
+        return {{vaddq_u8(sums.val[0], sums.val[0]), vaddq_u8(sums.val[0], sums.val[1]),
+                 vaddq_u8(sums.val[1], sums.val[1])}};
     }
 
-    template <bool kPair>
-    static OVRIN_ALWAYS_INLINE uint8x16x3_t enlarge(const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16x2_t upper = load_by_two<N>(top);
-        uint8x16_t left = quarters(upper.val[0]);
-        uint8x16_t right = quarters(upper.val[1]);
-        if constexpr (kPair) {
-            const uint8x16x2_t lower = load_by_two<N>(bottom);
-            left = add_quarters(left, lower.val[0]);
-            right = add_quarters(right, lower.val[1]);
-        }
-        return {{vaddq_u8(left, left), vaddq_u8(left, right), vaddq_u8(right, right)}};
+    static OVRIN_ALWAYS_INLINE void put(uint8_t* dst, uint8x16x3_t samples) {
+        store_by_three<N>(dst, samples);
     }
 };
 
@@ -255,10 +290,11 @@ struct TwoToThree {
 
 const QuarterKernels* plan_simple_quarters_neon(QuarterPlan& plan, const QuarterRowShape& shape,
                                                 QuarterColumns& columns, int32_t samples) {
-    return plan_patterns<TwoToOne<1>, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
+    return plan_patterns<BytesTwoToOne, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
                          ThreeToTwo<4>, FourToOne<1>, FourToOne<2>, FourToOne<4>, ThreeToOne<1>,
-                         ThreeToOne<2>, ThreeToOne<4>, TwoToThree<1>, TwoToThree<2>, TwoToThree<4>>(
-        plan, shape, columns, samples);
+                         ThreeToOne<2>, ThreeToOne<4>, TwoToThree<1>, TwoToThree<2>, TwoToThree<4>,
+                         FourToThree<1>, FourToThree<2>, FourToThree<4>>(plan, shape, columns,
+                                                                         samples);
 }
 
 }  // namespace ovrin

@@ -61,7 +61,7 @@ size_t row_bytes(const BilinearColumns& columns) {
     return static_cast<size_t>((last + columns.to_right + 1) * columns.sample_bytes);
 }
 
-// The sums of both rows as columns may give them.
+// The sums of a row as columns may give them.
 void fill_sums(BilinearSums& sums, Random& random) {
     for (uint32_t& value : sums.values) {
         const int32_t left = random.pick({0, 255, random.between(0, 255)});
@@ -71,13 +71,20 @@ void fill_sums(BilinearSums& sums, Random& random) {
     }
 }
 
+// The same as a set shifts them.
+std::unique_ptr<BilinearSums> shifted(const BilinearSums& sums, int32_t shift) {
+    auto result = std::make_unique<BilinearSums>(sums);
+    for (uint32_t& value : result->values) value <<= shift;
+    return result;
+}
+
 ::testing::AssertionResult same_sums(const BilinearSums& actual, const BilinearSums& expected,
-                                     int32_t count) {
+                                     int32_t count, int32_t shift) {
     for (int32_t i = 0; i < count; ++i) {
-        if (actual.values[i] != expected.values[i]) {
-            return ::testing::AssertionFailure()
-                   << "sum " << i << " of " << count << " is " << actual.values[i] << ", not "
-                   << expected.values[i];
+        const uint32_t sum = expected.values[i] << shift;
+        if (actual.values[i] != sum) {
+            return ::testing::AssertionFailure() << "sum " << i << " of " << count << " is "
+                                                 << actual.values[i] << ", not " << sum;
         }
     }
     return ::testing::AssertionSuccess();
@@ -101,14 +108,14 @@ TEST_F(BilinearKernelsTest, AcrossEqualsTheScalarOne) {
             fill_columns(*columns, random.pick({1, 2, 4}), quarters, random);
             SCOPED_TRACE(describe(set, "across", *columns, quarters));
             BilinearAcross* scalar = scalar_kernels.plan_bilinear(*scalar_plan, *columns).across;
-            BilinearAcross* tested = set.kernels->plan_bilinear(*plan, *columns).across;
-            own += tested != scalar;
+            const BilinearKernels tested = set.kernels->plan_bilinear(*plan, *columns);
+            own += tested.across != scalar;
             const GuardedBuffer<uint8_t> row(
                 content(random, kContents[random.between(0, 3)], row_bytes(*columns)),
                 random.pick({Flush::kEnd, Flush::kStart}));
             scalar(*expected, row.data(), *scalar_plan);
-            tested(*actual, row.data(), *plan);
-            EXPECT_TRUE(same_sums(*actual, *expected, plan->bytes()));
+            tested.across(*actual, row.data(), *plan);
+            EXPECT_TRUE(same_sums(*actual, *expected, plan->bytes(), tested.sum_shift));
         }
         // Otherwise only scalar kernels would have been compared with themselves.
         EXPECT_GT(own, count / 8) << set.name;
@@ -132,8 +139,8 @@ TEST_F(BilinearKernelsTest, DownEqualsTheScalarOne) {
             const int32_t weight = any_weight(random);
             SCOPED_TRACE(describe(set, "down", *columns, quarters) << ", weight " << weight);
             BilinearDown* scalar = scalar_kernels.plan_bilinear(*scalar_plan, *columns).down;
-            BilinearDown* tested = set.kernels->plan_bilinear(*plan, *columns).down;
-            own += tested != scalar;
+            const BilinearKernels tested = set.kernels->plan_bilinear(*plan, *columns);
+            own += tested.down != scalar;
             fill_sums(*upper, random);
             fill_sums(*lower, random);
             std::vector<uint8_t> expected(static_cast<size_t>(plan->bytes()));
@@ -141,7 +148,8 @@ TEST_F(BilinearKernelsTest, DownEqualsTheScalarOne) {
                                           random.pick({Flush::kEnd, Flush::kStart}), 0xEE);
             const BilinearNext next = {{actual.data(), expected.data()}, random.between(0, 5000)};
             scalar(expected.data(), *upper, *lower, weight, *scalar_plan, next);
-            tested(actual.data(), *upper, *lower, weight, *plan, next);
+            tested.down(actual.data(), *shifted(*upper, tested.sum_shift),
+                        *shifted(*lower, tested.sum_shift), weight, *plan, next);
             EXPECT_TRUE(same_bytes(actual.data(), expected.data(), expected.size()));
             EXPECT_TRUE(actual.intact());
         }

@@ -128,6 +128,7 @@ std::vector<SimpleRatio> simple_ratios(const NamedKernels& set) {
             all.push_back({"avx2", n, ratio});
             if (n != 3) all.push_back({"neon", n, ratio});
         }
+        if (n != 3) all.push_back({"neon", n, {4, 3}});
     }
     std::vector<SimpleRatio> of_set;
     std::copy_if(all.begin(), all.end(), std::back_inserter(of_set),
@@ -203,7 +204,8 @@ TEST_F(VectorQuarterKernels, SimpleRatiosHaveKernelsOfTheirOwn) {
 // Pixels that lie far apart are loaded one by one.
 TEST_F(VectorQuarterKernels, StrongReductionsHaveKernelsOfTheirOwn) {
     for (const NamedKernels& set : vector_sets_) {
-        if (std::string_view(set.name) != "avx2") continue;
+        const std::string_view name = set.name;
+        if (name != "avx2" && name != "neon") continue;
         Random random(36);
         const auto kernels_of = [](const Kernels& kernels, const Row& row) {
             return plan_with(kernels, row, 0, row.dst_columns)->kernels;
