@@ -51,6 +51,7 @@ model() {
 print_loops() { # COMPILER
     local loop bytes stack name processor
     for loop in "$work/loops"/*; do
+        [[ -e $loop ]] || return 0
         IFS=. read -r _ bytes stack <<<"${loop##*/}"
         name=$(head -n 1 "$loop" | cut -c4- | c++filt |
             sed 's/(anonymous namespace):://g; s/ovrin:://g; s/^void //; s/(.*//')

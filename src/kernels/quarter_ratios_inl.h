@@ -62,6 +62,14 @@ constexpr ptrdiff_t src_bytes(ptrdiff_t dst_bytes) {
     return dst_bytes / Pattern::kRatio.dst * Pattern::kRatio.src;
 }
 
+// A single row stands for both.
+template <bool kPair>
+QuarterRows from_byte(const QuarterRows& rows, ptrdiff_t first) {
+    const uint8_t* const top = rows.top + first;
+    if (!kPair) return {top, top, rows.next_top + first, rows.next_top + first};
+    return {top, rows.bottom + first, rows.next_top + first, rows.next_bottom + first};
+}
+
 template <class Pattern, bool kPair>
 OVRIN_ALWAYS_INLINE void fetch_next(const QuarterRows& rows, ptrdiff_t offset) {
     constexpr ptrdiff_t kCacheLine = 64;
@@ -94,28 +102,28 @@ OVRIN_ALWAYS_INLINE void make_through_copy(uint8_t* dst, const uint8_t* top, con
 template <class Pattern, bool kPair, bool kAdd>
 void run_pattern(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
     constexpr ptrdiff_t kStep = Pattern::kDstBytes;
-    const QuarterRows rows = source;
+    const QuarterRows rows = from_byte<kPair>(source, plan.first_byte);
     const ptrdiff_t bytes = ptrdiff_t{plan.samples} * Pattern::kSampleBytes;
     const ptrdiff_t last = bytes - kStep;
-    const uint8_t* top = rows.top + plan.first_byte;
-    const uint8_t* bottom = kPair ? rows.bottom + plan.first_byte : top;
     ptrdiff_t done = 0;
     if (!kAdd) {
         for (ptrdiff_t offset = 0; done <= last - kOverrun<Pattern>; done += kStep) {
-            fetch_next<Pattern, kPair>(rows, plan.first_byte + offset);
-            Pattern::template store<kPair>(dst + done, top + offset, bottom + offset);
+            fetch_next<Pattern, kPair>(rows, offset);
+            Pattern::template store<kPair>(dst + done, rows.top + offset, rows.bottom + offset);
             offset += src_bytes<Pattern>(kStep);
         }
         if (done < bytes && kOverrun<Pattern> == 0) {
             const ptrdiff_t offset = src_bytes<Pattern>(last);
-            return Pattern::template store<kPair>(dst + last, top + offset, bottom + offset);
+            return Pattern::template store<kPair>(dst + last, rows.top + offset,
+                                                  rows.bottom + offset);
         }
     }
     for (; done < bytes; done += kStep) {
         const ptrdiff_t at = done < last ? done : last;
         const ptrdiff_t offset = src_bytes<Pattern>(at);
-        fetch_next<Pattern, kPair>(rows, plan.first_byte + offset);
-        make_through_copy<Pattern, kPair, kAdd>(dst + at, top + offset, bottom + offset, done - at);
+        fetch_next<Pattern, kPair>(rows, offset);
+        make_through_copy<Pattern, kPair, kAdd>(dst + at, rows.top + offset, rows.bottom + offset,
+                                                done - at);
     }
 }
 
