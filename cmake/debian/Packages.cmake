@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: Apache-2.0
-# Debian packages by CPack: the library, what programs are compiled with, and the tool. For a build
-# whose folders are Debian's, which the preset "deb" sets.
+# Debian packages by CPack: the library, what programs are compiled with, the tool, and the Python
+# package. For a build whose folders are Debian's, which the preset "deb" sets.
 set(library_package libovrinresize${PROJECT_VERSION_MAJOR})
 # Debian's own packages of this version would begin with 1, and replace these.
 set(CPACK_DEBIAN_PACKAGE_VERSION ${PROJECT_VERSION})
@@ -16,7 +16,7 @@ set(CPACK_PACKAGE_DIRECTORY ${PROJECT_BINARY_DIR}/packages)
 set(CPACK_GENERATOR DEB)
 set(CPACK_DEB_COMPONENT_INSTALL ON)
 set(CPACK_COMPONENTS_GROUPING ONE_PER_GROUP)
-set(CPACK_COMPONENTS_ALL runtime development tool)
+set(CPACK_COMPONENTS_ALL runtime development tool python)
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_SOURCE ovrinresize)
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
@@ -48,12 +48,31 @@ PPM, Y4M video and raw frames with the resamplers of libovrinresize. It turns
 photographs upright, keeps their colour profile and metadata, and takes many
 files at once.")
 
+# Its module is of one version of the interpreter, and has the library in it.
+set(CPACK_DEBIAN_PYTHON_PACKAGE_NAME python3-ovrinresize)
+set(CPACK_DEBIAN_PYTHON_PACKAGE_SECTION python)
+set(CPACK_DEBIAN_PYTHON_PACKAGE_SHLIBDEPS ON)
+find_package(Python REQUIRED COMPONENTS Interpreter)
+math(EXPR next_minor "${Python_VERSION_MINOR} + 1")
+set(CPACK_DEBIAN_PYTHON_PACKAGE_DEPENDS "python3-numpy, python3 (<< 3.${next_minor}), \
+python3 (>= 3.${Python_VERSION_MINOR}~)")
+set(CPACK_DEBIAN_PYTHON_PACKAGE_CONTROL_EXTRA
+  ${CMAKE_CURRENT_LIST_DIR}/python/postinst ${CMAKE_CURRENT_LIST_DIR}/python/prerm)
+set(CPACK_COMPONENT_PYTHON_DESCRIPTION "resizing of raw pictures in memory - Python 3
+This package has the module ovrinresize, which resizes pictures in numpy arrays
+with the resamplers of libovrinresize: RGBA, RGB, I420 and NV21. It checks all
+that it is given, and releases the interpreter's lock while it works.")
+install(TARGETS ovrinresize_python
+  LIBRARY DESTINATION lib/python3/dist-packages/ovrinresize COMPONENT python)
+install(DIRECTORY bindings/python/src/ovrinresize DESTINATION lib/python3/dist-packages
+  COMPONENT python PATTERN __pycache__ EXCLUDE)
+
 # What a program needs that was linked with this library.
 file(WRITE ${PROJECT_BINARY_DIR}/debian/shlibs
   "libovrinresize ${PROJECT_VERSION_MAJOR} ${library_package} (>= ${PROJECT_VERSION})\n")
 string(TIMESTAMP debian_date "%a, %d %b %Y %H:%M:%S +0000" UTC)
 configure_file(${CMAKE_CURRENT_LIST_DIR}/changelog.in ${PROJECT_BINARY_DIR}/debian/changelog @ONLY)
-foreach(component RUNTIME DEVELOPMENT TOOL)
+foreach(component RUNTIME DEVELOPMENT TOOL PYTHON)
   string(TOLOWER ${component} name)
   set(folder ${CMAKE_INSTALL_DATADIR}/doc/${CPACK_DEBIAN_${component}_PACKAGE_NAME})
   install(FILES ${CMAKE_CURRENT_LIST_DIR}/copyright DESTINATION ${folder} COMPONENT ${name})

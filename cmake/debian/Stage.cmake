@@ -15,9 +15,10 @@ execute_process(COMMAND gzip -9n ${texts} COMMAND_ERROR_IS_FATAL ANY)
 # As Debian strips: what is linked at run time of all that it does without, the static library of
 # debug information only.
 file(GLOB library ${stage}/runtime/usr/lib/*/libovrinresize.so.*.*)
+file(GLOB module ${stage}/python/usr/lib/python3/dist-packages/ovrinresize/_native.*.so)
 file(GLOB static_library ${stage}/development/usr/lib/*/libovrinresize.a)
 execute_process(COMMAND strip --strip-unneeded --remove-section=.comment --remove-section=.note
-  ${library} ${stage}/tool/usr/bin/ovrinresize COMMAND_ERROR_IS_FATAL ANY)
+  ${library} ${module} ${stage}/tool/usr/bin/ovrinresize COMMAND_ERROR_IS_FATAL ANY)
 execute_process(COMMAND strip --strip-debug --remove-section=.comment --remove-section=.note
   --enable-deterministic-archives ${static_library} COMMAND_ERROR_IS_FATAL ANY)
 

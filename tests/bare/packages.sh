@@ -5,7 +5,7 @@
 set -euo pipefail
 packages=$1
 here=$(dirname "${BASH_SOURCE[0]}")
-names=(libovrinresize1 libovrinresize-dev ovrinresize)
+names=(libovrinresize1 libovrinresize-dev ovrinresize python3-ovrinresize)
 
 files() {
     find / -xdev \( -path /proc -o -path /var/log -o -path /var/cache -o -path /root -o -path /tmp \) -prune -o -print | sort
@@ -31,6 +31,9 @@ ovrinresize /tmp/in.ppm /tmp/out.ppm --size 2x1
 cmp <(head -c 11 /tmp/out.ppm) <(printf 'P6\n2 1\n255\n')
 man ovrinresize >/tmp/page
 grep -A 1 "^NAME" /tmp/page
+python3 -c "
+import numpy, ovrinresize
+assert ovrinresize.resize(numpy.full((4, 8, 4), 255, numpy.uint8), (4, 2)).tolist() == [[[252] * 4] * 4] * 2"
 test -e /usr/share/bash-completion/completions/ovrinresize
 
 # What came with them, and only that, goes with them.

@@ -9,16 +9,16 @@ packages=$1
 multiarch=$(dpkg-architecture -q DEB_HOST_MULTIARCH)
 version=$(dpkg-deb -f "$packages"/libovrinresize-dev_*.deb Version)
 version=${version%-*}
-names=("libovrinresize${version%%.*}" libovrinresize-dev ovrinresize)
+names=("libovrinresize${version%%.*}" libovrinresize-dev ovrinresize python3-ovrinresize)
 
 fail() {
     echo "FAIL: $*"
     exit 1
 }
 
-# The root has nothing but these packages.
+# The root has nothing but these packages, and so nothing that their scripts could run in it.
 dpkg_in_root() {
-    fakeroot dpkg --root="$root" --log=/dev/null --force-depends --force-bad-path "$@"
+    fakeroot dpkg --root="$root" --log=/dev/null --force-depends --force-bad-path --force-script-chrootless "$@"
 }
 
 # holds PACKAGE FILE...
@@ -40,8 +40,9 @@ holds libovrinresize-dev /usr/include/ovrinresize.h{,pp} \
 holds ovrinresize /usr/bin/ovrinresize /usr/share/man/man1/ovrinresize.1.gz \
     /usr/share/{bash-completion/completions/ovrinresize,zsh/vendor-completions/_ovrinresize} \
     /usr/share/fish/vendor_completions.d/ovrinresize.fish
+holds python3-ovrinresize /usr/lib/python3/dist-packages/ovrinresize/{__init__.py,_native.pyi,py.typed}
 
-root=$packages/root
+root=$(realpath "$packages")/root
 rm -rf "$root"
 mkdir -p "$root/var/lib/dpkg/"{info,updates}
 touch "$root/var/lib/dpkg/"{status,available}
@@ -57,6 +58,9 @@ gcc -Wall -Wextra -Werror "$here/consumer/consumer.c" -o "$packages/consumer" $f
 ldd "$packages/consumer" | grep -q "$root" || fail "the program takes another library"
 "$packages/consumer"
 "$root/usr/bin/ovrinresize" --version
+PYTHONDONTWRITEBYTECODE=1 PYTHONPATH=$root/usr/lib/python3/dist-packages /usr/bin/python3 -c "
+import numpy, ovrinresize
+print('Python:', ovrinresize.resize(numpy.zeros((4, 8, 4), numpy.uint8), (4, 2)).shape, ovrinresize.__file__)"
 
 dpkg_in_root --purge "${names[@]}" >"$packages/purge.log" 2>&1 || fail "dpkg: $(<"$packages/purge.log")"
 left=$(find "$root" -path '*/var/lib/dpkg' -prune -o -name '*ovrinresize*' -print)
