@@ -117,7 +117,8 @@ OVRIN_ALWAYS_INLINE uint8x16_t add_quarters(uint8x16_t sums, uint8x16_t samples)
 // The quarters of both rows, or of the top one, vector by vector.
 template <bool kPair, class Vectors>
 OVRIN_ALWAYS_INLINE Vectors add_rows(Vectors top, const Vectors& bottom) {
-    for (size_t i = 0; i < sizeof top.val / sizeof top.val[0]; ++i) {
+    constexpr size_t kVectors = sizeof(Vectors) / sizeof(uint8x16_t);
+    for (size_t i = 0; i < kVectors; ++i) {
         top.val[i] = quarters(top.val[i]);
         if (kPair) top.val[i] = add_quarters(top.val[i], bottom.val[i]);
     }
