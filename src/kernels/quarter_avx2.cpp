@@ -29,8 +29,10 @@ constexpr int32_t window_bytes(Reach reach) {
 }
 
 // The windows of a vector: one for each lane, or for each half of one.
+constexpr int32_t kMostWindows = 4;
+
 constexpr int32_t window_count(Reach reach) {
-    return reach == Reach::kFar ? 4 : 2;
+    return reach == Reach::kFar ? kMostWindows : 2;
 }
 
 constexpr int32_t mask_count(Reach reach) {
@@ -39,8 +41,8 @@ constexpr int32_t mask_count(Reach reach) {
 
 // Storage of a plan, for every destination vector.
 struct WindowsEntry {
-    int32_t bases[4];  // first bytes of the windows within a row
-    int32_t masks;     // where in the plan the vector's masks lie
+    int32_t bases[kMostWindows];  // first bytes of the windows within a row
+    int32_t masks;                // where in the plan the vector's masks lie
 
     bool move(int64_t bytes, int32_t last_base) {
         for (const int32_t base : bases) {
@@ -116,6 +118,8 @@ void encode(uint8_t* masks, WindowsEntry& entry, const Tap* taps, int32_t count,
         rights.store(masks + (2 * w + 1) * kVector, 0);
         rights.store(masks + (2 * w + 1) * kVector + kLane, kLane);
     }
+    // Those that a vector of this reach has not move along with it, too.
+    for (int32_t w = window_count(kReach); w < kMostWindows; ++w) entry.bases[w] = entry.bases[0];
 }
 
 OVRIN_ALWAYS_INLINE __m256i load_window(const uint8_t* window) {
