@@ -7,6 +7,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
+#include <functional>
 #include <memory>
 #include <optional>
 
@@ -15,9 +16,15 @@
 
 namespace tool {
 
+// Hears from PNG and JPEG which part of a picture they have read or written, 0 to 1. It must not
+// throw: it is called from C.
+using Listener = std::function<void(double part)>;
+
 bool is_png(const uint8_t* data, size_t size);
-Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata);
-void encode_png(const Picture& picture, const Metadata& metadata, FILE* out);
+Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata,
+                   const Listener& listener = {});
+void encode_png(const Picture& picture, const Metadata& metadata, FILE* out,
+                const Listener& listener = {});
 
 bool is_jpeg(const uint8_t* data, size_t size);
 
@@ -42,7 +49,7 @@ public:
     std::optional<PixelFormat> planes(int32_t reduction) const;
 
     // Once. A file that ends early gives a picture all the same; the metadata says so then.
-    Picture read(const Decoding& decoding);
+    Picture read(const Decoding& decoding, const Listener& listener = {});
 
 private:
     struct Decoder;
@@ -56,7 +63,8 @@ private:
 Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata);
 // A picture in I420 or gray is written without a trip through RGB. quality: 1 to 100. Alpha is
 // dropped.
-void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out);
+void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out,
+                 const Listener& listener = {});
 
 // PBM, PGM, PPM (P1 to P6) and PAM (P7), which hold no metadata. Of several pictures the first.
 bool is_pnm(const uint8_t* data, size_t size);

@@ -65,8 +65,9 @@ std::optional<Color> canvas_of(const Options& options, PixelFormat format) {
     return is_limited ? options.background.value_or(kBlack) : options.background;
 }
 
-SinkSettings settings_of(const Options& options, const Source& source, const Placement& placement) {
-    SinkSettings settings = {resized_header(source, placement), {}, options.quality};
+SinkSettings settings_of(const Options& options, const Source& source, const Placement& placement,
+                         const Listener& listener) {
+    SinkSettings settings = {resized_header(source, placement), {}, options.quality, listener};
     if (!options.strip) {
         settings.metadata = resized_metadata(source.metadata(), placement.result, options.rotate);
     }
@@ -161,8 +162,13 @@ void judge_damage(const Options& options, const std::string& damage) {
 }  // namespace
 
 void run(const Options& options) {
-    const auto source =
-        concerning(options.in, [&] { return open_source(options.in, raw_layout(options)); });
+    Progress progress(options.shows_progress && !options.quiet, "frames");
+    const auto step = [&progress](const char* name) {
+        return [&progress, name](double part) { progress.update_step(name, part); };
+    };
+    const auto source = concerning(
+        options.in, [&] { return open_source(options.in, raw_layout(options), step("reading")); });
+    progress.hide();
     if (!options.quiet && !source->remark().empty()) {
         say((options.in + ": " + source->remark()).c_str());
     }
@@ -183,7 +189,7 @@ void run(const Options& options) {
                     canvas_of(options, format),
                     options.premultiply,
                     is_image_file(source->kind())};
-    const SinkSettings settings = settings_of(options, *source, placement);
+    const SinkSettings settings = settings_of(options, *source, placement, step("writing"));
     choose_decoding(options, settings.metadata, source.get(), &how, &out_kind);
 
     OutputFile file(options.out);
@@ -192,18 +198,19 @@ void run(const Options& options) {
     Picture result;
     Stopwatch resizing;
     int64_t frames = 0;
-    {
-        Progress progress(options.shows_progress && !options.quiet, "frames");
-        const auto next = [&] { return source->next(&frame); };
-        for (int64_t number = 1; number <= options.frames.last && concerning(options.in, next);
-             ++number) {
-            judge_damage(options, source->metadata().damage);
-            if (number < options.frames.first) continue;
-            concerning(options.in, [&] { resizing.time([&] { resize(how, &frame, &result); }); });
-            concerning(options.out, [&] { sink.write(result); });
-            progress.update(++frames, source->part_read());
-        }
+    const auto next = [&] { return source->next(&frame); };
+    for (int64_t number = 1; number <= options.frames.last && concerning(options.in, next);
+         ++number) {
+        const std::string& damage = source->metadata().damage;
+        if (!damage.empty()) progress.hide();
+        judge_damage(options, damage);
+        if (number < options.frames.first) continue;
+        concerning(options.in, [&] { resizing.time([&] { resize(how, &frame, &result); }); });
+        concerning(options.out, [&] { sink.write(result); });
+        ++frames;
+        if (!is_image_file(source->kind())) progress.update(frames, source->part_read());
     }
+    progress.hide();
     if (frames == 0) {
         throw Error(options.in +
                     (options.frames.first > 1 ? ": holds no such frame" : ": holds no frame"));

@@ -79,6 +79,28 @@ jpeg_error_mgr* init_errors(ErrorState* state) {
     return &state->manager;
 }
 
+struct ProgressState {
+    jpeg_progress_mgr manager;  // first: the library hands back a pointer to it
+    const Listener* listener;
+};
+
+void on_progress(j_common_ptr codec) {
+    const jpeg_progress_mgr& at = *codec->progress;
+    if (at.pass_limit == 0 || at.total_passes == 0) return;
+    const double pass = static_cast<double>(at.pass_counter) / static_cast<double>(at.pass_limit);
+    (*reinterpret_cast<ProgressState*>(codec->progress)->listener)((at.completed_passes + pass) /
+                                                                   at.total_passes);
+}
+
+// The state lives as long as the codec; nothing is told where nobody listens.
+jpeg_progress_mgr* init_progress(ProgressState* state, const Listener& listener) {
+    if (!listener) return nullptr;
+    *state = {};
+    state->manager.progress_monitor = on_progress;
+    state->listener = &listener;
+    return &state->manager;
+}
+
 struct Decompressor {
     Decompressor() : codec() { codec.err = init_errors(&errors); }
     ~Decompressor() {
@@ -92,6 +114,7 @@ struct Decompressor {
     JOCTET* icc = nullptr;
     unsigned icc_bytes = 0;
     ErrorState errors;
+    ProgressState progress = {};
 };
 
 struct Encoder {
@@ -102,6 +125,7 @@ struct Encoder {
 
     jpeg_compress_struct codec;
     ErrorState errors;
+    ProgressState progress = {};
 };
 
 Error error(const char* what, const ErrorState& state) {
@@ -327,6 +351,7 @@ struct Encoding {
     Strip* strip;         // of planes
     const Plane* planes;  // of planes
     size_t plane_count;
+    const Listener& listener;
 };
 
 JSAMPROW row_of(const Encoding& encoding, size_t y) {
@@ -372,6 +397,7 @@ bool write_picture(Encoder* encoder, const Encoding& encoding, FILE* out) {
     jpeg_compress_struct* const codec = &encoder->codec;
     const bool has_planes = encoding.strip != nullptr;
     jpeg_create_compress(codec);
+    codec->progress = init_progress(&encoder->progress, encoding.listener);
     jpeg_stdio_dest(codec, out);
     codec->image_width = static_cast<JDIMENSION>(encoding.picture.size.width);
     codec->image_height = static_cast<JDIMENSION>(encoding.picture.size.height);
@@ -398,7 +424,8 @@ void encode(const Encoding& encoding, FILE* out) {
     if (!write_picture(&encoder, encoding, out)) throw error("cannot write JPEG", encoder.errors);
 }
 
-void encode_planes(const Picture& picture, const Metadata& metadata, int quality, FILE* out) {
+void encode_planes(const Picture& picture, const Metadata& metadata, int quality, FILE* out,
+                   const Listener& listener) {
     const std::vector<Plane> planes = tool::planes_of(picture.format, picture.size);
     const bool is_gray = picture.format == PixelFormat::kGray;
     std::array<size_t, 3> widths = {};
@@ -407,7 +434,8 @@ void encode_planes(const Picture& picture, const Metadata& metadata, int quality
         widths[i] = (width + DCTSIZE - 1) / DCTSIZE * DCTSIZE;
     }
     Strip strip(planes, is_gray ? DCTSIZE : 2 * DCTSIZE, widths);
-    encode({picture, metadata, quality, is_gray, nullptr, &strip, planes.data(), planes.size()},
+    encode({picture, metadata, quality, is_gray, nullptr, &strip, planes.data(), planes.size(),
+            listener},
            out);
 }
 
@@ -435,8 +463,9 @@ std::optional<PixelFormat> JpegReader::planes(int32_t reduction) const {
     return planes_of(decoder_->codec, reduction);
 }
 
-Picture JpegReader::read(const Decoding& decoding) {
-    const jpeg_decompress_struct& codec = decoder_->codec;
+Picture JpegReader::read(const Decoding& decoding, const Listener& listener) {
+    jpeg_decompress_struct& codec = decoder_->codec;
+    codec.progress = init_progress(&decoder_->progress, listener);
     const PixelFormat format =
         decoding.in_planes ? planes(decoding.reduction).value() : PixelFormat::kRgba;
     Picture picture({size_.width / decoding.reduction, size_.height / decoding.reduction}, format);
@@ -467,13 +496,15 @@ Picture decode_jpeg(const uint8_t* data, size_t size, Metadata* metadata) {
     return picture;
 }
 
-void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out) {
+void encode_jpeg(const Picture& picture, const Metadata& metadata, int quality, FILE* out,
+                 const Listener& listener) {
     if (picture.format != PixelFormat::kRgba) {
-        return encode_planes(picture, metadata, quality, out);
+        return encode_planes(picture, metadata, quality, out, listener);
     }
     const bool is_gray = is_gray_file(picture, metadata);
     Bytes gray_row(is_gray ? static_cast<size_t>(picture.size.width) : 0);
-    encode({picture, metadata, quality, is_gray, gray_row.data(), nullptr, nullptr, 0}, out);
+    encode({picture, metadata, quality, is_gray, gray_row.data(), nullptr, nullptr, 0, listener},
+           out);
 }
 
 }  // namespace tool

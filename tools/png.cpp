@@ -114,7 +114,7 @@ bool read_header(Decoder* decoder) {
     return true;
 }
 
-bool read_rows(Decoder* decoder, uint8_t* rgba) {
+bool read_rows(Decoder* decoder, uint8_t* rgba, const Listener& listener) {
     if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
     png_structp png = decoder->png;
     png_fixed_point gamma = 0;
@@ -130,7 +130,10 @@ bool read_rows(Decoder* decoder, uint8_t* rgba) {
     const size_t row_bytes = png_get_rowbytes(png, decoder->info);
     const png_uint_32 height = png_get_image_height(png, decoder->info);
     for (int pass = 0; pass < passes; ++pass) {
-        for (png_uint_32 y = 0; y < height; ++y) png_read_row(png, rgba + y * row_bytes, nullptr);
+        for (png_uint_32 y = 0; y < height; ++y) {
+            png_read_row(png, rgba + y * row_bytes, nullptr);
+            if (listener) listener((pass + (y + 1.0) / height) / passes);
+        }
     }
     return true;
 }
@@ -244,7 +247,7 @@ void pack_row(const uint8_t* rgba, size_t width, int colors, uint8_t* packed) {
 }
 
 bool write_picture(Encoder* encoder, const Picture& picture, const Metadata& metadata, uint8_t* row,
-                   FILE* out) {
+                   FILE* out, const Listener& listener) {
     if (setjmp(encoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
     png_structp png = encoder->png;
     png_init_io(png, out);
@@ -261,6 +264,7 @@ bool write_picture(Encoder* encoder, const Picture& picture, const Metadata& met
     for (png_uint_32 y = 0; y < height; ++y) {
         pack_row(picture.bytes() + size_t{y} * width * 4, width, colors, row);
         png_write_row(png, row);
+        if (listener) listener((y + 1.0) / height);
     }
     png_write_end(png, nullptr);
     return true;
@@ -272,7 +276,7 @@ bool is_png(const uint8_t* data, size_t size) {
     return size >= 8 && png_sig_cmp(data, 0, 8) == 0;
 }
 
-Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata) {
+Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata, const Listener& listener) {
     Decoder decoder(data, whole_chunks(data, size));
     if (!read_header(&decoder)) throw error("damaged PNG", decoder.errors);
     Picture picture(checked_size(png_get_image_width(decoder.png, decoder.info),
@@ -280,16 +284,17 @@ Picture decode_png(const uint8_t* data, size_t size, Metadata* metadata) {
     const int colors = png_get_color_type(decoder.png, decoder.info);
     picture.is_gray = (colors & PNG_COLOR_MASK_COLOR) == 0;
     picture.has_alpha = (colors & PNG_COLOR_MASK_ALPHA) != 0 || has_chunk(decoder, PNG_INFO_tRNS);
-    if (!read_rows(&decoder, picture.bytes())) throw error("damaged PNG", decoder.errors);
+    if (!read_rows(&decoder, picture.bytes(), listener)) throw error("damaged PNG", decoder.errors);
     read_end(&decoder);
     *metadata = read_metadata(decoder);
     return picture;
 }
 
-void encode_png(const Picture& picture, const Metadata& metadata, FILE* out) {
+void encode_png(const Picture& picture, const Metadata& metadata, FILE* out,
+                const Listener& listener) {
     Encoder encoder;
     Bytes row(static_cast<size_t>(picture.size.width) * 4);
-    if (!write_picture(&encoder, picture, metadata, row.data(), out)) {
+    if (!write_picture(&encoder, picture, metadata, row.data(), out, listener)) {
         throw error("cannot write PNG", encoder.errors);
     }
 }

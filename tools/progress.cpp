@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <iomanip>
 #include <iostream>
+#include <sstream>
 #include <string>
 
 namespace tool {
@@ -43,15 +44,30 @@ void Progress::hide() {
     is_visible_ = false;
 }
 
-void Progress::update(int64_t count, double part) {
+bool Progress::is_due() {
+    if (!is_wanted_) return false;
     const Clock::time_point now = Clock::now();
-    if (!is_wanted_ || now < next_update_) return;
+    if (now < next_update_) return false;
     next_update_ = now + kInterval;
+    return true;
+}
+
+void Progress::show(double part, const std::string& text) {
     is_visible_ = true;
-    const double seconds = std::chrono::duration<double>(now - start_).count();
-    std::cerr << '\r' << bar(part) << count << " " << things_ << ", " << std::fixed
-              << std::setprecision(1) << static_cast<double>(count) / seconds << " per second"
-              << kEraseToEnd << std::flush;
+    std::cerr << '\r' << bar(part) << text << kEraseToEnd << std::flush;
+}
+
+void Progress::update(int64_t count, double part) {
+    if (!is_due()) return;
+    const double seconds = std::chrono::duration<double>(Clock::now() - start_).count();
+    std::ostringstream text;
+    text << count << " " << things_ << ", " << std::fixed << std::setprecision(1)
+         << static_cast<double>(count) / seconds << " per second";
+    show(part, text.str());
+}
+
+void Progress::update_step(const char* step, double part) {
+    if (is_due()) show(part, step);
 }
 
 }  // namespace tool

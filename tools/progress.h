@@ -3,6 +3,7 @@
 
 #include <chrono>
 #include <cstdint>
+#include <string>
 
 namespace tool {
 
@@ -18,11 +19,16 @@ public:
 
     // part: of the work that is done, 0 to 1; negative when not known.
     void update(int64_t count, double part);
+    // The same for a step of the work on a single thing, such as "reading".
+    void update_step(const char* step, double part);
 
     // Until the next update, to make room for a message.
     void hide();
 
 private:
+    bool is_due();
+    void show(double part, const std::string& text);
+
     using Clock = std::chrono::steady_clock;
 
     bool is_wanted_;

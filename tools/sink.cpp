@@ -5,7 +5,6 @@
 #include <cstring>
 #include <string>
 
-#include "codecs.h"
 #include "convert.h"
 #include "error.h"
 
@@ -26,9 +25,10 @@ void Sink::write(const Picture& frame) {
 void Sink::write_in_format(const Picture& frame) {
     switch (kind_.container) {
         case Container::kPng:
-            return encode_png(frame, settings_.metadata, stream_);
+            return encode_png(frame, settings_.metadata, stream_, settings_.listener);
         case Container::kJpeg:
-            return encode_jpeg(frame, settings_.metadata, settings_.quality, stream_);
+            return encode_jpeg(frame, settings_.metadata, settings_.quality, stream_,
+                               settings_.listener);
         case Container::kPpm:
             return encode_ppm(frame, stream_);
         case Container::kPgm:

@@ -4,6 +4,7 @@
 #include <cstdio>
 #include <optional>
 
+#include "codecs.h"
 #include "file_kind.h"
 #include "metadata.h"
 #include "picture.h"
@@ -15,6 +16,7 @@ struct SinkSettings {
     std::optional<Y4mHeader> y4m_header;  // of Y4M
     Metadata metadata;                    // of image files
     int quality;                          // of JPEG, 1 to 100
+    Listener listener;                    // of PNG and JPEG
 };
 
 // Writes frames to a stream as the kind of file asked for, converting them where need be.

@@ -19,9 +19,9 @@ constexpr size_t kPeekBytes = 16;
 // An image file: one picture.
 class Still : public Source {
 public:
-    using Decode = Picture(const uint8_t*, size_t, Metadata*);
+    using Decode = std::function<Picture(const uint8_t*, size_t, Metadata*)>;
 
-    Still(Input input, Container container, Decode* decode)
+    Still(Input input, Container container, const Decode& decode)
         : Source(std::move(input), {container, PixelFormat::kRgba}) {
         const std::vector<uint8_t> file = input_.read_all();
         picture_ = decode(file.data(), file.size(), &metadata_);
@@ -42,9 +42,10 @@ private:
 
 class Jpeg : public Source {
 public:
-    explicit Jpeg(Input input)
+    Jpeg(Input input, Listener listener)
         : Source(std::move(input), {Container::kJpeg, PixelFormat::kRgba}),
-          reader_(std::make_unique<JpegReader>(input_.read_all())) {
+          reader_(std::make_unique<JpegReader>(input_.read_all())),
+          listener_(std::move(listener)) {
         size_ = reader_->size();
         metadata_ = reader_->metadata();
     }
@@ -57,7 +58,7 @@ public:
 
     bool next(Picture* frame) override {
         if (reader_ == nullptr) return false;
-        *frame = reader_->read(decoding_);
+        *frame = reader_->read(decoding_, listener_);
         metadata_.damage = reader_->metadata().damage;
         reader_.reset();
         return true;
@@ -65,6 +66,7 @@ public:
 
 private:
     std::unique_ptr<JpegReader> reader_;
+    Listener listener_;
     Decoding decoding_;
 };
 
@@ -142,14 +144,20 @@ bool Source::read_frame(uint8_t* to, size_t bytes) {
     return true;
 }
 
-std::unique_ptr<Source> open_source(const std::string& path, const std::optional<RawLayout>& raw) {
+std::unique_ptr<Source> open_source(const std::string& path, const std::optional<RawLayout>& raw,
+                                    const Listener& listener) {
     Input input(path);
     if (raw) return std::make_unique<Raw>(std::move(input), *raw);
 
     const std::vector<uint8_t> head = input.peek(kPeekBytes);
     const auto is = [&head](auto recognise) { return recognise(head.data(), head.size()); };
-    if (is(is_png)) return std::make_unique<Still>(std::move(input), Container::kPng, decode_png);
-    if (is(is_jpeg)) return std::make_unique<Jpeg>(std::move(input));
+    if (is(is_png)) {
+        const auto decode = [&](const uint8_t* data, size_t size, Metadata* metadata) {
+            return decode_png(data, size, metadata, listener);
+        };
+        return std::make_unique<Still>(std::move(input), Container::kPng, decode);
+    }
+    if (is(is_jpeg)) return std::make_unique<Jpeg>(std::move(input), listener);
     if (is(is_pnm)) {
         const Container container = head[1] == '7' ? Container::kPam : Container::kPnm;
         return std::make_unique<Still>(std::move(input), container, decode_pnm);

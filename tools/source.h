@@ -64,6 +64,7 @@ private:
 
 // Opens a file, or standard input for "-". With a layout it holds raw frames, otherwise its content
 // decides what it is.
-std::unique_ptr<Source> open_source(const std::string& path, const std::optional<RawLayout>& raw);
+std::unique_ptr<Source> open_source(const std::string& path, const std::optional<RawLayout>& raw,
+                                    const Listener& listener = {});
 
 }  // namespace tool

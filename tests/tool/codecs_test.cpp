@@ -152,6 +152,46 @@ Picture decode_pnm(const std::string& file) {
 
 }  // namespace
 
+// A listener that wants to hear more each time, but not more than 1.
+class Ear {
+public:
+    tool::Listener listener() {
+        return [this](double part) {
+            EXPECT_GE(part, heard_);
+            EXPECT_LE(part, 1);
+            heard_ = part;
+            ++times_;
+        };
+    }
+    void expect_nearly_all() const {
+        EXPECT_GE(times_, 10);
+        EXPECT_GT(heard_, 0.9);
+    }
+
+private:
+    double heard_ = 0;
+    int times_ = 0;
+};
+
+TEST(Codecs, ListenersHearHowFarTheyHaveCome) {
+    Random random(2);
+    SCOPED_TRACE(random.trace());
+    const Picture picture = random_picture(&random, {64, 200}, false);
+    Ear png_writing, png_reading, jpeg_writing, jpeg_reading, planes_reading;
+    const Bytes png =
+        written([&](FILE* out) { tool::encode_png(picture, {}, out, png_writing.listener()); });
+    tool::Metadata ignored;
+    tool::decode_png(png.data(), png.size(), &ignored, png_reading.listener());
+    const Bytes jpeg = written(
+        [&](FILE* out) { tool::encode_jpeg(picture, {}, 90, out, jpeg_writing.listener()); });
+    tool::JpegReader(jpeg).read({}, jpeg_reading.listener());
+    tool::JpegReader(jpeg).read({true, 1}, planes_reading.listener());
+    for (const Ear* ear :
+         {&png_writing, &png_reading, &jpeg_writing, &jpeg_reading, &planes_reading}) {
+        ear->expect_nearly_all();
+    }
+}
+
 TEST(Codecs, LosslessTypesKeepEveryPixel) {
     Random random(1);
     SCOPED_TRACE(random.trace());

@@ -218,6 +218,9 @@ else
     script -qec "'$tool' in.y4m - -s 16x8" terminal >/dev/null </dev/null &&
         complain "success when writing frames to a terminal"
     grep -q 'standard output is a terminal' terminal || complain "frames go to a terminal"
+    script -qec "'$tool' one.png large.png -s 6000x5000!" terminal >/dev/null </dev/null ||
+        complain "exit code $? for a large picture on a terminal"
+    grep -q '%  writing' terminal || complain "no progress within a large picture"
     slowly | "$tool" - progress.y4m -s 16x8 2>stderr || complain "exit code $? without a terminal"
     [ ! -s stderr ] || complain "progress without a terminal: $(cat stderr)"
     wait
