@@ -49,8 +49,13 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     require(by_jpeg == (fits ? metadata.icc : tool::Bytes()), "JPEG has changed a profile");
     // Packing takes long.
     if (data[0] % 16 > 1) return 0;
-    const tool::Bytes by_png =
-        there_and_back(picture, metadata, tool::encode_png, tool::decode_png).icc;
+    const auto encode_png = [](const tool::Picture& its, const tool::Metadata& with, FILE* out) {
+        tool::encode_png(its, with, out);
+    };
+    const auto decode_png = [](const uint8_t* file, size_t bytes, tool::Metadata* its) {
+        return tool::decode_png(file, bytes, its);
+    };
+    const tool::Bytes by_png = there_and_back(picture, metadata, encode_png, decode_png).icc;
     // libpng leaves out those that it finds fault with.
     require(by_png.empty() || (fits && by_png == metadata.icc), "PNG has changed a profile");
     return 0;
