@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # SPDX-License-Identifier: Apache-2.0
 # deb.sh FOLDER: the Debian packages in it satisfy lintian, hold what they should, and in a root folder
-# of their own install, serve a program and a shell, and go away again. bare.sh tries them in a whole
+# of their own install, serve a program and a shell, and go away again. tests/bare tries them in a whole
 # system.
 set -euo pipefail
 here=$(cd "$(dirname "${BASH_SOURCE[0]}")" && pwd)
