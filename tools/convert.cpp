@@ -97,13 +97,18 @@ Mean mean_color(const Picture& rgba, size_t left, size_t top, size_t across, siz
     return {sum.r / count, sum.g / count, sum.b / count};
 }
 
-Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
-    const YuvFactors factors = yuv_factors();
+Picture with_luma(const Picture& rgba, PixelFormat format, const YuvFactors& factors) {
     Picture to(rgba.size, format);
     for (size_t i = 0; i < rgba.size.pixels(); ++i) {
         const uint8_t* const pixel = rgba.bytes() + i * 4;
         to.bytes()[i] = luma(factors, pixel[0], pixel[1], pixel[2]);
     }
+    return to;
+}
+
+Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
+    const YuvFactors factors = yuv_factors(yuv_meaning());
+    Picture to = with_luma(rgba, format, factors);
     if (format == PixelFormat::kGray) return to;
     const auto chroma = chroma_of(to.bytes(), format, rgba.size);
     for (size_t y = 0; y < chroma.height; ++y) {
@@ -118,7 +123,7 @@ Picture rgba_to_yuv(const Picture& rgba, PixelFormat format) {
 }
 
 Picture gray_to_rgba(const Picture& gray) {
-    const YuvFactors factors = yuv_factors();
+    const YuvFactors factors = yuv_factors(yuv_meaning());
     Picture rgba(gray.size);
     rgba.is_gray = true;
     uint8_t* to = rgba.bytes();
@@ -131,7 +136,7 @@ Picture gray_to_rgba(const Picture& gray) {
 
 Picture yuv_to_rgba(const Picture& yuv) {
     if (yuv.format == PixelFormat::kGray) return gray_to_rgba(yuv);
-    const YuvFactors factors = yuv_factors();
+    const YuvFactors factors = yuv_factors(yuv_meaning());
     Picture rgba(yuv.size);
     const size_t width = static_cast<size_t>(yuv.size.width);
     const auto chroma = chroma_of(yuv.bytes(), yuv.format, yuv.size);
@@ -192,6 +197,11 @@ Picture converted(const Picture& picture, PixelFormat format) {
         return chroma_rearranged(picture, format);
     }
     return from_rgba(to_rgba(picture), format);
+}
+
+Picture in_shades(const Picture& picture) {
+    const YuvMeaning meaning = {yuv_meaning().matrix, Range::kFull};
+    return with_luma(to_rgba(picture), PixelFormat::kGray, yuv_factors(meaning));
 }
 
 }  // namespace tool

@@ -242,10 +242,9 @@ void write(const std::string& header, const uint8_t* bytes, size_t count, FILE* 
     }
 }
 
-void write_pnm(const char* type, const Picture& picture, PixelFormat format, FILE* out) {
-    const Picture samples = converted(picture, format);
-    const std::string header = std::string(type) + "\n" + std::to_string(picture.size.width) + " " +
-                               std::to_string(picture.size.height) + "\n255\n";
+void write_pnm(const char* type, const Picture& samples, FILE* out) {
+    const std::string header = std::string(type) + "\n" + std::to_string(samples.size.width) + " " +
+                               std::to_string(samples.size.height) + "\n255\n";
     write(header, samples.bytes(), samples.byte_count(), out);
 }
 
@@ -274,11 +273,11 @@ Picture decode_pnm(const uint8_t* data, size_t size, Metadata* /*metadata*/) {
 }
 
 void encode_ppm(const Picture& picture, FILE* out) {
-    write_pnm("P6", picture, PixelFormat::kRgb, out);
+    write_pnm("P6", converted(picture, PixelFormat::kRgb), out);
 }
 
 void encode_pgm(const Picture& picture, FILE* out) {
-    write_pnm("P5", picture, PixelFormat::kGray, out);
+    write_pnm("P5", in_shades(picture), out);
 }
 
 void encode_pam(const Picture& picture, FILE* out) {

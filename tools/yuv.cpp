@@ -29,9 +29,9 @@ YuvMeaning yuv_meaning() {
     return chosen;
 }
 
-const YuvFactors& yuv_factors() {
-    const bool is_full = chosen.range == Range::kFull;
-    if (chosen.matrix == Matrix::k601) return is_full ? kFull601 : kLimited601;
+const YuvFactors& yuv_factors(YuvMeaning meaning) {
+    const bool is_full = meaning.range == Range::kFull;
+    if (meaning.matrix == Matrix::k601) return is_full ? kFull601 : kLimited601;
     return is_full ? kFull709 : kLimited709;
 }
 

@@ -32,6 +32,6 @@ struct YuvFactors {
     int r_of_v, g_of_u, g_of_v, b_of_u;  // those of G to be taken away
 };
 
-const YuvFactors& yuv_factors();
+const YuvFactors& yuv_factors(YuvMeaning meaning);
 
 }  // namespace tool
