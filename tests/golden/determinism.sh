@@ -36,11 +36,13 @@ failures=0
 for compiler in "${compilers[@]}"; do
     for options in "${flags[@]}"; do
         directory=$build/$compiler${options//[^-A-Za-z0-9]/_}
+        c_compiler=${compiler/clang++/clang}
+        c_compiler=${c_compiler/g++/gcc}
         linker=
         [[ $compiler != clang* || $options != *lto* ]] || linker=-fuse-ld=lld-19
         # No flags but these, and those that the project insists on.
         if cmake -G Ninja -S . -B "$directory" -DCMAKE_BUILD_TYPE=None -DOVRINRESIZE_BUILD_TESTS=ON \
-            -DCMAKE_C_COMPILER=cc -DCMAKE_CXX_COMPILER="$compiler" -DCMAKE_CXX_FLAGS="$options" \
+            -DCMAKE_C_COMPILER="$c_compiler" -DCMAKE_CXX_COMPILER="$compiler" -DCMAKE_CXX_FLAGS="$options" \
             -DCMAKE_EXE_LINKER_FLAGS="$linker" -DCMAKE_SHARED_LINKER_FLAGS="$linker" >"$directory.log" 2>&1 &&
             cmake --build "$directory" --parallel "$(nproc)" --target golden_sets golden_shared \
                 >>"$directory.log" 2>&1; then
