@@ -329,6 +329,20 @@ TEST(KeepRatioRgba, APictureBelowTheCanvasClearsItAndIsCutBelowZero) {
     }
 }
 
+// Negative positions are not allowed; what they would put before the canvas is not drawn.
+TEST(KeepRatioRgba, APictureBeforeTheCanvasClearsIt) {
+    const std::vector<uint8_t> src(4 * 2000 * 4, 255);
+    for (const Way& way : kBoth) {
+        for (const int32_t src_h : {4, 2000}) {
+            GuardedBuffer<uint32_t> canvas(64, Flush::kStart, 0xEE);
+            ovrin_resize_target target = with_source(letterbox(8, 8, 4, 4, 0, -1), 4, src_h);
+            target.dst = canvas.data();
+            way.resize(src.data(), 4, src_h, &target);
+            EXPECT_EQ(canvas.copy(), std::vector<uint32_t>(64, 0));
+        }
+    }
+}
+
 TEST(KeepRatioRgba, APictureAtTheRightEdgeIsNotRejected) {
     const std::vector<uint8_t> src(4 * 2000 * 4, 255);
     for (const Way& way : kBoth) {

@@ -551,6 +551,8 @@ TEST(LanczosThreaded, BandsLieFourBytesAPixelApartWhateverAPixelHas) {
         check_threaded({9, 63, 7, 63, bpp}, random);
         check_threaded({9, 40, 7, 40, bpp}, random);
         check_threaded({9, 20, 7, 150, bpp}, random);
+        check_threaded({9, 1, 7, 150, bpp}, random);
+        check_threaded({1, 20, 1, 150, bpp}, random);
     }
 }
 
