@@ -5,6 +5,7 @@
 
 #include <cmath>
 #include <cstdlib>
+#include <cstring>
 #include <memory>
 #include <thread>
 
@@ -237,6 +238,31 @@ TEST(Lanczos, UniformPicturesStayUniformToTheBorder) {
         const std::vector<uint8_t> src(20 * 20, value);
         for (const auto& [w, h] : {std::pair<int32_t, int32_t>{31, 47}, {9, 3}, {20, 20}}) {
             EXPECT_EQ(draw(src, 20, 20, w, h, 1), std::vector<uint8_t>(bytes_of(w, h, 1), value));
+        }
+    }
+}
+
+// Every float of it is not a number, and stays so times zero.
+[[gnu::noinline]] void fill_stack_with_ones() {
+    uint8_t bytes[1 << 18];
+    memset(bytes, 0xFF, sizeof bytes);
+    __asm__ volatile("" : : "r"(bytes) : "memory");
+}
+
+TEST(Lanczos, WhatLayOnTheStackCountsForNothing) {
+    Random random(100);
+    SCOPED_TRACE(random.trace());
+    for (const int32_t bpp : {1, 2, 3, 4}) {
+        for (int i = 0; i < rounds(40) && !HasFatalFailure(); ++i) {
+            const Sizes s = {random.between(1, 90), random.between(1, 20), random.between(1, 90),
+                             random.between(1, 20), bpp};
+            const auto src = content(s, random);
+            const auto expected =
+                reference::resize_lanczos(src.data(), s.src_w, s.src_h, s.dst_w, s.dst_h, bpp);
+            std::vector<uint8_t> dst(expected.size());
+            fill_stack_with_ones();
+            ov_lanczos(src.data(), s.src_w, s.src_h, dst.data(), s.dst_w, s.dst_h, bpp);
+            ASSERT_EQ(dst, expected) << describe(s);
         }
     }
 }

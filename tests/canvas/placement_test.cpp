@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include "support/letterbox.h"
+#include "yuv420/grid.h"
 
 using namespace ovrin;
 using ovrin_test::letterbox;
@@ -68,4 +69,12 @@ TEST(Placement, RowsThatRunOnLieInMemoryAllTheSame) {
     EXPECT_FALSE(in_memory({21, 5, 0, 0, false}));
     EXPECT_TRUE(in_memory({4, 4, -1, 1, true}));
     EXPECT_FALSE(in_memory({4, 4, -1, 0, false}));
+}
+
+TEST(Grid, TheThreeLargestSizesHaveNone) {
+    EXPECT_TRUE(has_grid({kI420, INT32_MAX - 3, 4}));
+    EXPECT_TRUE(has_grid({kI420, 4, INT32_MAX - 3}));
+    EXPECT_FALSE(has_grid({kI420, INT32_MAX - 2, 4}));
+    EXPECT_FALSE(has_grid({kI420, 4, INT32_MAX - 2}));
+    EXPECT_FALSE(has_grid({kI420, 0, 4}));
 }

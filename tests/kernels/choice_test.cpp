@@ -66,6 +66,17 @@ TEST(KernelChoice, ProcessorsGetTheBestOfTheirSets) {
     }
 }
 
+// Otherwise every processor could pass for an old one, with the right bytes from slow kernels.
+TEST(KernelChoice, TheProcessorHasWhatTheCompilerFindsToo) {
+    const ovrin::CpuFeatures own = __real__ZN5ovrin12cpu_featuresEv();
+    const bool avx2 = __builtin_cpu_supports("avx2") && __builtin_cpu_supports("fma");
+    EXPECT_EQ(own.avx2, avx2);
+    EXPECT_EQ(own.avx512_vbmi,
+              avx2 && __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
+                  __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512vl") &&
+                  __builtin_cpu_supports("avx512vbmi"));
+}
+
 #else
 
 TEST(KernelChoice, ProcessorsGetTheBestOfTheirSets) {

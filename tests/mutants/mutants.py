@@ -11,7 +11,8 @@ in a copy below FOLDER, which may be kept: it remembers what has been built and 
   mutants.py again FOLDER LOG...   those that these runs left alive
   mutants.py sum LOG...            all outcomes of these runs, the last where a mutant has several
 
-With --aarch64 the NEON kernels are changed, and tested under qemu-user.
+With --aarch64 the NEON kernels are changed, and tested under qemu-user. With --sanitize all is built with
+these sanitizers, which kill what is undefined and does no harm otherwise.
 """
 
 import argparse
@@ -174,7 +175,7 @@ def summary(outcomes):
 # ---- Building and testing --------------------------------------------------------------------
 
 class Build:
-    def __init__(self, folder, aarch64):
+    def __init__(self, folder, options):
         self.tree = folder / "tree"
         self.build = folder / "build"
         self.log = open(folder / "build.log", "w", encoding="utf-8")
@@ -184,13 +185,17 @@ class Build:
         for name in COPIED:
             copy(PROJECT / name, self.tree / name)
         self.run(["cmake", "-G", "Ninja", "-S", self.tree, "-B", self.build,
-                  "-DCMAKE_BUILD_TYPE=Release", "-DOVRINRESIZE_BUILD_TESTS=ON",
+                  f"-DCMAKE_BUILD_TYPE={'RelWithDebInfo' if options.sanitize else 'Release'}",
+                  f"-DCMAKE_CXX_FLAGS={sanitizer_flags(options.sanitize)}",
+                  "-DOVRINRESIZE_BUILD_TESTS=ON",
                   "-DCMAKE_CXX_COMPILER_LAUNCHER=ccache", "-DCMAKE_LINK_DEPENDS_NO_SHARED=ON",
                   *([f"-DCMAKE_TOOLCHAIN_FILE={self.tree}/cmake/aarch64-linux-gnu.cmake"]
-                    if aarch64 else [])], check=True)
-        self.ninja(NEON_TESTS if aarch64 else [], check=True)
+                    if options.aarch64 else [])], check=True)
+        self.ninja(NEON_TESTS if options.aarch64 else [], check=True)
         self.original_code = self.code()
         self.tests = self.find_tests()
+        # The address sanitizer maps far more than this.
+        self.most_memory = resource.RLIM_INFINITY if options.sanitize else 20 << 30
         self.seconds = {}
         self.kills_file = folder / "kills.json"
         self.kills = json.loads(self.kills_file.read_text()) if self.kills_file.exists() else {}
@@ -240,7 +245,8 @@ class Build:
         test = subprocess.Popen(self.tests[name][1], env=environment, cwd=self.build,
                                 stdin=subprocess.DEVNULL, stdout=self.log, stderr=self.log,
                                 start_new_session=True,
-                                preexec_fn=lambda: set_limits(int(10 + 10 * usual)))
+                                preexec_fn=lambda: set_limits(int(10 + 10 * usual),
+                                                                      self.most_memory))
         outcome = None
         patience = 60 + 10 * usual
         while outcome is None:
@@ -300,10 +306,16 @@ def processor_seconds():
     return used.ru_utime + used.ru_stime
 
 
-def set_limits(seconds):
+def sanitizer_flags(names):
+    if not names:
+        return ""
+    return f"-fsanitize={names} -fno-sanitize-recover=all -fno-omit-frame-pointer"
+
+
+def set_limits(seconds, memory):
     resource.setrlimit(resource.RLIMIT_CPU, (seconds, seconds + 5))
     resource.setrlimit(resource.RLIMIT_CORE, (0, 0))
-    resource.setrlimit(resource.RLIMIT_AS, (20 << 30, 20 << 30))
+    resource.setrlimit(resource.RLIMIT_AS, (memory, memory))
 
 
 def copy(source, target):
@@ -331,6 +343,8 @@ def read_options():
         options = kinds.add_parser(kind)
         options.add_argument("folder", type=pathlib.Path)
         options.add_argument("--aarch64", action="store_true", help="the NEON kernels, under qemu-user")
+        options.add_argument("--sanitize", default="", metavar="NAMES",
+                             help="such as address,undefined or thread")
         options.add_argument("--quick", action="store_true",
                              help="random tests with a twentieth of their rounds only")
         if kind == "random":
@@ -365,7 +379,7 @@ def main():
     sources = read_sources(options.aarch64)
     mutants = chosen_mutants(options, sources)
     print(f"{len(mutants)} mutants; building what they are made of", flush=True)
-    build = Build(folder, options.aarch64)
+    build = Build(folder, options)
     for name in build.tests:
         if not build.passes(name, 20):
             sys.exit(f"{name} fails without any change")
