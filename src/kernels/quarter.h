@@ -25,6 +25,7 @@ struct QuarterPlan {
     int32_t sample_bytes;
     int32_t samples;         // in the strip
     int32_t vector_samples;  // vector kernels: in a destination vector
+    int32_t repeating;       // vector kernels: vectors, from the first on, that share shuffles
     int64_t row_bytes;
     int64_t first_byte;  // kernels of simple ratios: of the strip's first group, in a source row
     union {

@@ -248,7 +248,7 @@ const QuarterKernels& plan_windows(QuarterPlan& plan, const QuarterRowShape& sha
     plan.vector_samples = window_samples * window_count(kReach);
     plan.row_bytes = int64_t{shape.src_columns} * shape.sample_bytes;
     plan_vectors<WindowsEntry>(
-        plan, shape, columns, samples, window_bytes(kReach), mask_count(kReach) * kVector,
+        plan, shape, columns, samples, window_bytes(kReach), mask_count(kReach) * kVector, 1,
         [&](uint8_t* masks, WindowsEntry& entry, const Tap* taps, int32_t count) {
             encode<kReach>(masks, entry, taps, count, plan);
         });

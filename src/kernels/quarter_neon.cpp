@@ -6,6 +6,7 @@
 #include <string.h>
 
 #include "kernels/inline.h"
+#include "kernels/quarter_rows_inl.h"
 #include "kernels/quarter_windows_inl.h"
 #include "kernels/sets.h"
 
@@ -57,24 +58,35 @@ OVRIN_ALWAYS_INLINE void fetch(const QuarterRows& rows, ptrdiff_t offset) {
     }
 }
 
+// The same in all windows of a vector. Offsets below the second table wrap to values that lie
+// outside it.
 template <int kWindows, bool kPair>
-OVRIN_ALWAYS_INLINE uint8x16_t gather(const QuarterRows& rows, const QuarterPlan& plan,
-                                      VectorEntry entry) {
+OVRIN_ALWAYS_INLINE uint8x16_t look_up_all(const QuarterRows& rows, uint8x16_t left,
+                                           uint8x16_t right, ptrdiff_t offset) {
     constexpr int kFirst = kWindows < kTableWindows ? kWindows : kTableWindows;
-    const auto& offsets = *reinterpret_cast<const Offsets<kVector>*>(plan.bytes + entry.masks);
-    const uint8x16_t left = vld1q_u8(offsets.left);
-    const uint8x16_t right = vld1q_u8(offsets.right);
-    if (kWindows > 1) fetch<kWindows, kPair>(rows, entry.base);
-    uint8x16_t taps = look_up<kFirst, kPair>(vdupq_n_u8(0), rows, left, right, entry.base);
+    uint8x16_t taps = look_up<kFirst, kPair>(vdupq_n_u8(0), rows, left, right, offset);
     if constexpr (kWindows > kTableWindows) {
-        // Offsets below the second table wrap to values that lie outside it.
         constexpr int kTableBytes = kTableWindows * kVector;
         const uint8x16_t table_bytes = vdupq_n_u8(kTableBytes);
         taps = look_up<kWindows - kTableWindows, kPair>(taps, rows, vsubq_u8(left, table_bytes),
                                                         vsubq_u8(right, table_bytes),
-                                                        entry.base + kTableBytes);
+                                                        offset + kTableBytes);
     }
     return taps;
+}
+
+const Offsets<kVector>& offsets_of(const QuarterPlan& plan, VectorEntry entry) {
+    return *reinterpret_cast<const Offsets<kVector>*>(plan.bytes + entry.masks);
+}
+
+template <int kWindows, bool kPair>
+OVRIN_ALWAYS_INLINE uint8x16_t gather(const QuarterRows& rows, const QuarterPlan& plan,
+                                      VectorEntry entry) {
+    const Offsets<kVector>& offsets = offsets_of(plan, entry);
+    const uint8x16_t left = vld1q_u8(offsets.left);
+    const uint8x16_t right = vld1q_u8(offsets.right);
+    if (kWindows > 1) fetch<kWindows, kPair>(rows, entry.base);
+    return look_up_all<kWindows, kPair>(rows, left, right, entry.base);
 }
 
 template <bool kAdd>
@@ -99,12 +111,14 @@ constexpr int32_t kMaxWindowsOfTwo = 5;
 // is stored by the next. Two at a time, before either is stored: in-order processors would
 // otherwise wait for the end of one before they begin the other.
 template <int kWindows, bool kPair, bool kAdd>
-void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& plan) {
+void run_windows_from(int32_t done, uint8_t* dst, const QuarterRows& source,
+                      const QuarterPlan& plan) {
     const QuarterRows rows = source;
     const int32_t step = plan.vector_samples * plan.sample_bytes;
     const uint8x16_t kept = first_bytes(step);
-    const auto* entry = reinterpret_cast<const VectorEntry*>(plan.bytes);
-    int32_t rest = plan.samples * plan.sample_bytes;
+    const auto* entry = reinterpret_cast<const VectorEntry*>(plan.bytes) + done;
+    int32_t rest = plan.samples * plan.sample_bytes - done * step;
+    dst += done * step;
     const auto vector = [&](VectorEntry at) __attribute__((always_inline)) {
         const uint8x16_t samples = gather<kWindows, kPair>(rows, plan, at);
         return kAdd ? vandq_u8(samples, kept) : samples;
@@ -123,6 +137,11 @@ void run_windows(uint8_t* dst, const QuarterRows& source, const QuarterPlan& pla
     }
 }
 
+template <int kWindows, bool kPair, bool kAdd>
+void run_windows(uint8_t* dst, const QuarterRows& rows, const QuarterPlan& plan) {
+    run_windows_from<kWindows, kPair, kAdd>(0, dst, rows, plan);
+}
+
 template <int kWindows>
 constexpr QuarterKernels quarter_kernels() {
     return {run_windows<kWindows, true, false>, run_windows<kWindows, true, true>,
@@ -132,6 +151,103 @@ constexpr QuarterKernels quarter_kernels() {
 constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
     quarter_kernels<1>(), quarter_kernels<2>(), quarter_kernels<3>(), quarter_kernels<4>(),
     quarter_kernels<5>(), quarter_kernels<6>(), quarter_kernels<7>(), quarter_kernels<8>()};
+
+#if defined(__wasm__)
+
+// WebAssembly has fewer registers, and no lookups in several vectors.
+const QuarterKernels* plan_repeating(QuarterPlan& /*plan*/, const QuarterRowShape& /*shape*/,
+                                     const WindowShape& /*widest*/, QuarterColumns& /*columns*/,
+                                     int32_t /*samples*/) {
+    return nullptr;
+}
+
+#else
+
+// Vectors whose offsets repeat, from each to the next or to the one after that, by pairs: the
+// offsets stay in registers.
+template <int kWindows>
+void run_repeating(uint8_t* dst, const QuarterRows& rows, const QuarterPlan& plan) {
+    const ptrdiff_t step = ptrdiff_t{plan.vector_samples} * plan.sample_bytes;
+    const auto* entry = reinterpret_cast<const VectorEntry*>(plan.bytes);
+    const ptrdiff_t src_step = entry[2].base - entry[0].base;
+    const QuarterRows first = from_byte<true>(rows, entry[0].base);
+    const QuarterRows second = from_byte<true>(rows, entry[1].base);
+    const Offsets<kVector>& first_offsets = offsets_of(plan, entry[0]);
+    const Offsets<kVector>& second_offsets = offsets_of(plan, entry[1]);
+    const uint8x16_t first_left = vld1q_u8(first_offsets.left);
+    const uint8x16_t first_right = vld1q_u8(first_offsets.right);
+    const uint8x16_t second_left = vld1q_u8(second_offsets.left);
+    const uint8x16_t second_right = vld1q_u8(second_offsets.right);
+    const int32_t vectors = plan.repeating;
+    uint8_t* to = dst;
+    ptrdiff_t offset = 0;
+    for (int32_t i = 0; i < vectors; i += 2, to += 2 * step, offset += src_step) {
+        if (kWindows > 1) fetch<2 * kWindows, true>(first, offset);
+        const auto a = look_up_all<kWindows, true>(first, first_left, first_right, offset);
+        const auto b = look_up_all<kWindows, true>(second, second_left, second_right, offset);
+        vst1q_u8(to, a);
+        vst1q_u8(to + step, b);
+    }
+    run_windows_from<kWindows, true, false>(vectors, dst, rows, plan);
+}
+
+template <int kWindows>
+constexpr QuarterKernels repeating_kernels() {
+    return {run_repeating<kWindows>, run_windows<kWindows, true, true>,
+            run_windows<kWindows, false, true>};
+}
+
+constexpr QuarterKernels kRepeatingKernels[kMaxWindowsOfTwo] = {
+    repeating_kernels<1>(), repeating_kernels<2>(), repeating_kernels<3>(), repeating_kernels<4>(),
+    repeating_kernels<5>()};
+
+// What a vector takes: loads and shifts of the windows of two rows, lookups, additions and the
+// store. Large processors take three times as long for lookups in more than two windows.
+constexpr int32_t vector_cost(const WindowShape& vector) {
+    return 4 * vector.windows + (vector.windows > 2 ? 10 : 6);
+}
+
+// The shape of vectors that repeat; of fewer samples than there is room for, where that costs
+// hardly more for a sample. No windows: there is none.
+WindowShape repeating_shape(const QuarterRowShape& shape, const WindowShape& widest) {
+    WindowShape best = {0, 0, 0};
+    for (int32_t samples = widest.samples; samples > 1; --samples) {
+        if (repeating_cells(shape, 2 * samples) == 0) continue;
+        const int32_t windows = windows_needed(shape, samples, kVector, kMaxWindowsOfTwo);
+        if (windows == 0) continue;
+        const WindowShape vector = {samples, windows, 2};
+        if (best.windows == 0 || vector_cost(vector) * best.samples < vector_cost(best) * samples) {
+            best = vector;
+        }
+    }
+    const bool pays =
+        8 * vector_cost(best) * widest.samples <= 9 * vector_cost(widest) * best.samples;
+    return pays ? best : WindowShape{0, 0, 0};
+}
+
+// Of the vectors that repeat, pairs, and only those that end inside the strip.
+int32_t whole_pairs(const QuarterPlan& plan) {
+    const int32_t step = plan.vector_samples * plan.sample_bytes;
+    const int32_t whole = (plan.samples * plan.sample_bytes - kVector) / step + 1;
+    const int32_t vectors = plan.repeating < whole ? plan.repeating : whole;
+    return vectors < 4 ? 0 : vectors - vectors % 2;
+}
+
+// Null, and no columns are taken, where offsets do not repeat, or too few vectors have them.
+const QuarterKernels* plan_repeating(QuarterPlan& plan, const QuarterRowShape& shape,
+                                     const WindowShape& widest, QuarterColumns& columns,
+                                     int32_t samples) {
+    const WindowShape vector = repeating_shape(shape, widest);
+    if (vector.windows == 0 || samples < 4 * vector.samples) return nullptr;
+    const QuarterColumns first = columns;
+    plan_offsets<kVector>(plan, shape, vector, columns, samples);
+    plan.repeating = whole_pairs(plan);
+    if (plan.repeating > 0) return &kRepeatingKernels[vector.windows - 1];
+    columns = first;
+    return nullptr;
+}
+
+#endif
 
 // From this reduction on, windows hold so few taps of samples of four bytes that these are loaded
 // one by one, with the scalar kernels' plan.
@@ -198,10 +314,12 @@ const QuarterKernels& plan_quarters_neon(QuarterPlan& plan, const QuarterRowShap
         plan_quarters_scalar(plan, shape, columns, samples);
         return kWordKernels;
     }
-    const WindowShape vector = window_shape(shape, kVector, kMaxWindows);
-    if (vector.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
-    plan_offsets<kVector>(plan, shape, vector, columns, samples);
-    return kQuarterKernels[vector.windows - 1];
+    const WindowShape widest = window_shape(shape, kVector, kMaxWindows);
+    if (widest.windows == 0) return plan_quarters_scalar(plan, shape, columns, samples);
+    const QuarterKernels* repeating = plan_repeating(plan, shape, widest, columns, samples);
+    if (repeating != nullptr) return *repeating;
+    plan_offsets<kVector>(plan, shape, widest, columns, samples);
+    return kQuarterKernels[widest.windows - 1];
 }
 
 }  // namespace ovrin

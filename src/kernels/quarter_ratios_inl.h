@@ -17,6 +17,7 @@
 
 #include "kernels/inline.h"
 #include "kernels/quarter.h"
+#include "kernels/quarter_rows_inl.h"
 
 namespace ovrin {
 
@@ -60,14 +61,6 @@ bool has_taps(const SimpleRatio& ratio, const QuarterRowShape& shape, QuarterCol
 template <class Pattern>
 constexpr ptrdiff_t src_bytes(ptrdiff_t dst_bytes) {
     return dst_bytes / Pattern::kRatio.dst * Pattern::kRatio.src;
-}
-
-// A single row stands for both.
-template <bool kPair>
-QuarterRows from_byte(const QuarterRows& rows, ptrdiff_t first) {
-    const uint8_t* const top = rows.top + first;
-    if (!kPair) return {top, top, rows.next_top + first, rows.next_top + first};
-    return {top, rows.bottom + first, rows.next_top + first, rows.next_bottom + first};
 }
 
 template <class Pattern, bool kPair>

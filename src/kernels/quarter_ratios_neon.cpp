@@ -87,16 +87,7 @@ OVRIN_ALWAYS_INLINE void store_by_three(uint8_t* dst, uint8x16x3_t samples) {
     }
 }
 
-// Of the samples of two vectors the first, or the second, of every two.
-template <int N>
-OVRIN_ALWAYS_INLINE uint8x16_t even_of_two(uint8x16_t a, uint8x16_t b) {
-    if constexpr (N == 1) return vuzp1q_u8(a, b);
-    if constexpr (N == 2) {
-        return vreinterpretq_u8_u16(vuzp1q_u16(vreinterpretq_u16_u8(a), vreinterpretq_u16_u8(b)));
-    }
-    return vreinterpretq_u8_u32(vuzp1q_u32(vreinterpretq_u32_u8(a), vreinterpretq_u32_u8(b)));
-}
-
+// Of the samples of two vectors the second of every two.
 template <int N>
 OVRIN_ALWAYS_INLINE uint8x16_t odd_of_two(uint8x16_t a, uint8x16_t b) {
     if constexpr (N == 1) return vuzp2q_u8(a, b);
@@ -104,6 +95,17 @@ OVRIN_ALWAYS_INLINE uint8x16_t odd_of_two(uint8x16_t a, uint8x16_t b) {
         return vreinterpretq_u8_u16(vuzp2q_u16(vreinterpretq_u16_u8(a), vreinterpretq_u16_u8(b)));
     }
     return vreinterpretq_u8_u32(vuzp2q_u32(vreinterpretq_u32_u8(a), vreinterpretq_u32_u8(b)));
+}
+
+// The sums of every two samples of two vectors. Quarters do not carry: bytes are added, however
+// wide the samples are.
+template <int N>
+OVRIN_ALWAYS_INLINE uint8x16_t add_neighbours(uint8x16_t a, uint8x16_t b) {
+    if constexpr (N == 1) return vpaddq_u8(a, b);
+    if constexpr (N == 2) {
+        return vreinterpretq_u8_u16(vpaddq_u16(vreinterpretq_u16_u8(a), vreinterpretq_u16_u8(b)));
+    }
+    return vreinterpretq_u8_u32(vpaddq_u32(vreinterpretq_u32_u8(a), vreinterpretq_u32_u8(b)));
 }
 
 OVRIN_ALWAYS_INLINE uint8x16_t quarters(uint8x16_t samples) {
@@ -159,38 +161,23 @@ struct TwoInStep {
     }
 };
 
-// Neighbouring bytes are added after the rows are.
-struct BytesTwoToOne : TwoInStep<BytesTwoToOne> {
+// Neighbouring samples are added after the rows are.
+template <int N>
+struct TwoToOne : TwoInStep<TwoToOne<N>> {
     static constexpr SimpleRatio kRatio = kTwoToOne;
-    static constexpr int32_t kSampleBytes = 1;
+    static constexpr int32_t kSampleBytes = N;
     static constexpr int32_t kDstBytes = 64;
 
     template <bool kPair>
     static OVRIN_ALWAYS_INLINE uint8x16x2_t make(const uint8_t* top, const uint8_t* bottom) {
         const auto load = [&](int32_t i) { return load_quarters<kPair>(top + i, bottom + i); };
-        const uint8x16_t last = kPair ? load_halved(top + 48, bottom + 48) : load(48);
-        return {{vpaddq_u8(load(0), load(16)), vpaddq_u8(load(32), last)}};
+        const uint8x16_t last = kPair && N < 4 ? load_halved(top + 48, bottom + 48) : load(48);
+        return {{add_neighbours<N>(load(0), load(16)), add_neighbours<N>(load(32), last)}};
     }
 
     static OVRIN_ALWAYS_INLINE void put(uint8_t* dst, uint8x16x2_t samples) {
         vst1q_u8(dst, samples.val[0]);
         vst1q_u8(dst + 16, samples.val[1]);
-    }
-};
-
-template <int N>
-struct TwoToOne : TwoInStep<TwoToOne<N>> {
-    static constexpr SimpleRatio kRatio = kTwoToOne;
-    static constexpr int32_t kSampleBytes = N;
-    static constexpr int32_t kDstBytes = 32;
-
-    template <bool kPair>
-    static OVRIN_ALWAYS_INLINE uint8x16_t make(const uint8_t* top, const uint8_t* bottom) {
-        const uint8x16x2_t upper = load_by_two<N>(top);
-        const uint8x16_t sums = add_quarters(quarters(upper.val[0]), upper.val[1]);
-        if (!kPair) return sums;
-        const uint8x16x2_t lower = load_by_two<N>(bottom);
-        return add_quarters(add_quarters(sums, lower.val[0]), lower.val[1]);
     }
 };
 
@@ -209,8 +196,7 @@ struct FourToOne : TwoInStep<FourToOne<N>> {
             a = add_quarters(a, odd_samples(bottom));
             b = add_quarters(b, odd_samples(bottom + 32));
         }
-        if constexpr (N == 1) return vpaddq_u8(a, b);
-        return vaddq_u8(even_of_two<N>(a, b), odd_of_two<N>(a, b));
+        return add_neighbours<N>(a, b);
     }
 
     static OVRIN_ALWAYS_INLINE uint8x16_t odd_samples(const uint8_t* samples) {
@@ -291,7 +277,7 @@ struct TwoToThree : TwoInStep<TwoToThree<N>> {
 
 const QuarterKernels* plan_simple_quarters_neon(QuarterPlan& plan, const QuarterRowShape& shape,
                                                 QuarterColumns& columns, int32_t samples) {
-    return plan_patterns<BytesTwoToOne, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
+    return plan_patterns<TwoToOne<1>, TwoToOne<2>, TwoToOne<4>, ThreeToTwo<1>, ThreeToTwo<2>,
                          ThreeToTwo<4>, FourToOne<1>, FourToOne<2>, FourToOne<4>, ThreeToOne<1>,
                          ThreeToOne<2>, ThreeToOne<4>, TwoToThree<1>, TwoToThree<2>, TwoToThree<4>,
                          FourToThree<1>, FourToThree<2>, FourToThree<4>>(plan, shape, columns,

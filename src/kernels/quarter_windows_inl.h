@@ -16,10 +16,12 @@ namespace ovrin {
 namespace {
 
 // How a row is cut: the samples of a destination vector and the windows that it takes. No windows:
-// a plan of this kind does not fit the row.
+// a plan of this kind does not fit the row. Where the ratio repeats, it does so from one vector to
+// the next, or `period` further on.
 struct WindowShape {
     int32_t samples;
     int32_t windows;
+    int32_t period;
 };
 
 // Windows of `window_bytes` that `samples` destination samples need; 0 when they are more than
@@ -45,9 +47,9 @@ inline WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_byt
     if (samples > 16) samples -= samples % 4;
     for (int32_t halvings = 0; halvings < 4 && samples > 1; ++halvings, samples /= 2) {
         const int32_t windows = windows_needed(shape, samples, vector_bytes, max_windows);
-        if (windows > 0) return {samples, windows};
+        if (windows > 0) return {samples, windows, 1};
     }
-    return {0, 0};
+    return {0, 0, 0};
 }
 
 // The taps of a destination vector, as bytes from the start of its windows, which span at most 256
@@ -100,42 +102,61 @@ void through_copy(uint8_t* dst, int32_t bytes, const Put& put) {
     copy_part<kVector>(dst, copy, bytes);
 }
 
-// Source cells from one vector's taps to the next one's, where all vectors have the same taps but
-// for that; 0 where they have not.
+// Source cells from the taps of some samples to those of as many next ones, where these are the
+// same taps but for that; 0 where they are not.
 int64_t repeating_cells(const QuarterRowShape& shape, int32_t samples) {
     const int64_t points = int64_t{samples} * shape.src_columns;
     return points % shape.dst_columns == 0 ? points / shape.dst_columns : 0;
 }
 
+// Lets the next vectors have the masks of those a period before them. False, where a window would
+// begin past last_base.
+template <class Entry>
+bool repeat_period(Entry* entry, int32_t period, int64_t bytes, int32_t last_base) {
+    for (int32_t k = 0; k < period; ++k) {
+        entry[k] = entry[k - period];
+        if (!entry[k].move(bytes, last_base)) return false;
+    }
+    return true;
+}
+
 // Plans vectors until the samples or the storage end. Entries, one for each vector, grow from the
 // front of the storage, blocks of `mask_bytes` from its back. Simple ratios repeat: as long as they
-// do, vectors share one block, which stays in the cache and leaves room for longer strips.
+// do, vectors share the blocks of the first `period`, which stay in the cache and leave room for
+// longer strips.
 //
 // encode(masks, entry, taps, count) writes the masks of the vector with these taps, and all of its
 // entry but where the masks are. An entry's move(bytes, last_base) moves its windows on; false, and
 // nothing is moved, when one would begin past last_base.
 template <class Entry, class Encode>
 void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumns& columns,
-                  int32_t samples, int32_t span, int32_t mask_bytes, const Encode& encode) {
+                  int32_t samples, int32_t span, int32_t mask_bytes, int32_t period,
+                  const Encode& encode) {
     constexpr int32_t kEntryBytes = static_cast<int32_t>(sizeof(Entry));
-    const int64_t cells = repeating_cells(shape, plan.vector_samples);
+    const int32_t period_samples = period * plan.vector_samples;
+    const int64_t cells = repeating_cells(shape, period_samples);
     const auto last_base = static_cast<int32_t>(plan.row_bytes - span);
-    auto* entry = reinterpret_cast<Entry*>(plan.bytes);
+    auto* const entries = reinterpret_cast<Entry*>(plan.bytes);
     int32_t masks = kPlanBytes;
     int32_t room = kPlanBytes;
-    for (plan.samples = 0; plan.samples < samples; ++entry) {
+    int32_t vectors = 0;
+    plan.repeating = 0;
+    for (plan.samples = 0; plan.samples < samples;) {
         room -= kEntryBytes;
         if (room < mask_bytes) return;
+        Entry* const entry = entries + vectors;
         const int32_t rest = samples - plan.samples;
-        const int32_t count = rest < plan.vector_samples ? rest : plan.vector_samples;
-        if (cells > 0 && plan.samples > 0 && count == plan.vector_samples) {
-            *entry = entry[-1];
-            if (entry->move(cells * plan.sample_bytes, last_base)) {
-                columns.skip_cells(cells);
-                plan.samples += count;
-                continue;
-            }
+        if (cells > 0 && vectors >= period && rest >= period_samples &&
+            repeat_period(entry, period, cells * plan.sample_bytes, last_base)) {
+            columns.skip_cells(cells);
+            plan.samples += period_samples;
+            room -= (period - 1) * kEntryBytes;
+            const bool from_first = vectors == period || vectors == plan.repeating;
+            vectors += period;
+            if (from_first) plan.repeating = vectors;
+            continue;
         }
+        const int32_t count = rest < plan.vector_samples ? rest : plan.vector_samples;
         Tap taps[64];
         for (int32_t i = 0; i < count; ++i) taps[i] = columns.next();
         uint8_t* block = plan.bytes + masks - mask_bytes;
@@ -148,6 +169,7 @@ void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumn
         }
         entry->masks = masks;
         plan.samples += count;
+        ++vectors;
     }
 }
 
@@ -184,7 +206,8 @@ void plan_offsets(QuarterPlan& plan, const QuarterRowShape& shape, const WindowS
         memcpy(masks + kVector, window.right, kVector);
         entry.base = window.base;
     };
-    plan_vectors<VectorEntry>(plan, shape, columns, samples, span, 2 * kVector, encode);
+    plan_vectors<VectorEntry>(plan, shape, columns, samples, span, 2 * kVector, vector.period,
+                              encode);
 }
 
 }  // namespace

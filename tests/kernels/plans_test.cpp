@@ -78,7 +78,8 @@ std::string quarter_plan(const Kernels& set, const QuarterRow& row) {
         *plan, {row.sample_bytes, row.source, row.destination}, columns, row.destination);
     std::string text = names().of(kernels.store_pair);
     // Only plans of windows have vectors.
-    if (text.find("run_windows") != std::string::npos) {
+    if (text.find("run_windows") != std::string::npos ||
+        text.find("run_repeating") != std::string::npos) {
         text += ", " + std::to_string(plan->vector_samples) + " samples in a vector";
     }
     if (plan->samples < row.destination) {

@@ -251,6 +251,28 @@ TEST_F(VectorQuarterKernels, PartsOfRowsWithSimpleRatios) {
     }
 }
 
+// Vectors of such ratios share shuffles, which kernels may keep from the first vector to the last
+// whose windows lie inside the row.
+TEST_F(VectorQuarterKernels, RatiosThatRepeatFromVectorToVector) {
+    constexpr Ratio kRatios[] = {{8, 3}, {5, 2},   {12, 5}, {25, 8}, {64, 15}, {6, 1},
+                                 {9, 4}, {21, 10}, {5, 3},  {3, 2},  {7, 8},   {1, 2}};
+    for (const NamedKernels& set : vector_sets_) {
+        Random random(37);
+        SCOPED_TRACE(random.trace());
+        for (const Ratio ratio : kRatios) {
+            for (const int32_t n : {1, 2, 3, 4}) {
+                for (int32_t groups = 1; groups * ratio.dst <= 200 && !HasFailure(); ++groups) {
+                    const Row row = {n, ratio.src * groups, ratio.dst * groups};
+                    check_row(set, row, random);
+                    const int32_t first = random.between(0, row.dst_columns - 1);
+                    const int32_t end = random.between(first + 1, row.dst_columns);
+                    check_columns(set, row, first, end, random);
+                }
+            }
+        }
+    }
+}
+
 TEST_F(VectorQuarterKernels, RowsOfSeveralStrips) {
     for (const NamedKernels& set : vector_sets_) {
         Random random(33);
