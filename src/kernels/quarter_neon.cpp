@@ -85,7 +85,6 @@ OVRIN_ALWAYS_INLINE uint8x16_t gather(const QuarterRows& rows, const QuarterPlan
     const Offsets<kVector>& offsets = offsets_of(plan, entry);
     const uint8x16_t left = vld1q_u8(offsets.left);
     const uint8x16_t right = vld1q_u8(offsets.right);
-    if (kWindows > 1) fetch<kWindows, kPair>(rows, entry.base);
     return look_up_all<kWindows, kPair>(rows, left, right, entry.base);
 }
 
@@ -125,13 +124,17 @@ void run_windows_from(int32_t done, uint8_t* dst, const QuarterRows& source,
     };
     if constexpr (kWindows <= kMaxWindowsOfTwo) {
         for (; rest >= step + kVector; rest -= 2 * step, dst += 2 * step, entry += 2) {
+            if (kWindows > 1) fetch<2 * kWindows, kPair>(rows, entry[0].base);
             const uint8x16_t first = vector(entry[0]);
             const uint8x16_t second = vector(entry[1]);
             put<kAdd>(dst, first);
             put<kAdd>(dst + step, second);
         }
     }
-    for (; rest >= kVector; rest -= step, dst += step, ++entry) put<kAdd>(dst, vector(*entry));
+    for (; rest >= kVector; rest -= step, dst += step, ++entry) {
+        if (kWindows > 1) fetch<kWindows, kPair>(rows, entry->base);
+        put<kAdd>(dst, vector(*entry));
+    }
     for (; rest > 0; rest -= step, dst += step, ++entry) {
         put_part<kAdd>(dst, vector(*entry), rest < step ? rest : step);
     }
