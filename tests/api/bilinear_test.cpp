@@ -338,6 +338,23 @@ TEST(Bilinear, TheCanvasOutsideTheRectangleIsBlack) {
     }
 }
 
+// Pictures in the corner that reach only one of the far edges, or none, or both.
+TEST(Bilinear, FarEdgesThatAreNotReachedAreBlack) {
+    Random random(48);
+    SCOPED_TRACE(random.trace());
+    for (const int32_t format : kFormats) {
+        for (const int32_t wider : {0, 1, 2, 9}) {
+            for (const int32_t higher : {0, 1, 2, 9}) {
+                BilinearCall call = call_without_target(format, 9, 7, 12, 10);
+                call.with_target = true;
+                call.g.canvas_width = 12 + wider;
+                call.g.canvas_height = 10 + higher;
+                check(call, random);
+            }
+        }
+    }
+}
+
 TEST(Bilinear, PlanarChromaColumnsRoundUp) {
     std::vector<uint8_t> src(12 * 12 + 36 + 36 + 64);
     for (size_t i = 0; i < 72; ++i) src[144 + i] = static_cast<uint8_t>(i % 6 * 16);
