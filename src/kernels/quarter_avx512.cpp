@@ -107,9 +107,12 @@ constexpr QuarterKernels kQuarterKernels[kMaxWindows] = {
 
 const QuarterKernels& plan_quarters_avx512(QuarterPlan& plan, const QuarterRowShape& shape,
                                            QuarterColumns& columns, int32_t samples) {
-    // At 3:2 and 2:3 of smaller samples, and for pixels of three bytes, permutations are as fast.
+    // At 3:2 and 2:3 of smaller samples, and for pixels of three bytes that are not enlarged,
+    // permutations are as fast.
     const bool is_whole = shape.src_columns % shape.dst_columns == 0;
-    if (shape.sample_bytes == 4 || (is_whole && shape.sample_bytes < 3)) {
+    const bool enlarges = shape.src_columns < shape.dst_columns;
+    if (shape.sample_bytes == 4 || (enlarges && shape.sample_bytes == 3) ||
+        (is_whole && shape.sample_bytes < 3)) {
         const QuarterKernels* simple = plan_simple_quarters_avx2(plan, shape, columns, samples);
         if (simple != nullptr) return *simple;
     }

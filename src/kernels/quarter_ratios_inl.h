@@ -63,8 +63,13 @@ constexpr ptrdiff_t src_bytes(ptrdiff_t dst_bytes) {
     return dst_bytes / Pattern::kRatio.dst * Pattern::kRatio.src;
 }
 
+// Whether a pattern fetches the next rows while it works on these.
+template <class Pattern>
+constexpr bool kFetches = true;
+
 template <class Pattern, bool kPair>
 OVRIN_ALWAYS_INLINE void fetch_next(const QuarterRows& rows, ptrdiff_t offset) {
+    if (!kFetches<Pattern>) return;
     constexpr ptrdiff_t kCacheLine = 64;
     for (ptrdiff_t i = 0; i < src_bytes<Pattern>(Pattern::kDstBytes); i += kCacheLine) {
         __builtin_prefetch(rows.next_top + offset + i);
@@ -76,14 +81,15 @@ OVRIN_ALWAYS_INLINE void fetch_next(const QuarterRows& rows, ptrdiff_t offset) {
 template <class Pattern>
 constexpr int32_t kOverrun = 0;
 
-// Makes the pattern's bytes in a copy, and those from `done` on of what lies at dst.
+// Makes the pattern's bytes in a copy. Of them the first `done` lie at dst already: storing them
+// once more changes nothing, and copying a known number of bytes is no call; adding them would.
 template <class Pattern, bool kPair, bool kAdd>
 OVRIN_ALWAYS_INLINE void make_through_copy(uint8_t* dst, const uint8_t* top, const uint8_t* bottom,
                                            ptrdiff_t done) {
     alignas(64) uint8_t copy[Pattern::kDstBytes + kOverrun<Pattern>];
     Pattern::template store<kPair>(copy, top, bottom);
     if (!kAdd) {
-        memcpy(dst + done, copy + done, static_cast<size_t>(Pattern::kDstBytes - done));
+        memcpy(dst, copy, Pattern::kDstBytes);
         return;
     }
     memset(copy, 0, static_cast<size_t>(done));
