@@ -2,7 +2,6 @@
 // Every function of the public header while each thing that it asks of the system is refused: each
 // request alone, and each together with all that follow, until a call gets through. The outcome is
 // the one that the header states, nothing leaks, no thread stays behind, nothing hangs.
-#include <dirent.h>
 #include <gtest/gtest.h>
 #include <ovrinresize.h>
 #include <unistd.h>
@@ -18,6 +17,7 @@
 
 #include "declared_functions.h"
 #include "reference/yuv420.h"
+#include "support/entries.h"
 #include "support/faults.h"
 #include "support/letterbox.h"
 #include "support/random.h"
@@ -750,19 +750,6 @@ void give_up(int /*signal*/) {
     const char text[] = " hangs\n";
     if (write(2, running, strlen(running)) < 0 || write(2, text, sizeof text - 1) < 0) _exit(3);
     _exit(2);
-}
-
-int thread_count() {
-    int count = 0;
-    DIR* tasks = opendir("/proc/self/task");
-    while (const dirent* entry = readdir(tasks)) count += entry->d_name[0] != '.';
-    closedir(tasks);
-    return count;
-}
-
-bool only_threads(int expected) {
-    for (int i = 0; i < 5000 && thread_count() > expected; ++i) usleep(1000);
-    return thread_count() <= expected;
 }
 
 // Pools that could start neither a worker nor the thread that would end them stay behind, flagged:
