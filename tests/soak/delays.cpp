@@ -119,6 +119,7 @@ int __real_pthread_cond_wait(pthread_cond_t* condition, pthread_mutex_t* mutex);
 int __real_pthread_cond_broadcast(pthread_cond_t* condition);
 int32_t __real_ovrin_threadpool_add_task(ovrin_threadpool* pool, void (*function)(void*),
                                          void* argument, int32_t wait);
+void __real_ovrin_threadpool_free(ovrin_threadpool* pool, int32_t sync);
 
 int __wrap_pthread_create(pthread_t* thread, const pthread_attr_t* attributes,
                           void* (*start)(void*), void* argument) {
@@ -167,5 +168,15 @@ int32_t __wrap_ovrin_threadpool_add_task(ovrin_threadpool* pool, void (*function
     const int32_t result = __real_ovrin_threadpool_add_task(pool, LateTask::run, task, wait);
     if (result != 1) delete task;
     return result;
+}
+
+// A pool for which no thread could be had runs none of its tasks.
+void __wrap_ovrin_threadpool_free(ovrin_threadpool* pool, int32_t sync) {
+    if (pool->thread_count == 0) {
+        while (void* slot = ovrin_threadpool_queue_dequeue(&pool->pending)) {
+            delete static_cast<LateTask*>(static_cast<ovrin_threadpool_task*>(slot)->argument);
+        }
+    }
+    __real_ovrin_threadpool_free(pool, sync);
 }
 }

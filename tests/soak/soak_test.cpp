@@ -85,6 +85,7 @@ void make_and_end_pools(int count, Refuse refuse) {
     for (int i = 0; i < 60000 && in_background.runs < left_to_background; ++i) usleep(1000);
     EXPECT_EQ(in_background.runs, left_to_background);
     EXPECT_GT(made, 0);
+    EXPECT_TRUE(refuse == Refuse::kNothing || count < 50 || made < count);
     std::cout << made << " pools of " << count << ", " << delays() << " delays, " << refusals()
               << " refusals\n";
 }
@@ -134,7 +135,6 @@ TEST(Soak, PoolsOnOneProcessorRunAllTheirTasksAndEnd) {
 
 TEST(Soak, PoolsThatGetTheirThreadsRunAllTheirTasksAndEnd) {
     make_and_end_pools(repetitions(usually(1000), 100000), Refuse::kAtRandom);
-    EXPECT_GT(refusals(), 0);
 }
 
 TEST(Soak, ThreadedCallsGiveTheSameBytesEachTime) {
