@@ -12,6 +12,16 @@
  *    it has written by then. Null pointers are looked for only where the comment says so.
  *  - Any number of threads may call any functions at once, on different buffers. The library has no
  *    global state, and nothing that a call makes outlives it.
+ *  - Nobody cancels a thread (pthread_cancel) inside a call that uses worker threads or a pool:
+ *    they would go on with what is gone, and locks would stay taken. Let the thread disable
+ *    cancellation around the call (pthread_setcancelstate); it ends afterwards then. Calls that
+ *    stay on the calling thread, but for ov_sleep, are no cancellation points; asynchronous
+ *    cancellation is for none.
+ *  - Signals end no call early but ov_sleep. Worker threads have the signal mask of the thread that
+ *    started them, so handlers may run on them. Handlers must not call the library.
+ *  - A child of fork() may call any function, even if other threads were inside calls, where its C
+ *    library lets it have memory and threads, as glibc does. A pool from before the fork has no
+ *    workers there and must not be touched.
  *  - The library does not know how long a buffer is. It reads and writes as much as sizes and row
  *    lengths say. A size of 0 or less means that there is no picture and no buffer.
  *  - Band records come from a walk that starts at the first band, as "Bands" below says; other

@@ -15,7 +15,13 @@ void add_task_for_each_worker(ovrin_threadpool* pool, void (*work)(void*), void*
 
 }  // namespace
 
-BandPool::BandPool() : pool_(ovrin_threadpool_init(kBandThreads)) {}
+// Unlike ovrin_threadpool_init, which needs one more thread to end a pool that lacks a worker, and
+// leaves its idle workers for good when that is refused, too.
+BandPool::BandPool() : pool_(make_pool(kBandThreads)) {
+    if (pool_ == nullptr || start_workers(pool_, kBandThreads)) return;
+    ovrin_threadpool_free(pool_, 1);
+    pool_ = nullptr;
+}
 
 BandPool::~BandPool() {
     if (pool_ != nullptr) ovrin_threadpool_free(pool_, 1);
