@@ -9,8 +9,8 @@ build=$(cd "$1" && pwd)
 sanitized=$(cd "$2" && pwd)
 source "$here/compiler/compiler.sh"
 
-calls=1000000
-sanitized_calls=100000
+calls=${OVRIN_CALLS:-1000000}
+sanitized_calls=$((calls / 10))
 seed=${OVRIN_TEST_SEED:-1}
 classes=$build/test-classes
 # JUnit, as Debian installs it.
