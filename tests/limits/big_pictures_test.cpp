@@ -214,27 +214,28 @@ TEST_F(BigPictures, Bilinear) {
     }
 }
 
-// Rows 700 MB apart: only the five rows themselves are read, but beyond 2 GiB.
 // Band records hold the bytes between two rows in 32 bits; such pictures stay on one thread.
 TEST_F(BigPictures, BilinearRowsFurtherApartThanABandCanSay) {
-    constexpr int32_t kStride = INT32_MAX / 4 + 1, kW = 8, kH = 2, kDstW = 6, kDstH = 1100;
-    Sparse src(int64_t{kStride} * kH * 4 + kW * 4);
+    constexpr int32_t kStride = INT32_MAX / 4 + 1, kWidth = 8, kHeight = 2;
+    constexpr int32_t kDstWidth = 6, kDstHeight = 1100;
+    Sparse src(int64_t{kStride} * kHeight * 4 + kWidth * 4);
     SKIP_UNLESS_MAPPED(src);
-    for (int64_t i = 0; i < kW * 4; ++i) src.data()[i] = static_cast<uint8_t>(7 * i + 1);
+    for (int64_t i = 0; i < kWidth * 4; ++i) src.data()[i] = static_cast<uint8_t>(7 * i + 1);
     ovrin_resize_target target = {};
-    target.src_width = kW;
-    target.src_height = target.src_buffer_height = kH;
+    target.src_width = kWidth;
+    target.src_height = target.src_buffer_height = kHeight;
     target.src_stride = kStride;
     target.format = 7;
-    target.canvas_width = kDstW;
-    target.canvas_height = kDstH;
-    std::vector<uint8_t> single(size_t{kDstW} * kDstH * 4);
+    target.canvas_width = kDstWidth;
+    target.canvas_height = kDstHeight;
+    std::vector<uint8_t> single(size_t{kDstWidth} * kDstHeight * 4);
     std::vector<uint8_t> chosen(single.size(), 0xEE);
-    ov_bilinear_sg(src.data(), single.data(), kW, kH, kDstW, kDstH, 7, &target);
-    ov_bilinear(src.data(), chosen.data(), kW, kH, kDstW, kDstH, 7, &target);
+    ov_bilinear_sg(src.data(), single.data(), kWidth, kHeight, kDstWidth, kDstHeight, 7, &target);
+    ov_bilinear(src.data(), chosen.data(), kWidth, kHeight, kDstWidth, kDstHeight, 7, &target);
     EXPECT_EQ(chosen, single);
 }
 
+// Rows 700 MB apart: only the five rows themselves are read, but beyond 2 GiB.
 TEST_F(BigPictures, LanczosRowsFarApart) {
     constexpr int32_t kStride = 700 << 20, kSize = 5;
     Sparse src(int64_t{kStride} * (kSize - 1) + kSize);
