@@ -33,15 +33,10 @@ template <int N>
 class WindowBases {
 public:
     WindowBases(const BilinearColumns& columns, int32_t to_right, int32_t window_bytes)
-        : columns_(columns) {
-        if (columns.count < 1) return;
-        const int64_t end = N * (int64_t{columns.index[columns.count - 1]} + to_right + 1);
-        last_ = end - window_bytes;
-    }
+        : columns_(columns),
+          last_(N * (int64_t{columns.index[columns.count - 1]} + to_right + 1) - window_bytes) {}
 
-    bool fit() const {
-        return last_ <= INT32_MAX && columns_.count > 0 && last_ >= int64_t{N} * columns_.index[0];
-    }
+    bool fit() const { return last_ <= INT32_MAX && last_ >= int64_t{N} * columns_.index[0]; }
 
     // For a window whose first sample is that of `column`; columns past the last one take the last.
     int64_t base(int32_t column) const {
@@ -52,7 +47,7 @@ public:
 
 private:
     const BilinearColumns& columns_;
-    int64_t last_ = 0;
+    const int64_t last_;
 };
 
 // How a strip is to be cut: the size of a window, how many quads share it, and how many quads the

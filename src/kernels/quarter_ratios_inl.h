@@ -111,7 +111,8 @@ void run_pattern(uint8_t* dst, const QuarterRows& source, const QuarterPlan& pla
             Pattern::template store<kPair>(dst + done, rows.top + offset, rows.bottom + offset);
             offset += src_bytes<Pattern>(kStep);
         }
-        if (done < bytes && kOverrun<Pattern> == 0) {
+        if constexpr (kOverrun<Pattern> == 0) {
+            if (done == bytes) return;
             const ptrdiff_t offset = src_bytes<Pattern>(last);
             return Pattern::template store<kPair>(dst + last, rows.top + offset,
                                                   rows.bottom + offset);

@@ -23,10 +23,9 @@ struct NearestAxis {
     float offset;
 
     NearestAxis(int32_t src, int32_t dst)
-        : src_size(src), step(static_cast<int32_t>(static_cast<double>(src) / dst + 0.5)) {
-        const float half = ceilf(static_cast<float>(step) * 0.5F);
-        offset = half < 0.0F ? 0.0F : half;
-    }
+        : src_size(src),
+          step(static_cast<int32_t>(static_cast<double>(src) / dst + 0.5)),
+          offset(ceilf(static_cast<float>(step) * 0.5F)) {}
 
     // Source index of destination index k; at or beyond src_size for a sample that is dropped.
     int64_t at(int32_t k) const {
@@ -34,12 +33,10 @@ struct NearestAxis {
         return static_cast<int64_t>(position);
     }
 
-    bool holds(int64_t index) const { return index >= 0 && index < src_size; }
-
-    // Positions rise, so the samples that are kept are the first ones.
+    // Positions rise from 0 or more, so the samples that are kept are the first ones.
     int32_t kept(int32_t dst_size) const {
         int32_t count = 0;
-        while (count < dst_size && holds(at(count))) ++count;
+        while (count < dst_size && at(count) < src_size) ++count;
         return count;
     }
 

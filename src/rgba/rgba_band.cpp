@@ -50,7 +50,7 @@ void advance_rgba_band(ovrin_rgba_band& band, int32_t src_h, int32_t dst_h, cons
 }
 
 void run_rgba_band(ovrin_rgba_band& band, const RgbaRows& rows) {
-    if (band.rows_to_do > 0 && band.src_w > 0) {
+    if (band.rows_to_do > 0) {
         const QuarterPlane plane =
             rgba_plane({band.src + band.src_offset, rows.src_pixels, band.src_w, band.src_h},
                        {band.dst + rows.dst_x, rows.dst_pixels, band.dst_w, band.dst_h});

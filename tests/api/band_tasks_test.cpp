@@ -348,6 +348,51 @@ TEST(BandTasks, WithoutRowsOnlyDoneIsSet) {
     }
 }
 
+namespace {
+
+// There are rows to do, but the picture has no size on one side, or one that no grid can hold.
+template <class Band>
+void check_without_size(Task* task, Band band, int32_t Band::*size, int32_t none) {
+    band.*size = none;
+    Band expected = band;
+    expected.done = 1;
+    task(&band);
+    EXPECT_TRUE(same_record(band, expected)) << none;
+}
+
+}  // namespace
+
+TEST(BandTasks, OfPicturesWithoutASizeOnlyDoneIsSet) {
+    uint8_t source[1] = {};
+    uint32_t pixel[1] = {5};
+    auto* target = reinterpret_cast<uint8_t*>(pixel);
+    for (const int32_t none : {0, -1, INT32_MIN, INT32_MAX - 2, INT32_MAX}) {
+        using Rgba = ovrin_rgba_band;
+        Rgba rgba = {};
+        rgba.src = source;
+        rgba.dst = pixel;
+        rgba.src_w = rgba.src_h = rgba.dst_w = rgba.dst_h = rgba.src_rows = rgba.rows_to_do = 8;
+        for (Task* task : {_resize_rgba8888_tp, _resize_rgba8888_keep_ratio_tp}) {
+            if (none > 0) break;
+            for (int32_t Rgba::*size : {&Rgba::src_w, &Rgba::src_h, &Rgba::dst_w, &Rgba::dst_h}) {
+                check_without_size(task, rgba, size, none);
+            }
+        }
+        using Yuv = ovrin_yuv_band;
+        auto yuv = whole_picture<Yuv>({8, 8, 8, 8});
+        yuv.src = yuv.src_u = yuv.src_v = source;
+        yuv.dst = target;
+        for (Task* task : {_resize_y_u_v_tp, _resize_yuv420_tp}) {
+            check_without_size(task, yuv, &Yuv::dst_width, none);
+            check_without_size(task, yuv, &Yuv::dst_height, none);
+            if (none > 0) continue;
+            check_without_size(task, yuv, &Yuv::src_width, none);
+            check_without_size(task, yuv, &Yuv::src_height, none);
+        }
+    }
+    EXPECT_EQ(pixel[0], 5U);
+}
+
 TEST(BandTasks, ChromaThatStartsBeyondThePlaneIsSkipped) {
     Random random(115);
     SCOPED_TRACE(random.trace());

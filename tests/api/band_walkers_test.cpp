@@ -164,14 +164,15 @@ TEST(BandWalkers, EverySmallHeightAndBand) {
 }
 
 // A record's points are not read before its first row, its other running fields are: here the
-// indices start elsewhere, together, each for itself, or one apart from the others.
+// indices start elsewhere: together, each for itself, or one, or both right ones, apart from the
+// others.
 TEST(BandWalkers, IndicesAreTakenFromTheRecord) {
     Random random(104);
     SCOPED_TRACE(random.trace());
     for (int i = 0; i < rounds(500) && !HasFatalFailure(); ++i) {
         const Walked w = random_walked(random);
         int32_t start = random.between(0, 100000);
-        const auto next = [&] { return i % 3 == 0 ? start += random.between(1, 9) : start; };
+        const auto next = [&] { return i % 4 == 0 ? start += random.between(1, 9) : start; };
         auto yuv = first_yuv(w.band_rows, w.stride);
         auto nv21 = first_nv21(w.band_rows, w.stride);
         const auto move_indices = [&](auto& band, const auto& plane) {
@@ -179,10 +180,11 @@ TEST(BandWalkers, IndicesAreTakenFromTheRecord) {
                  {plane.top_left, plane.top_right, plane.bottom_left, plane.bottom_right}) {
                 band.*index = next();
             }
-            if (i % 3 == 1) {
+            if (i % 4 == 1) {
                 band.*random.pick({plane.top_left, plane.top_right, plane.bottom_left,
                                    plane.bottom_right}) += 1;
             }
+            if (i % 4 == 2) band.*plane.top_right = band.*plane.bottom_right += 5;
         };
         move_indices(yuv, reference::kLumaFields<ovrin_yuv_band>);
         move_indices(yuv, reference::kChromaFields<ovrin_yuv_band>);

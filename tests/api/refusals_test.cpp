@@ -121,31 +121,34 @@ TEST(Refusals, ABilinearBandWithoutPixelBytesHasPackedRows) {
     }
 }
 
-// A record may send the samples of left and right columns to two places; no walk makes one, but its
-// four indices are the caller's to set.
+// A record may send the samples of left and right columns, and of top and bottom rows, to places of
+// their own; no walk makes one, but its four indices are the caller's to set.
 TEST(Refusals, ABandAddsEachColumnsSamplesWhereItsIndexSays) {
-    const Bytes src = Random(173).bytes(4 * 4 * 4);
-    std::vector<uint32_t> dst(16);
-    ovrin_rgba_band band = {};
-    band.src_w = band.src_h = band.src_stride = band.src_rows = band.rows_to_do = 4;
-    band.dst_w = band.dst_h = 2;
-    band.di_13 = band.di_33 = 8;
-    band.src = src.data();
-    band.dst = dst.data();
-    _resize_rgba8888_tp(&band);
+    const Bytes src = Random(173).bytes(5 * 4 * 4);
+    const int32_t places[][2] = {{8, 8}, {0, 8}, {8, 0}};
+    for (const auto& [top_right, bottom_right] : places) {
+        std::vector<uint32_t> dst(16);
+        ovrin_rgba_band band = {};
+        band.src_w = band.src_stride = 5;
+        band.src_h = band.src_rows = band.rows_to_do = 4;
+        band.dst_w = band.dst_h = 2;
+        band.di_13 = top_right;
+        band.di_33 = bottom_right;
+        band.src = src.data();
+        band.dst = dst.data();
+        _resize_rgba8888_tp(&band);
 
-    const auto quarter = [&](int row, int column, int byte) {
-        return src[static_cast<size_t>((row * 4 + column) * 4 + byte)] >> 2;
-    };
-    Bytes bytes(dst.size() * 4), expected(bytes.size());
-    memcpy(bytes.data(), dst.data(), bytes.size());
-    for (int i = 0; i < 16; ++i) {
-        const int row = i / 8, column = i / 4 % 2, byte = i % 4;
-        for (const int right : {0, 1}) {
-            const int sum = quarter(2 * row, 2 * column + right, byte) +
-                            quarter(2 * row + 1, 2 * column + right, byte);
-            expected[static_cast<size_t>(right * 32 + i)] = static_cast<uint8_t>(sum);
+        constexpr int kColumns[2][2] = {{0, 3}, {1, 4}};  // the left ones, then the right ones
+        Bytes bytes(dst.size() * 4), expected(bytes.size());
+        memcpy(bytes.data(), dst.data(), bytes.size());
+        for (int i = 0; i < 64; ++i) {
+            const int byte = i % 4, column = i / 4 % 2, row = i / 8 % 2;
+            const int right = i / 16 % 2, bottom = i / 32;
+            const int place = right == 0 ? 0 : bottom == 0 ? top_right : bottom_right;
+            const int from = ((2 * row + bottom) * 5 + kColumns[right][column]) * 4 + byte;
+            uint8_t& sum = expected[static_cast<size_t>((place + 2 * row + column) * 4 + byte)];
+            sum = static_cast<uint8_t>(sum + (src[static_cast<size_t>(from)] >> 2));
         }
+        EXPECT_EQ(bytes, expected) << top_right << ", " << bottom_right;
     }
-    EXPECT_EQ(bytes, expected);
 }

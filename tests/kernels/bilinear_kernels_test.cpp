@@ -122,6 +122,45 @@ TEST_F(BilinearKernelsTest, AcrossEqualsTheScalarOne) {
     }
 }
 
+// Columns out of order, which no axis has, share no window; rows of more than 2 GB have none at
+// all.
+TEST_F(BilinearKernelsTest, ColumnsThatNoWindowHoldsAreLeftToOtherKernels) {
+    const auto columns = std::make_unique<BilinearColumns>();
+    const auto plan = std::make_unique<BilinearPlan>();
+    const auto fill = [&](int32_t sample_bytes, int32_t first) {
+        columns->sample_bytes = sample_bytes;
+        columns->count = 100;
+        columns->to_right = 1;
+        for (int32_t i = 0; i < columns->count; ++i) {
+            columns->index[i] = first + i;
+            columns->weight[i] = kBilinearOne;
+        }
+    };
+    for (const NamedKernels& set : vector_sets_) {
+        for (const int32_t n : {1, 2, 4}) {
+            SCOPED_TRACE(::testing::Message() << set.name << ", samples of " << n << " bytes");
+            const auto across_of = [&](const Kernels& kernels) {
+                return kernels.plan_bilinear(*plan, *columns).across;
+            };
+            const auto copy_of = [&](const Kernels& kernels) {
+                return kernels.plan_bilinear_copy(*plan, *columns);
+            };
+            fill(n, 100);
+            BilinearAcross* const across = across_of(*set.kernels);
+            BilinearCopy* const copy = copy_of(*set.kernels);
+            EXPECT_NE(across, across_of(scalar_kernels));
+            EXPECT_NE(copy, copy_of(scalar_kernels));
+            columns->index[2] = 0;
+            EXPECT_NE(across_of(*set.kernels), across);
+            EXPECT_EQ(copy_of(*set.kernels), copy_of(scalar_kernels));
+            if (n == 1) continue;  // 32 bits count the bytes of any row
+            fill(n, INT32_MAX / n + 1);
+            EXPECT_EQ(across_of(*set.kernels), across_of(scalar_kernels));
+            EXPECT_EQ(copy_of(*set.kernels), copy_of(scalar_kernels));
+        }
+    }
+}
+
 TEST_F(BilinearKernelsTest, DownEqualsTheScalarOne) {
     const auto columns = std::make_unique<BilinearColumns>();
     const auto plan = std::make_unique<BilinearPlan>();
