@@ -184,9 +184,9 @@ const char* name_of(Engine engine) {
         case Engine::kLanczos:
             return "lanczos";
         case Engine::kNearest:
-            return "nearest";
+            break;
     }
-    return "";
+    return "nearest";
 }
 
 void check_engine(Engine engine, PixelFormat format) {

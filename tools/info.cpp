@@ -43,9 +43,9 @@ const char* name_of(Container container) {
         case Container::kY4m:
             return "Y4M";
         case Container::kRaw:
-            return "raw";
+            break;
     }
-    return "";
+    return "raw";
 }
 
 // Those that differ from pixel to pixel: image files are read as RGBA, whatever they hold.

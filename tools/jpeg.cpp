@@ -67,13 +67,10 @@ void on_message(j_common_ptr codec, int level) {
     }
 }
 
-void ignore_output(j_common_ptr) {}
-
 jpeg_error_mgr* init_errors(ErrorState* state) {
     jpeg_std_error(&state->manager);
     state->manager.error_exit = on_error;
     state->manager.emit_message = on_message;
-    state->manager.output_message = ignore_output;
     state->lost = 0;
     state->message[0] = '\0';
     return &state->manager;
@@ -325,7 +322,8 @@ void set_density(jpeg_compress_struct* codec, const Density& density) {
     const double unit = density.is_absolute ? kInchesPerMeter : 1;
     const double x = density.x / unit + 0.5;
     const double y = density.y / unit + 0.5;
-    if (x < 1 || y < 1 || x > UINT16_MAX || y > UINT16_MAX) return;
+    constexpr double kPast = UINT16_MAX + 1.0;
+    if (x < 1 || y < 1 || x >= kPast || y >= kPast) return;
     codec->density_unit = density.is_absolute ? kPerInch : 0;
     codec->X_density = static_cast<UINT16>(x);
     codec->Y_density = static_cast<UINT16>(y);

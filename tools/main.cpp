@@ -48,9 +48,9 @@ bool carry_out(const Options& options) {
         case Command::kCompare:
             return compare(options);
         case Command::kSelftest:
-            return selftest(options);
+            break;
     }
-    return false;
+    return selftest(options);
 }
 
 int command(int argc, char** argv) {

@@ -32,9 +32,9 @@ Steps steps_of(Orientation orientation) {
         case Orientation::kMirroredTurned90:
             return {true, true, true};
         case Orientation::kTurned270:
-            return {true, true, false};
+            break;
     }
-    return {};
+    return {true, true, false};
 }
 
 template <class Sample>

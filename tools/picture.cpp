@@ -32,9 +32,9 @@ const char* name_of(PixelFormat format) {
         case PixelFormat::kI422:
             return "i422";
         case PixelFormat::kI444:
-            return "i444";
+            break;
     }
-    return "";
+    return "i444";
 }
 
 bool is_420(PixelFormat format) {

@@ -174,9 +174,9 @@ size_t bytes_needed(const Header& header) {
         case Coding::kBits:
             return (width + 7) / 8 * static_cast<size_t>(header.size.height);
         case Coding::kBytes:
-            return header.samples() * bytes_per_sample(header);
+            break;
     }
-    return 0;
+    return header.samples() * bytes_per_sample(header);
 }
 
 // What each sample becomes, 0 to 255, rounded. Those above the largest value count as that.

@@ -3,9 +3,13 @@
 #include <gtest/gtest.h>
 #include <png.h>
 
+#include <array>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <functional>
+#include <optional>
+#include <string>
 #include <vector>
 // jpeglib.h needs size_t and FILE from the headers above.
 #include <jpeglib.h>
@@ -115,7 +119,7 @@ Bytes png_of(int depth, int colors, const Bytes& row) {
 // change: what is asked of the library besides, once its defaults are set.
 Bytes jpeg_of(
     J_COLOR_SPACE colors, int channels,
-    void (*change)(jpeg_compress_struct*) = [](jpeg_compress_struct*) {}) {
+    const std::function<void(jpeg_compress_struct*)>& change = [](jpeg_compress_struct*) {}) {
     return written([&](FILE* out) {
         jpeg_compress_struct codec = {};
         jpeg_error_mgr errors = {};
@@ -293,6 +297,131 @@ TEST(Codecs, JpegInPlanesIsThePictureReduced) {
     }
 }
 
+// Fewer rows than the codec makes of the same width.
+TEST(Codecs, ReducedJpegLosesItsLastRow) {
+    const Bytes file = encoded(kCodecs[1], gradient({80, 61}));
+    const Picture whole = tool::JpegReader(file).read({false, 1});
+    const Picture reduced = tool::JpegReader(file).read({false, 8});
+    ASSERT_EQ(tool::to_string(reduced.size), "10x7");
+    for (size_t i = 0; i < 10; ++i) {
+        const size_t middle = (size_t{6 * 8 + 4} * 80 + i * 8 + 4) * 4;
+        EXPECT_NEAR(reduced.bytes()[(6 * 10 + i) * 4], whole.bytes()[middle], 12) << i;
+    }
+}
+
+namespace {
+
+// The samples of a plane across and down a block of the whole.
+struct Sampling {
+    int across, down;
+};
+using Samplings = std::array<Sampling, 3>;
+
+std::optional<tool::PixelFormat> planes_of(const Samplings& samplings, J_COLOR_SPACE stored) {
+    return tool::JpegReader(jpeg_of(JCS_RGB, 3,
+                                    [&](jpeg_compress_struct* codec) {
+                                        jpeg_set_colorspace(codec, stored);
+                                        for (size_t i = 0; i < 3; ++i) {
+                                            codec->comp_info[i].h_samp_factor = samplings[i].across;
+                                            codec->comp_info[i].v_samp_factor = samplings[i].down;
+                                        }
+                                    }))
+        .planes(1);
+}
+
+}  // namespace
+
+TEST(Codecs, JpegInOtherPlanesIsReadAsPixels) {
+    using tool::PixelFormat;
+    const Sampling one = {1, 1};
+    EXPECT_EQ(planes_of({one, one, one}, JCS_YCbCr), PixelFormat::kI444);
+    EXPECT_EQ(planes_of({{{2, 1}, one, one}}, JCS_YCbCr), PixelFormat::kI422);
+    EXPECT_EQ(planes_of({{{2, 2}, one, one}}, JCS_YCbCr), PixelFormat::kI420);
+    EXPECT_FALSE(planes_of({one, one, one}, JCS_RGB));
+    const Samplings others[] = {{{{1, 2}, one, one}},    {{{4, 1}, one, one}},
+                                {{{2, 2}, {2, 1}, one}}, {{{2, 2}, one, {1, 2}}},
+                                {{{2, 1}, {2, 1}, one}}, {{{2, 2}, {1, 2}, {1, 2}}}};
+    for (const Samplings& s : others) {
+        EXPECT_FALSE(planes_of(s, JCS_YCbCr)) << s[0].across << s[0].down << s[1].across;
+    }
+}
+
+TEST(Codecs, JpegDensitiesThatAreNone) {
+    const auto stored = [](void (*change)(jpeg_compress_struct*)) {
+        const Bytes file = jpeg_of(JCS_RGB, 3, change);
+        tool::Metadata metadata;
+        tool::decode_jpeg(file.data(), file.size(), &metadata);
+        return metadata.density;
+    };
+    EXPECT_TRUE(stored([](jpeg_compress_struct* codec) { codec->X_density = 2; }));
+    EXPECT_FALSE(stored([](jpeg_compress_struct* codec) { codec->X_density = 0; }));
+    EXPECT_FALSE(stored([](jpeg_compress_struct* codec) { codec->Y_density = 0; }));
+    EXPECT_FALSE(stored([](jpeg_compress_struct* codec) {
+        codec->X_density = 2;
+        codec->write_JFIF_header = FALSE;
+    }));
+    const auto written_as = [](const tool::Density& density) {
+        tool::Metadata metadata;
+        metadata.density = density;
+        const Bytes file = written([&](FILE* out) {
+            tool::encode_jpeg(gradient({8, 8}), metadata, 90, out);
+        });
+        tool::Metadata again;
+        tool::decode_jpeg(file.data(), file.size(), &again);
+        return again.density;
+    };
+    EXPECT_TRUE(written_as({false, 65535, 1}));
+    for (const tool::Density& density :
+         {tool::Density{false, 0, 3}, {false, 3, 0}, {false, 65536, 3}, {false, 3, 65536}}) {
+        EXPECT_FALSE(written_as(density)) << density.x << ":" << density.y;
+    }
+}
+
+// Markers that share EXIF's number, and EXIF that is too long for its marker.
+TEST(Codecs, WhatIsNoExifIsLeftOut) {
+    const Bytes file = encoded(kCodecs[1], gradient({8, 8}));
+    for (const std::string content : {"", "Exif", "http://ns.adobe.com/xap/1.0/"}) {
+        Bytes other = file;
+        const std::string marker =
+            std::string("\xFF\xE1\0", 3) + static_cast<char>(content.size() + 2) + content;
+        other.insert(other.begin() + 2, marker.begin(), marker.end());
+        tool::Metadata metadata;
+        tool::decode_jpeg(other.data(), other.size(), &metadata);
+        EXPECT_TRUE(metadata.exif.empty()) << content;
+        EXPECT_TRUE(metadata.damage.empty()) << metadata.damage;
+    }
+    tool::Metadata metadata;
+    metadata.exif = Bytes(65534, 1);
+    EXPECT_EQ(written([&](FILE* out) {
+                  tool::encode_jpeg(gradient({8, 8}), metadata, 90, out);
+              }),
+              file);
+}
+
+// A chunk that nobody needs, with a wrong sum.
+TEST(Codecs, PngWithADamagedCommentIsRead) {
+    Bytes file = png_of(8, PNG_COLOR_TYPE_GRAY, {7, 250});
+    const std::string chunk("\0\0\0\3tEXta\0b\1\2\3\4", 15);
+    constexpr ptrdiff_t kHeader = 8 + 25;
+    file.insert(file.begin() + kHeader, chunk.begin(), chunk.end());
+    EXPECT_EQ(pixels_of(decode_png(file.data(), file.size())),
+              (Bytes{7, 7, 7, 255, 250, 250, 250, 255}));
+}
+
+TEST(Codecs, FirstBytesTellTypes) {
+    const auto is = [](bool (*recognise)(const uint8_t*, size_t), const char* bytes) {
+        return recognise(reinterpret_cast<const uint8_t*>(bytes), strlen(bytes));
+    };
+    EXPECT_TRUE(is(tool::is_jpeg, "\xFF\xD8\xFF"));
+    for (const char* other : {"\xFF\xD8", "\xFE\xD8\xFF", "\xFF\xD9\xFF", "\xFF\xD8\xFE"}) {
+        EXPECT_FALSE(is(tool::is_jpeg, other)) << other;
+    }
+    for (const char* file : {"P1 ", "P7\n", "P4#"}) EXPECT_TRUE(is(tool::is_pnm, file)) << file;
+    for (const char* other : {"P1", "Q1 ", "P0 ", "P8 ", "P1x"}) {
+        EXPECT_FALSE(is(tool::is_pnm, other)) << other;
+    }
+}
+
 TEST(Codecs, JpegFromPlanesHoldsThem) {
     // Sides that are no multiples of a block, nor even.
     for (const tool::Size size : {tool::Size{1, 1}, tool::Size{16, 16}, tool::Size{37, 19}}) {
@@ -333,6 +462,13 @@ TEST(Codecs, PnmHeadersAndDepths) {
     EXPECT_EQ(pixels_of(decode_pnm("P7\nWIDTH 1\nHEIGHT 1\nDEPTH 1\nMAXVAL 1\n"
                                    "TUPLTYPE BLACKANDWHITE\nENDHDR\n\x01")),
               (Bytes{255, 255, 255, 255}));
+    EXPECT_EQ(pixels_of(decode_pnm("P7\nWIDTH 1\nHEIGHT 1\nDEPTH 2\nMAXVAL 255\n"
+                                   "TUPLTYPE GRAYSCALE_ALPHA\nENDHDR\n\x09\x20")),
+              (Bytes{9, 9, 9, 32}));
+    EXPECT_EQ(pixels_of(decode_pnm(std::string("P7\nWIDTH 1\nHEIGHT 1\nDEPTH 2\nMAXVAL 1\n"
+                                               "TUPLTYPE BLACKANDWHITE_ALPHA\nENDHDR\n\1\0",
+                                               75))),
+              (Bytes{255, 255, 255, 0}));
     EXPECT_TRUE(decode_pnm("P2 1 1 3 1").is_gray);
     EXPECT_FALSE(decode_pnm("P3 1 1 3 1 1 1").is_gray);
     for (const char* file : {"P1 2 1 0",

@@ -264,6 +264,12 @@ TEST(Y4mHeaders, AreReadAndWritten) {
     EXPECT_EQ(y4m_header_line(parse_y4m_header("YUV4MPEG2 H1 W2")), "YUV4MPEG2 W2 H1 A0:0\n");
 }
 
+TEST(Y4mHeaders, WithBadNumbersAreRefused) {
+    for (const char* tags : {"W", "Wx", "W2x", "W-1", "W2147483648", "W99999999999999999999"}) {
+        EXPECT_THROW(parse_y4m_header(std::string("YUV4MPEG2 H2 ") + tags), Error) << tags;
+    }
+}
+
 TEST(Y4mHeaders, NameTheSamples) {
     struct Case {
         const char* type;
@@ -301,6 +307,8 @@ TEST(Y4mHeaders, FollowTheShapeOfThePicture) {
     EXPECT_EQ(resized("YUV4MPEG2 W720 H576 A1:1", {361, 288}, true), "1:1");
     EXPECT_EQ(resized("YUV4MPEG2 W720 H576 A0:0", {360, 576}, false), "0:0");
     EXPECT_EQ(resized("YUV4MPEG2 W720 H576", {360, 576}, false), "0:0");
+    EXPECT_EQ(resized("YUV4MPEG2 W720 H576 A1:0", {360, 576}, false), "1:0");
+    EXPECT_EQ(resized("YUV4MPEG2 W1 H65521 A1:2147483647", {1, 1}, false), "0:0");
     // Numbers that no reader expects become "not known"; none overflows on the way.
     EXPECT_EQ(resized("YUV4MPEG2 W65521 H1 A2147483647:1", {1, 1}, false), "0:0");
     EXPECT_EQ(resized("YUV4MPEG2 W4095 H65521 A2147483647:2147483629", {4093, 65519}, false),
