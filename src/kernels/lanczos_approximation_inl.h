@@ -183,51 +183,89 @@ void sum_source_row(float* sums, const LanczosStripPlan& plan, const uint8_t* sr
     }
 }
 
-// The chains of four neighbouring bytes, which belong to several pixels.
-void run_narrow_chains(const LanczosColumns& columns, const LanczosRow& row, int32_t first) {
-    const int32_t n = columns.src_components;
-    for (int32_t i = first; i < first + kPixel && i < columns.count * n; ++i) {
-        const double* weights = columns.weights + int64_t{i / n} * kLanczosTaps;
-        const int64_t tap = int64_t{columns.index[i / n]} * n + i % n;
-        row.dst[i] = rounded(sum_of_taps(row, weights, tap, n));
+// The chain of one byte of the row.
+void run_chain(const LanczosColumns& columns, const LanczosRow& row, int32_t byte) {
+    const int32_t n = columns.dst_components;
+    const int32_t x = byte / n;
+    const int64_t first = int64_t{columns.index[x]} * n + byte % n;
+    const double* weights = columns.weights + int64_t{x} * kLanczosTaps;
+    row.dst[byte] = rounded(sum_of_taps(row, weights, first, n));
+}
+
+// The chains of some bytes, four to each of the set's vectors and two of those side by side to hide
+// the latency. The last byte may be computed several times.
+constexpr int32_t kLanes = 4;
+template <class ChainsOfFour>
+void run_chains_of_four(const LanczosColumns& columns, const LanczosRow& row, const uint16_t* bytes,
+                        int32_t count) {
+    for (int32_t i = 0; i < count; i += 2 * kLanes) {
+        uint16_t some[2 * kLanes];
+        for (int32_t k = 0; k < 2 * kLanes; ++k) {
+            some[k] = bytes[i + k < count ? i + k : count - 1];
+        }
+        ChainsOfFour first(columns, some);
+        ChainsOfFour second(columns, some + kLanes);
+        for (int32_t r = 0; r < kLanczosTaps; ++r) {
+            first.add(row.taps[r], row.weights[r]);
+            second.add(row.taps[r], row.weights[r]);
+        }
+        first.store(row.dst, some);
+        second.store(row.dst, some + kLanes);
     }
 }
 
-// Adds rows block by block. Where pixels are uncertain often it is hard to predict which, so a
-// block's are appended without branches. Returns the number of uncertain pixels. Where pixels have
-// less components, four neighbouring bytes take their place.
+// The bytes of a row whose chains are to be run.
+struct UncertainBytes {
+    int32_t count = 0;
+    uint16_t list[kLanczosColumns * kPixel];
+
+    // Adds those of a block, which begins with byte `first`, whose bits are set. Where there are
+    // any, it is hard to predict how many: so the first few are added without branches.
+    void add(int32_t first, uint64_t bits) {
+        if (bits == 0) return;
+        for (int32_t i = 0; i < kFew; ++i) add_lowest(first, bits);
+        while (bits != 0) add_lowest(first, bits);
+    }
+
+private:
+    static constexpr int32_t kFew = 4;
+
+    // Without any, the entry counts for nothing.
+    void add_lowest(int32_t first, uint64_t& bits) {
+        constexpr uint64_t kTop = uint64_t{1} << 63;
+        list[count] = static_cast<uint16_t>(first + __builtin_ctzll(bits | kTop));
+        count += bits != 0 ? 1 : 0;
+        bits &= bits - 1;
+    }
+};
+
+// Adds rows block by block.
 template <class Rows>
-int32_t add_rows(const LanczosColumns& columns, const LanczosRow& row, const Rows& rows,
-                 uint8_t* uncertain) {
+void add_rows(const LanczosColumns& columns, const LanczosRow& row, const Rows& rows,
+              UncertainBytes& uncertain) {
+    constexpr int32_t kBlockBytes = kBlock * kPixel;
     const int32_t bytes = columns.count * columns.dst_components;
-    int32_t found = 0;
-    for (int32_t x = 0; x * kPixel < bytes; x += kBlock) {
-        uint8_t* dst = row.dst + x * kPixel;
-        const int32_t left = bytes - x * kPixel;
-        uint64_t near;
-        if (left >= kBlock * kPixel) {
-            near = rows.add_block(dst, x);
+    for (int32_t i = 0; i < bytes; i += kBlockBytes) {
+        uint8_t* dst = row.dst + i;
+        const int32_t left = bytes - i;
+        if (left >= kBlockBytes) {
+            uncertain.add(i, rows.add_block(dst, i));
         } else {
-            uint8_t last[kBlock * kPixel];
-            near = rows.add_block(last, x);
+            // What the block has past the end is far from another byte.
+            uint8_t last[kBlockBytes];
+            uncertain.add(i, rows.add_block(last, i));
             memcpy(dst, last, static_cast<size_t>(left));
         }
-        if (near == 0) continue;
-        for (int32_t i = x; i < x + kBlock; ++i, near >>= kPixel) {
-            uncertain[found] = static_cast<uint8_t>(i);
-            found += (near & 0xF) != 0 ? 1 : 0;
-        }
     }
-    return found;
 }
 
 // A set supplies:
 //   convert       kConverted bytes as floats
 //   sum_group     a group's pixels: their taps, weighed by column
 //   WeightedRows  the sums of all source rows, and their weights
-//     add_block     a block's bytes, and four bits for each pixel, of which any is set if a
-//                   component lies within the distance of another byte
-//   run_chains    some pixels, exactly
+//     add_block     a block's bytes, and a bit for each, set if it lies within the distance of
+//                   another byte
+//   run_chains    some bytes of pixels, exactly
 template <class Set>
 void filter_row(const LanczosRow& row, const LanczosStripPlan& plan, LanczosSums& sums) {
     const double row_weights = sum_of_absolutes(row.weights);
@@ -245,14 +283,12 @@ void filter_row(const LanczosRow& row, const LanczosStripPlan& plan, LanczosSums
     const LanczosColumns& columns = *plan.columns;
     const typename Set::WeightedRows weighted(rows, row.weights,
                                               uncertain_distance(row_weights, plan.max_weights));
-    uint8_t uncertain[kLanczosColumns];
-    static_assert(kLanczosColumns <= 256, "a byte numbers a pixel of a strip");
-    const int32_t count = add_rows(columns, row, weighted, uncertain);
-    if (count == 0) return;
+    UncertainBytes uncertain;
+    add_rows(columns, row, weighted, uncertain);
     if (columns.dst_components == kPixel) {
-        Set::run_chains(columns, row, uncertain, count);
+        Set::run_chains(columns, row, uncertain.list, uncertain.count);
     } else {
-        for (int32_t i = 0; i < count; ++i) run_narrow_chains(columns, row, uncertain[i] * kPixel);
+        for (int32_t i = 0; i < uncertain.count; ++i) run_chain(columns, row, uncertain.list[i]);
     }
 }
 

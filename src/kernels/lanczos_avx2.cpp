@@ -40,7 +40,7 @@ uint32_t find_uncertain(__m256 value, __m256 distance) {
     return static_cast<uint32_t>(_mm256_movemask_ps(_mm256_cmp_ps(off, distance, _CMP_LT_OQ)));
 }
 
-// A group's bytes.
+// A group's bytes, clamped.
 __m128i pack(__m256 low, __m256 high) {
     const __m256i words = _mm256_packus_epi32(_mm256_cvttps_epi32(low), _mm256_cvttps_epi32(high));
     // Packing works within the halves of a vector; the permutation brings the pixels back in order.
@@ -74,21 +74,17 @@ struct Avx2 {
         return _mm256_fmadd_ps(weight, _mm256_load_ps(sums), value);
     }
 
-    static Vector clamp(Vector value, Vector min, Vector max) {
-        return _mm256_min_ps(_mm256_max_ps(value, min), max);
-    }
-
-    template <class Pixels>
-    static uint32_t store_group(uint8_t* dst, const Pixels& pixels, Vector uncertain) {
-        const Vector low = pixels(0);
-        const Vector high = pixels(2);
+    template <class Floats>
+    static uint32_t store_group(uint8_t* dst, const Floats& floats, Vector uncertain) {
+        const Vector low = floats(0);
+        const Vector high = floats(kVectorFloats);
         _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), pack(low, high));
         return find_uncertain(low, uncertain) | find_uncertain(high, uncertain) << kVectorFloats;
     }
 
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const uint8_t* pixels, int32_t count) {
-        run_chains_x86(columns, row, pixels, count);
+                           const uint16_t* bytes, int32_t count) {
+        run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
     }
 };
 

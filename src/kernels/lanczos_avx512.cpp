@@ -57,22 +57,18 @@ struct Avx512 {
         return _mm512_fmadd_ps(weight, _mm512_load_ps(sums), value);
     }
 
-    static Vector clamp(Vector value, Vector min, Vector max) {
-        return _mm512_min_ps(_mm512_max_ps(value, min), max);
-    }
-
-    template <class Pixels>
-    static uint32_t store_group(uint8_t* dst, const Pixels& pixels, Vector uncertain) {
-        const Vector value = pixels(0);
-        const __m128i bytes = _mm512_cvtepi32_epi8(_mm512_cvttps_epi32(value));
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), bytes);
+    template <class Floats>
+    static uint32_t store_group(uint8_t* dst, const Floats& floats, Vector uncertain) {
+        const Vector value = floats(0);
+        const __m512i whole = _mm512_max_epi32(_mm512_cvttps_epi32(value), _mm512_setzero_si512());
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), _mm512_cvtusepi32_epi8(whole));
         const __m512 off = _mm512_abs_ps(_mm512_reduce_ps(value, 0));
         return _mm512_cmp_ps_mask(off, uncertain, _CMP_LT_OQ);
     }
 
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const uint8_t* pixels, int32_t count) {
-        run_chains_x86(columns, row, pixels, count);
+                           const uint16_t* bytes, int32_t count) {
+        run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
     }
 };
 

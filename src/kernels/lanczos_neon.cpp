@@ -16,6 +16,7 @@ constexpr int32_t kVectorBytes = 16;
 // the only other one that is not 0, a byte makes 2^23 more than itself. Lookups and subtractions
 // use all vector units of a processor, conversions often one.
 constexpr float kWholes = 8388608.0F;
+constexpr float kSignedWholes = 12582912.0F;  // in the middle of them: 0 has 16 low bits of 0
 constexpr uint8_t kTopOfWholes = 0x4B;
 constexpr uint8_t kTop = 16;  // where the lookup finds it
 constexpr uint8_t k0 = 0xFF;
@@ -78,43 +79,44 @@ public:
         high_ = vld1q_f32(floats + 4);
     }
 
-    uint64_t add_block(uint8_t* dst, int32_t x) const {
-        const uint32x4_t first = add_group(dst, x);
-        const uint32x4_t second = add_group(dst + kVectorBytes, x + kGroup);
-        const uint32x4_t third = add_group(dst + 2 * kVectorBytes, x + 2 * kGroup);
-        const uint32x4_t fourth = add_group(dst + 3 * kVectorBytes, x + 3 * kGroup);
-        // A byte for each pixel, then half of it.
-        const uint8x16_t pixels = narrow(first, second, third, fourth);
-        const uint8x8_t halves = vshrn_n_u16(vreinterpretq_u16_u8(pixels), 4);
-        return vget_lane_u64(vreinterpret_u64_u8(halves), 0);
+    uint64_t add_block(uint8_t* dst, int32_t first) const {
+        // A byte of ones for each uncertain one, then a bit.
+        const uint8x16_t bit = vreinterpretq_u8_u64(vdupq_n_u64(0x8040201008040201));
+        const auto bits = [&](int32_t i) {
+            return vandq_u8(add_group(dst + i * kVectorBytes, first + i * kVectorBytes), bit);
+        };
+        const uint8x16_t low = vpaddq_u8(bits(0), bits(1));
+        const uint8x16_t high = vpaddq_u8(bits(2), bits(3));
+        const uint8x16_t pairs = vpaddq_u8(low, high);
+        return vgetq_lane_u64(vreinterpretq_u64_u8(vpaddq_u8(pairs, pairs)), 0);
     }
 
 private:
-    // Stores four pixels and tells which of them are uncertain.
-    uint32x4_t add_group(uint8_t* dst, int32_t x) const {
+    // Stores four pixels, and tells which of their bytes are uncertain.
+    uint8x16_t add_group(uint8_t* dst, int32_t first) const {
         float32x4_t values[kGroup];
         for (int32_t k = 0; k < kGroup; ++k) {
-            values[k] = vmulq_laneq_f32(vld1q_f32(rows_[0] + (x + k) * kPixel), low_, 0);
+            values[k] = vmulq_laneq_f32(vld1q_f32(rows_[0] + first + k * kPixel), low_, 0);
         }
-        add_row<1>(values, rows_[1] + x * kPixel, low_);
-        add_row<2>(values, rows_[2] + x * kPixel, low_);
-        add_row<3>(values, rows_[3] + x * kPixel, low_);
-        add_row<4>(values, rows_[4] + x * kPixel, high_);
-        add_row<5>(values, rows_[5] + x * kPixel, high_);
-        add_row<6>(values, rows_[6] + x * kPixel, high_);
-        // Below and above, results are 0 and 255 anyway, and so are these: far from others.
-        for (float32x4_t& value : values) value = vmaxq_f32(value, vdupq_n_f32(0.0F));
-        for (float32x4_t& value : values) value = vminq_f32(value, vdupq_n_f32(255.0F));
+        add_row<1>(values, rows_[1] + first, low_);
+        add_row<2>(values, rows_[2] + first, low_);
+        add_row<3>(values, rows_[3] + first, low_);
+        add_row<4>(values, rows_[4] + first, high_);
+        add_row<5>(values, rows_[5] + first, high_);
+        add_row<6>(values, rows_[6] + first, high_);
         // Rounded to whole numbers, which lie in the low bits.
-        const float32x4_t base = vdupq_n_f32(kWholes);
+        const float32x4_t base = vdupq_n_f32(kSignedWholes);
         const float32x4_t wholes[kGroup] = {vaddq_f32(values[0], base), vaddq_f32(values[1], base),
                                             vaddq_f32(values[2], base), vaddq_f32(values[3], base)};
-        const auto bits = [&](int32_t i) { return vreinterpretq_u32_f32(wholes[i]); };
-        vst1q_u8(dst, narrow(bits(0), bits(1), bits(2), bits(3)));
+        const auto bits = [&](int32_t i) { return vreinterpretq_u16_f32(wholes[i]); };
+        const uint16x8_t low = vuzp1q_u16(bits(0), bits(1));
+        const uint16x8_t high = vuzp1q_u16(bits(2), bits(3));
+        vst1q_u8(dst, vqmovun_high_s16(vqmovun_s16(vreinterpretq_s16_u16(low)),
+                                       vreinterpretq_s16_u16(high)));
         const auto near = [&](int32_t i) {
             return vcgtq_f32(vabdq_f32(values[i], vsubq_f32(wholes[i], base)), certain_);
         };
-        return vpmaxq_u32(vpmaxq_u32(near(0), near(1)), vpmaxq_u32(near(2), near(3)));
+        return narrow(near(0), near(1), near(2), near(3));
     }
 
     const float* rows_[kLanczosTaps];
@@ -123,49 +125,77 @@ private:
     float32x4_t certain_;  // the largest distance from a whole number that decides
 };
 
-// The chain of one pixel, two components per vector.
-struct Chain {
-    float64x2_t low = vdupq_n_f64(0.0);
-    float64x2_t high = vdupq_n_f64(0.0);
-
-    void add(const uint8_t* pixel, double weight) {
-        uint32_t bytes;
-        memcpy(&bytes, pixel, sizeof bytes);
-        const uint8x8_t eight = vcreate_u8(bytes);
-        const uint32x4_t words = vmovl_u16(vget_low_u16(vmovl_u8(eight)));
-        low = vfmaq_n_f64(low, vcvtq_f64_u64(vmovl_u32(vget_low_u32(words))), weight);
-        high = vfmaq_n_f64(high, vcvtq_f64_u64(vmovl_high_u32(words)), weight);
-    }
-
-    void store(uint8_t* dst) const {
-        const float64x2_t half = vdupq_n_f64(0.5);
-        const int32x4_t whole = vcombine_s32(vqmovn_s64(vcvtq_s64_f64(vaddq_f64(low, half))),
-                                             vqmovn_s64(vcvtq_s64_f64(vaddq_f64(high, half))));
-        const int16x4_t words = vqmovn_s32(whole);
-        const uint8x8_t bytes = vqmovun_s16(vcombine_s16(words, words));
-        const uint32_t pixel = vget_lane_u32(vreinterpret_u32_u8(bytes), 0);
-        memcpy(dst, &pixel, sizeof pixel);
-    }
-};
-
-// Two pixels side by side, to hide the latency.
-void run_two_chains(const LanczosColumns& columns, const LanczosRow& row, int32_t a, int32_t b) {
-    const double* weights_a = columns.weights + int64_t{a} * kLanczosTaps;
-    const double* weights_b = columns.weights + int64_t{b} * kLanczosTaps;
-    Chain chain_a;
-    Chain chain_b;
-    for (int32_t r = 0; r < kLanczosTaps; ++r) {
-        const double weight = row.weights[r];
-        const uint8_t* taps_a = row.taps[r] + int64_t{columns.index[a]} * kPixel;
-        const uint8_t* taps_b = row.taps[r] + int64_t{columns.index[b]} * kPixel;
-        for (int32_t i = 0; i < kLanczosTaps; ++i) {
-            chain_a.add(taps_a + i * kPixel, weight * weights_a[i]);
-            chain_b.add(taps_b + i * kPixel, weight * weights_b[i]);
+// Chains of bytes from anywhere in a row, two in each of two vectors.
+class ChainsOfFour {
+public:
+    ChainsOfFour(const LanczosColumns& columns, const uint16_t* bytes) {
+        for (int32_t k = 0; k < kLanes; ++k) {
+            const int32_t x = bytes[k] / kPixel;
+            const double* weights = columns.weights + int64_t{x} * kLanczosTaps;
+            for (int32_t i = 0; i < kLanczosTaps; ++i) weights_[i][k] = weights[i];
+            first_[k] = int64_t{columns.index[x]} * kPixel;
+            moves_[k] = moves(k, bytes[k] % kPixel);
         }
     }
-    chain_a.store(row.dst + int64_t{a} * kPixel);
-    chain_b.store(row.dst + int64_t{b} * kPixel);
-}
+
+    // Adds a source row.
+    void add(const uint8_t* taps, double row_weight) {
+        uint8x16_t low = vdupq_n_u8(0);
+        uint8x16_t high = low;
+        for (int32_t k = 0; k < kLanes; ++k) {
+            const uint8_t* first = taps + first_[k];
+            low = vorrq_u8(low, vqtbl1q_u8(vld1q_u8(first), moves_[k]));
+            high = vorrq_u8(high, vqtbl1q_u8(vld1q_u8(first + kHigh * kPixel), moves_[k]));
+        }
+        const uint16x8_t words[] = {vmovl_u8(vget_low_u8(low)), vmovl_high_u8(low),
+                                    vmovl_u8(vget_low_u8(high)), vmovl_high_u8(high)};
+        add_tap(0, vmovl_u16(vget_low_u16(words[0])), row_weight);
+        add_tap(1, vmovl_high_u16(words[0]), row_weight);
+        add_tap(2, vmovl_u16(vget_low_u16(words[1])), row_weight);
+        add_tap(3, vmovl_high_u16(words[1]), row_weight);
+        add_tap(4, vmovl_high_u16(words[2]), row_weight);
+        add_tap(5, vmovl_u16(vget_low_u16(words[3])), row_weight);
+        add_tap(6, vmovl_high_u16(words[3]), row_weight);
+    }
+
+    // Adds 0.5, truncates and clamps.
+    void store(uint8_t* row, const uint16_t* bytes) const {
+        const float64x2_t half = vdupq_n_f64(0.5);
+        const int32x4_t whole = vcombine_s32(vqmovn_s64(vcvtq_s64_f64(vaddq_f64(low_, half))),
+                                             vqmovn_s64(vcvtq_s64_f64(vaddq_f64(high_, half))));
+        const int16x4_t words = vqmovn_s32(whole);
+        uint8_t results[2 * kLanes];
+        vst1_u8(results, vqmovun_s16(vcombine_s16(words, words)));
+        for (int32_t k = 0; k < kLanes; ++k) row[bytes[k]] = results[k];
+    }
+
+private:
+    // Taps come in halves of four: the first ones, and those from this one on.
+    static constexpr int32_t kHigh = kLanczosTaps - kLanes;
+
+    // Moves byte `component` of each pixel to its byte `lane`, and zeros to the others.
+    static uint8x16_t moves(int32_t lane, int32_t component) {
+        static constexpr uint32_t kPixels[] = {0, 4, 8, 12};
+        const int32x4_t lane_bits = vdupq_n_s32(8 * lane);
+        const uint32x4_t byte =
+            vaddq_u32(vld1q_u32(kPixels), vdupq_n_u32(static_cast<uint32_t>(component)));
+        const uint32x4_t own = vshlq_u32(vdupq_n_u32(0xFF), lane_bits);
+        return vreinterpretq_u8_u32(vornq_u32(vshlq_u32(byte, lane_bits), own));
+    }
+
+    void add_tap(int32_t i, uint32x4_t samples, double row_weight) {
+        const float64x2_t low = vcvtq_f64_u64(vmovl_u32(vget_low_u32(samples)));
+        const float64x2_t high = vcvtq_f64_u64(vmovl_high_u32(samples));
+        low_ = vfmaq_f64(low_, vmulq_n_f64(vld1q_f64(weights_[i]), row_weight), low);
+        high_ = vfmaq_f64(high_, vmulq_n_f64(vld1q_f64(weights_[i] + 2), row_weight), high);
+    }
+
+    float64x2_t low_ = vdupq_n_f64(0.0);
+    float64x2_t high_ = vdupq_n_f64(0.0);
+    int64_t first_[kLanes];
+    uint8x16_t moves_[kLanes];
+    double weights_[kLanczosTaps][kLanes];
+};
 
 struct Neon {
     using WeightedRows = NeonRows;
@@ -205,12 +235,9 @@ struct Neon {
         }
     }
 
-    // The last pixel may be computed twice.
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const uint8_t* pixels, int32_t count) {
-        for (int32_t i = 0; i < count; i += 2) {
-            run_two_chains(columns, row, pixels[i], pixels[i + 1 < count ? i + 1 : i]);
-        }
+                           const uint16_t* bytes, int32_t count) {
+        run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
     }
 };
 

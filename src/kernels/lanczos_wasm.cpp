@@ -43,24 +43,25 @@ public:
         }
     }
 
-    uint64_t add_block(uint8_t* dst, int32_t x) const {
+    uint64_t add_block(uint8_t* dst, int32_t first) const {
         Ints near[kBlock];
         Ints all = {};
         for (int32_t i = 0; i < kBlock; ++i) {
-            near[i] = add_pixel(dst + i * kPixel, x + i);
+            near[i] = add_four(dst + i * kPixel, first + i * kPixel);
             all |= near[i];
         }
         if (!any(all)) return 0;
         uint64_t mask = 0;
-        for (int32_t i = kBlock - 1; i >= 0; --i)
-            mask = (mask << kPixel) | (any(near[i]) ? 0xF : 0);
+        for (int32_t i = kBlock * kPixel - 1; i >= 0; --i) {
+            mask = mask << 1 | (near[i / kPixel][i % kPixel] & 1);
+        }
         return mask;
     }
 
 private:
-    // Stores a pixel and tells which of its components are uncertain.
-    Ints add_pixel(uint8_t* dst, int32_t x) const {
-        const auto product = [&](int32_t r) { return load(rows_[r] + x * kPixel) * weights_[r]; };
+    // Stores four bytes and tells which of them are uncertain.
+    Ints add_four(uint8_t* dst, int32_t i) const {
+        const auto product = [&](int32_t r) { return load(rows_[r] + i) * weights_[r]; };
         const Floats half = {0.5F, 0.5F, 0.5F, 0.5F};
         const Floats sum = ((product(0) + product(1)) + (product(2) + product(3))) +
                            ((product(4) + product(5)) + (product(6) + half));
@@ -100,15 +101,8 @@ struct Wasm {
     }
 
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const uint8_t* pixels, int32_t count) {
-        for (int32_t i = 0; i < count; ++i) {
-            const int32_t x = pixels[i];
-            const double* weights = columns.weights + int64_t{x} * kLanczosTaps;
-            const int64_t first = int64_t{columns.index[x]} * kPixel;
-            for (int32_t k = 0; k < kPixel; ++k) {
-                row.dst[x * kPixel + k] = rounded(sum_of_taps(row, weights, first + k, kPixel));
-            }
-        }
+                           const uint16_t* bytes, int32_t count) {
+        for (int32_t i = 0; i < count; ++i) run_chain(columns, row, bytes[i]);
     }
 };
 
