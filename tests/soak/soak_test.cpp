@@ -84,8 +84,11 @@ void make_and_end_pools(int count, Refuse refuse) {
     }
     for (int i = 0; i < 60000 && in_background.runs < left_to_background; ++i) usleep(1000);
     EXPECT_EQ(in_background.runs, left_to_background);
-    EXPECT_GT(made, 0);
-    EXPECT_TRUE(refuse == Refuse::kNothing || count < 50 || made < count);
+    // About a third is refused; of a few pools that can be none, or all.
+    if (refuse != Refuse::kNothing && count >= 50) {
+        EXPECT_GT(made, 0);
+        EXPECT_LT(made, count);
+    }
     std::cout << made << " pools of " << count << ", " << delays() << " delays, " << refusals()
               << " refusals\n";
 }
