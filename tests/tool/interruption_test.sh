@@ -18,7 +18,9 @@ arguments=(in.ppm folder/out.ppm -s 1000x800 -e lanczos)
 mkdir folder
 started=$(date +%s%N)
 works "${arguments[@]}"
-run_ns=$(($(date +%s%N) - started))
+# Within that time of its start a run is interrupted. It follows the machine's load, so that some runs
+# end before and some after.
+span_ns=$((($(date +%s%N) - started) * 5 / 4))
 mv folder/out.ppm whole.ppm
 ended=0
 finished=0
@@ -30,13 +32,19 @@ interrupted_run() {
     if ((RANDOM % 2)); then echo older >folder/out.ppm; fi
     # Background jobs of a script ignore some signals unless told otherwise.
     env --default-signal=INT,QUIT "$@" "$tool" "${arguments[@]}" &
-    printf -v pause '%d.%09d' 0 $(((RANDOM * 32768 + RANDOM) % (run_ns * 5 / 4)))
+    printf -v pause '%d.%09d' 0 $(((RANDOM * 32768 + RANDOM) % span_ns))
     sleep "$pause"
     kill "-$signal" $! 2>/dev/null
     if ((RANDOM % 2)); then kill "-$signal" $! 2>/dev/null; fi
     wait $! 2>/dev/null
     status=$?
-    if ((status > 128)); then ended=$((ended + 1)); else finished=$((finished + 1)); fi
+    if ((status > 128)); then
+        ended=$((ended + 1))
+        span_ns=$((span_ns + span_ns / 32))
+    else
+        finished=$((finished + 1))
+        span_ns=$((span_ns - span_ns / 8))
+    fi
 }
 
 beside_out() {
@@ -46,7 +54,7 @@ beside_out() {
 # The process that replaces OUT outlives the tool's, for some microseconds: what it has under way is
 # waited for, and OUT is looked at once, in a copy.
 check_folder() {
-    for _ in $(seq 100); do
+    for _ in $(seq 2000); do
         [ -n "$(beside_out)" ] || break
         sleep 0.01
     done
@@ -73,7 +81,7 @@ for signal in TERM INT HUP QUIT; do
     env --default-signal=INT,QUIT "LD_PRELOAD=$no_nameless_files" \
         "$tool" never_ending folder/out.ppm -s 16x8 --format rgba --input-size 99x99 &
     exec 9>never_ending
-    for _ in $(seq 100); do
+    for _ in $(seq 400); do
         [ -n "$(ls -A folder)" ] && break
         sleep 0.05
     done

@@ -197,12 +197,28 @@ if [ -z "${INSTRUMENTED:-}" ]; then
     [ "$(stat -c %s long.rgba)" = 600000 ] || complain "size of long.rgba"
 fi
 
-# slowly: a Y4M stream whose second frame comes late.
+# slowly: a Y4M stream whose second frame comes late; so late that the tool has a progress to show, which
+# counts the time from before it opens a file.
 slowly() {
     y4m 1
     sleep 0.7
     echo FRAME
     frame 1
+}
+
+late_picture() {
+    sleep 0.7
+    cat one.png
+}
+
+# A busy machine may make a long job of a short one, but not every time.
+short_job_is_silent() {
+    local _
+    for _ in $(seq 20); do
+        script -qec "'$tool' in.y4m progress.y4m -s 16x8" terminal >/dev/null </dev/null
+        grep -q 'frames' terminal || return 0
+    done
+    return 1
 }
 
 if ! script -qec true /dev/null </dev/null >/dev/null 2>&1; then
@@ -213,12 +229,12 @@ else
     script -qec "'$tool' slow progress.y4m -s 16x8" terminal >/dev/null </dev/null ||
         complain "exit code $? on a terminal"
     grep -q '2 frames, [0-9.]* per second' terminal || complain "no progress on a terminal"
-    script -qec "'$tool' in.y4m progress.y4m -s 16x8" terminal >/dev/null </dev/null
-    grep -q 'frames' terminal && complain "progress on a terminal for a short job"
+    short_job_is_silent || complain "progress on a terminal for a short job"
     script -qec "'$tool' in.y4m - -s 16x8" terminal >/dev/null </dev/null &&
         complain "success when writing frames to a terminal"
     grep -q 'standard output is a terminal' terminal || complain "frames go to a terminal"
-    script -qec "'$tool' one.png large.png -s 6000x5000!" terminal >/dev/null </dev/null ||
+    late_picture >slow &
+    script -qec "'$tool' slow large.png -s 6000x5000!" terminal >/dev/null </dev/null ||
         complain "exit code $? for a large picture on a terminal"
     grep -q '%  writing' terminal || complain "no progress within a large picture"
     slowly | "$tool" - progress.y4m -s 16x8 2>stderr || complain "exit code $? without a terminal"
