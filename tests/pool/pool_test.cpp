@@ -9,6 +9,7 @@
 #include <thread>
 #include <vector>
 
+#include "support/entries.h"
 #include "support/random.h"
 
 using ovrin_test::rounds;
@@ -262,6 +263,8 @@ TEST(Pool, BackgroundFreeReturnsAtOnceAndStillRunsEverything) {
     EXPECT_EQ(counter, 0);
     gate.open = true;
     while (counter < 100) std::this_thread::yield();
+    // Or the program might end before they do.
+    EXPECT_TRUE(ovrin_test::only_this_thread());
 }
 
 TEST(Pool, EightSubmittersAtOnceLoseNothing) {

@@ -72,10 +72,9 @@ public:
     Callers(int count, const Known& calls) {
         for (int i = 0; i < count; ++i) {
             threads_.emplace_back([&] {
-                while (!stop_) {
+                do {
                     if (!calls.come_out_right() || !pool_works()) ++wrong_;
-                    ++turns_;
-                }
+                } while (!stop_);
             });
         }
     }
@@ -83,7 +82,6 @@ public:
         stop_ = true;
         for (std::thread& thread : threads_) thread.join();
         EXPECT_EQ(wrong_, 0);
-        EXPECT_GT(turns_, 0);
     }
 
     Callers(const Callers&) = delete;
@@ -92,7 +90,7 @@ public:
 private:
     std::vector<std::thread> threads_;
     std::atomic<bool> stop_{false};
-    std::atomic<int> wrong_{0}, turns_{0};
+    std::atomic<int> wrong_{0};
 };
 
 #if defined(OVRIN_EMULATED)
@@ -207,15 +205,18 @@ TEST(Interruptions, SignalsChangeNothing) {
     const Known calls(threaded_calls());
     const int turns = repetitions(rounds(100), 5000);
     const Handlers handlers;
-    std::atomic<int> wrong{0}, finished{0};
+    std::atomic<int> wrong{0}, made{0}, finished{0};
     const auto start = std::chrono::steady_clock::now();
     std::vector<std::thread> callers;
     for (int i = 0; i < kCallers; ++i) {
         callers.emplace_back([&] {
             is_worker = false;
             set_mask(SIG_UNBLOCK);
-            for (int turn = 0; turn < turns; ++turn) {
+            // On a busy machine a worker may be late to meet a signal.
+            for (int turn = 0; turn < turns || (handled_by_workers == 0 && turn < 100 * turns);
+                 ++turn) {
                 if (!calls.come_out_right() || !pool_works()) ++wrong;
+                ++made;
             }
             ++finished;
         });
@@ -229,8 +230,8 @@ TEST(Interruptions, SignalsChangeNothing) {
     const std::chrono::duration<double> seconds = std::chrono::steady_clock::now() - start;
     EXPECT_EQ(wrong, 0);
     EXPECT_GT(handled_by_workers, 0);
-    std::cout << kCallers * turns * static_cast<int>(calls.count()) << " calls, " << handled
-              << " signals, " << handled_by_workers << " of them handled by workers, "
+    std::cout << made * static_cast<int>(calls.count()) << " calls, " << handled << " signals, "
+              << handled_by_workers << " of them handled by workers, "
               << static_cast<int64_t>(static_cast<double>(handled) / seconds.count())
               << " a second\n";
 }

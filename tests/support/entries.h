@@ -4,6 +4,8 @@
 #include <dirent.h>
 #include <unistd.h>
 
+#include "support/instrumented.h"
+
 namespace ovrin_test {
 
 // Of a folder in /proc: /proc/self/fd has one more than there are descriptors, for the reading.
@@ -21,8 +23,13 @@ inline int thread_count() {
 
 // Waits for threads that have been joined, or end by themselves, to leave the list.
 inline bool only_threads(int expected) {
-    for (int i = 0; i < 5000 && thread_count() > expected; ++i) usleep(1000);
+    for (int i = 0; i < 60000 && thread_count() > expected; ++i) usleep(1000);
     return thread_count() <= expected;
+}
+
+// The thread sanitizer has a thread of its own.
+inline bool only_this_thread() {
+    return only_threads(kInstrumented ? 2 : 1);
 }
 
 }  // namespace ovrin_test

@@ -28,7 +28,7 @@ bool has_failed();
 
 // Blocks that the program's own objects obtained and have not released, waiting up to `seconds` for
 // background threads to release theirs.
-int live_blocks(int seconds = 5);
+int live_blocks(int seconds = 60);
 
 // Those of them that are `size` bytes long.
 std::vector<void*> live_blocks_of(size_t size);

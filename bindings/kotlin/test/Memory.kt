@@ -35,7 +35,7 @@ internal object Faults {
 
 /** Blocks that are kept; a pool that is given up may be released in the background. */
 private fun keptBlocks(): Int {
-    val end = System.nanoTime() + 5_000_000_000
+    val end = System.nanoTime() + 60_000_000_000
     while (Faults.liveBlocks() > 0 && System.nanoTime() < end) Thread.sleep(1)
     return Faults.liveBlocks()
 }
