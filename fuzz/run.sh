@@ -18,8 +18,8 @@ readers=(png jpeg pnm y4m exif icc geometry template)
 # Runs of a quick check: about as long for each but those with threads. A tenth of that under
 # sanitizers, a hundredth under emulation, as many as there are inputs where both.
 declare -A quick=([packed]=100000 [canvas]=100000 [planar]=80000 [semi_planar]=100000
-    [nearest]=150000 [bilinear]=40000 [bilinear_bands]=50000 [lanczos]=1000 [lanczos_bands]=150000
-    [walkers]=40000 [tasks]=100000 [drivers]=500 [pool]=40000 [cpp]=40000 [extents]=10000
+    [nearest]=150000 [bilinear]=40000 [bilinear_bands]=50000 [lanczos]=10000 [lanczos_bands]=150000
+    [walkers]=40000 [tasks]=100000 [drivers]=1500 [pool]=40000 [cpp]=40000 [extents]=10000
     [png]=60000 [jpeg]=60000 [pnm]=100000 [y4m]=100000 [exif]=100000 [icc]=2000
     [geometry]=200000 [template]=200000)
 # Bytes of their longest inputs, where the usual ones are too short for a file.
