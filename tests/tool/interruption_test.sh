@@ -27,12 +27,13 @@ finished=0
 
 # One run with the tool's environment in $@, ended by $signal at a random time, or twice.
 interrupted_run() {
-    local pause status
+    local pause_ns pause status
     rm -f folder/out.ppm
     if ((RANDOM % 2)); then echo older >folder/out.ppm; fi
     # Background jobs of a script ignore some signals unless told otherwise.
     env --default-signal=INT,QUIT "$@" "$tool" "${arguments[@]}" &
-    printf -v pause '%d.%09d' 0 $(((RANDOM * 32768 + RANDOM) % span_ns))
+    pause_ns=$(((RANDOM << 30 | RANDOM << 15 | RANDOM) % span_ns))
+    printf -v pause '%d.%09d' $((pause_ns / 1000000000)) $((pause_ns % 1000000000))
     sleep "$pause"
     kill "-$signal" $! 2>/dev/null
     if ((RANDOM % 2)); then kill "-$signal" $! 2>/dev/null; fi
