@@ -22,7 +22,6 @@ constexpr bool has(unsigned flags, unsigned wanted) {
     return (flags & wanted) == wanted;
 }
 
-// Register state that the operating system saves when it switches threads.
 unsigned saved_state() {
     unsigned low, high;
     __asm__ volatile("xgetbv" : "=a"(low), "=d"(high) : "c"(0));
@@ -34,16 +33,21 @@ constexpr unsigned kZmmState = 0xE6;
 
 }  // namespace
 
+CpuFeatures features_of(const CpuWords& words) {
+    const bool avx2 = has(words.basic_ecx, bit_OSXSAVE | bit_AVX | bit_FMA) &&
+                      has(words.extended_ebx, bit_AVX2) && has(words.saved_state, kYmmState);
+    const bool avx512 =
+        avx2 && has(words.extended_ebx, bit_AVX512F | bit_AVX512BW | bit_AVX512DQ | bit_AVX512VL) &&
+        has(words.extended_ecx, bit_AVX512VBMI) && has(words.saved_state, kZmmState);
+    return {avx2, avx512};
+}
+
 CpuFeatures cpu_features() {
     const CpuidLeaf basic(1);
-    if (!has(basic.ecx, bit_OSXSAVE | bit_AVX | bit_FMA)) return {false, false};
     const CpuidLeaf extended(7);
-    const unsigned state = saved_state();
-    const bool avx2 = has(extended.ebx, bit_AVX2) && has(state, kYmmState);
-    const bool avx512 =
-        has(extended.ebx, bit_AVX512F | bit_AVX512BW | bit_AVX512DQ | bit_AVX512VL) &&
-        has(extended.ecx, bit_AVX512VBMI) && has(state, kZmmState);
-    return {avx2, avx2 && avx512};
+    // Without OSXSAVE there is no instruction that tells what is saved.
+    const unsigned state = has(basic.ecx, bit_OSXSAVE) ? saved_state() : 0;
+    return features_of({basic.ecx, extended.ebx, extended.ecx, state});
 }
 
 #else

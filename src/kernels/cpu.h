@@ -11,4 +11,17 @@ struct CpuFeatures {
 
 CpuFeatures cpu_features();
 
+#if defined(__x86_64__)
+// What the features are told by.
+struct CpuWords {
+    unsigned basic_ecx;     // of CPUID's leaf 1
+    unsigned extended_ebx;  // of leaf 7, 0 where the processor has none
+    unsigned extended_ecx;
+    unsigned
+        saved_state;  // register state that the operating system saves when it switches threads
+};
+
+CpuFeatures features_of(const CpuWords& words);
+#endif
+
 }  // namespace ovrin

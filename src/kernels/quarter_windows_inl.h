@@ -38,14 +38,15 @@ int32_t windows_needed(const QuarterRowShape& shape, int32_t samples, int32_t wi
     return fits && row_bytes <= INT32_MAX ? static_cast<int32_t>(windows) : 0;
 }
 
-// As many samples in a vector as the windows allow: half and a quarter of a vector still beat
-// samples one by one. Of many samples only a multiple of four: simple ratios then repeat from
+// As many samples in a vector as the windows allow: half, a quarter and an eighth of a vector still
+// beat samples one by one. Of many samples only a multiple of four: simple ratios then repeat from
 // vector to vector.
 inline WindowShape window_shape(const QuarterRowShape& shape, int32_t vector_bytes,
                                 int32_t max_windows) {
     int32_t samples = vector_bytes / shape.sample_bytes;
     if (samples > 16) samples -= samples % 4;
-    for (int32_t halvings = 0; halvings < 4 && samples > 1; ++halvings, samples /= 2) {
+    const int32_t fewest = samples < 16 ? 2 : samples / 8;
+    for (; samples >= fewest; samples /= 2) {
         const int32_t windows = windows_needed(shape, samples, vector_bytes, max_windows);
         if (windows > 0) return {samples, windows, 1};
     }
@@ -151,9 +152,8 @@ void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumn
             columns.skip_cells(cells);
             plan.samples += period_samples;
             room -= (period - 1) * kEntryBytes;
-            const bool from_first = vectors == period || vectors == plan.repeating;
             vectors += period;
-            if (from_first) plan.repeating = vectors;
+            plan.repeating = vectors;
             continue;
         }
         const int32_t count = rest < plan.vector_samples ? rest : plan.vector_samples;

@@ -24,9 +24,10 @@ struct LanczosCall {
     int32_t bytes_per_pixel;
 };
 
+// Of a picture with bands, which has destination rows.
 bool is_empty(const LanczosCall& call) {
     return call.dst == nullptr || call.src_w < 1 || call.src_h < 1 || call.dst_w < 1 ||
-           call.dst_h < 1 || call.bytes_per_pixel < 1;
+           call.bytes_per_pixel < 1;
 }
 
 void fill_bands(ovrin_lanczos_band* bands, int32_t count, int32_t height, const LanczosCall& call,

@@ -63,20 +63,21 @@ bool init_synchronisation(ovrin_threadpool* pool) {
            pthread_cond_init(&pool->task_ready, nullptr) == 0;
 }
 
-bool init_slots(ovrin_threadpool* pool) {
+void init_slots(ovrin_threadpool* pool) {
     memset(&pool->pending, 0, sizeof pool->pending);
     memset(&pool->free_slots, 0, sizeof pool->free_slots);
     for (ovrin_threadpool_task& slot : pool->tasks) {
         ovrin_threadpool_task_init(&slot);
-        if (ovrin_threadpool_queue_enqueue(&pool->free_slots, &slot) != 0) return false;
+        // A queue has a place for each.
+        static_cast<void>(ovrin_threadpool_queue_enqueue(&pool->free_slots, &slot));
     }
-    return true;
 }
 
 bool init_fields(ovrin_threadpool* pool, int32_t n) {
     pool->stop = 0;
     pool->thread_count = 0;
-    if (!init_synchronisation(pool) || !init_slots(pool)) return false;
+    if (!init_synchronisation(pool)) return false;
+    init_slots(pool);
     // At least one handle, because malloc(0) may return null.
     const size_t handles = n < 1 ? 1 : static_cast<size_t>(n);
     pool->threads = static_cast<pthread_t*>(malloc(handles * sizeof(pthread_t)));

@@ -165,3 +165,17 @@ TEST(BilinearEx, ATargetHoldsForEveryPass) {
         }
     }
 }
+
+// Their ratios are those of a reduction all the same.
+TEST(BilinearEx, PicturesOfNegativeHeightAreNone) {
+    const std::vector<uint8_t> src(64 * 64 * 4, 1);
+    const std::vector<uint8_t> before(64, 0xAB);
+    for (const int32_t format : kFormats) {
+        for (const auto& [width, height] : {std::pair{64, -64}, {-64, 64}, {-64, -64}}) {
+            GuardedBuffer<uint8_t> dst(before);
+            ov_bilinear_ex(src.data(), dst.data(), width, height, width / 16, height / 16, format,
+                           nullptr);
+            EXPECT_TRUE(same_bytes(dst.data(), before.data(), before.size())) << format;
+        }
+    }
+}

@@ -28,6 +28,8 @@ ovrin::CpuFeatures __wrap__ZN5ovrin12cpu_featuresEv() {
 
 #if defined(__x86_64__)
 
+#include <cpuid.h>
+
 namespace {
 
 std::vector<std::string> names_of_sets() {
@@ -75,6 +77,42 @@ TEST(KernelChoice, TheProcessorHasWhatTheCompilerFindsToo) {
               avx2 && __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
                   __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512vl") &&
                   __builtin_cpu_supports("avx512vbmi"));
+}
+
+// A processor, or a system that does not save the registers, that lacks one of them.
+TEST(KernelChoice, ASetNeedsEachOfItsExtensions) {
+    const ovrin::CpuWords all = {
+        bit_OSXSAVE | bit_AVX | bit_FMA,
+        bit_AVX2 | bit_AVX512F | bit_AVX512BW | bit_AVX512DQ | bit_AVX512VL, bit_AVX512VBMI, 0xE6};
+    EXPECT_TRUE(ovrin::features_of(all).avx2);
+    EXPECT_TRUE(ovrin::features_of(all).avx512_vbmi);
+    const struct {
+        unsigned ovrin::CpuWords::*word;
+        unsigned flag;
+        bool has_avx2;
+    } lacking[] = {
+        {&ovrin::CpuWords::basic_ecx, bit_OSXSAVE, false},
+        {&ovrin::CpuWords::basic_ecx, bit_AVX, false},
+        {&ovrin::CpuWords::basic_ecx, bit_FMA, false},
+        {&ovrin::CpuWords::extended_ebx, bit_AVX2, false},
+        {&ovrin::CpuWords::saved_state, 0x02, false},  // the low halves of AVX's registers
+        {&ovrin::CpuWords::saved_state, 0x04, false},  // the high ones
+        {&ovrin::CpuWords::extended_ebx, bit_AVX512F, true},
+        {&ovrin::CpuWords::extended_ebx, bit_AVX512BW, true},
+        {&ovrin::CpuWords::extended_ebx, bit_AVX512DQ, true},
+        {&ovrin::CpuWords::extended_ebx, bit_AVX512VL, true},
+        {&ovrin::CpuWords::extended_ecx, bit_AVX512VBMI, true},
+        {&ovrin::CpuWords::saved_state, 0x20, true},  // AVX-512's masks
+        {&ovrin::CpuWords::saved_state, 0x40, true},  // the upper halves of its registers
+        {&ovrin::CpuWords::saved_state, 0x80, true},  // those that there are more of
+    };
+    for (const auto& lack : lacking) {
+        ovrin::CpuWords words = all;
+        words.*lack.word &= ~lack.flag;
+        const ovrin::CpuFeatures found = ovrin::features_of(words);
+        EXPECT_EQ(found.avx2, lack.has_avx2) << std::hex << lack.flag;
+        EXPECT_FALSE(found.avx512_vbmi) << std::hex << lack.flag;
+    }
 }
 
 #else

@@ -234,3 +234,24 @@ TEST(KernelPlans, AreThoseOfTheTables) {
         EXPECT_TRUE(same_lines(table, contents_of(path))) << path;
     }
 }
+
+// What vectors read begins at an offset of 32 bits. Ratios that are none of the simple ones.
+TEST(KernelPlans, RowsBeyondTwoGibibytesAreSampledOneByOne) {
+    NamedKernels sets[kMaxSets];
+    const int32_t count = available_kernels(sets);
+    constexpr int32_t kMostColumns = INT32_MAX / 4;  // of four bytes
+    const auto kernel_of = [](const Kernels& set, int32_t source, int32_t destination) {
+        const std::string plan = quarter_plan(set, {4, source, destination});
+        return plan.substr(0, plan.find(','));
+    };
+    for (int32_t i = 0; i < count; ++i) {
+        for (const int32_t destination : {kMostColumns / 5 * 4, kMostColumns / 9 * 4}) {
+            const std::string plain = kernel_of(scalar_kernels, kMostColumns, destination);
+            EXPECT_EQ(kernel_of(*sets[i].kernels, kMostColumns + 1, destination), plain)
+                << sets[i].name;
+            if (i == 0) continue;
+            EXPECT_NE(kernel_of(*sets[i].kernels, kMostColumns, destination), plain)
+                << sets[i].name;
+        }
+    }
+}
