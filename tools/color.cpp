@@ -30,7 +30,8 @@ Color parse_color(const std::string& text) {
     for (const Named& named : kNames) {
         if (text == named.name) return named.color;
     }
-    std::string digits = text.empty() || text[0] != '#' ? "" : text.substr(1);
+    std::string digits;
+    if (!text.empty() && text[0] == '#') digits = text.substr(1);
     if (digits.size() == 3) {
         digits = {digits[0], digits[0], digits[1], digits[1], digits[2], digits[2]};
     }

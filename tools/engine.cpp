@@ -110,22 +110,14 @@ void resize_any_bilinear(Bilinear* bilinear, Picture* source, Picture* result) {
     *result = converted(rgba, PixelFormat::kRgb);
 }
 
-// Formats that the library itself resizes, by its engines that know them.
+// Formats that the library itself resizes, by its engines that know them: neither Lanczos nor
+// thumbnail, which take planes.
 void resize_whole(Engine engine, Picture* source, Picture* result) {
-    switch (engine) {
-        case Engine::kQuarter:
-            return resize_quarter(*source, result);
-        case Engine::kBilinear:
-            // On the calling thread at any height: in bands the engine would not interpolate.
-            return resize_any_bilinear(ov_bilinear_sg, source, result);
-        case Engine::kBilinearProgressive:
-            return resize_any_bilinear(ov_bilinear_ex, source, result);
-        case Engine::kNearest:
-            return resize_nearest(*source, result);
-        case Engine::kLanczos:
-        case Engine::kThumbnail:
-            return;  // these take planes
-    }
+    if (engine == Engine::kQuarter) return resize_quarter(*source, result);
+    if (engine == Engine::kNearest) return resize_nearest(*source, result);
+    // On the calling thread at any height: in bands the engine would not interpolate.
+    const bool is_one_pass = engine == Engine::kBilinear;
+    resize_any_bilinear(is_one_pass ? ov_bilinear_sg : ov_bilinear_ex, source, result);
 }
 
 // A plane of single bytes by an engine that knows none: as the luma of a picture in 4:2:0 whose

@@ -27,25 +27,9 @@ struct Info {
 };
 
 const char* name_of(Container container) {
-    switch (container) {
-        case Container::kPng:
-            return "PNG";
-        case Container::kJpeg:
-            return "JPEG";
-        case Container::kPnm:
-            return "PNM";
-        case Container::kPpm:
-            return "PPM";
-        case Container::kPgm:
-            return "PGM";
-        case Container::kPam:
-            return "PAM";
-        case Container::kY4m:
-            return "Y4M";
-        case Container::kRaw:
-            break;
-    }
-    return "raw";
+    // In the order of the enumeration.
+    constexpr const char* kNames[] = {"PNG", "JPEG", "PNM", "PPM", "PGM", "PAM", "Y4M", "raw"};
+    return kNames[static_cast<size_t>(container)];
 }
 
 // Those that differ from pixel to pixel: image files are read as RGBA, whatever they hold.

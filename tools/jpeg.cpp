@@ -83,7 +83,6 @@ struct ProgressState {
 
 void on_progress(j_common_ptr codec) {
     const jpeg_progress_mgr& at = *codec->progress;
-    if (at.pass_limit == 0 || at.total_passes == 0) return;
     const double pass = static_cast<double>(at.pass_counter) / static_cast<double>(at.pass_limit);
     (*reinterpret_cast<ProgressState*>(codec->progress)->listener)((at.completed_passes + pass) /
                                                                    at.total_passes);

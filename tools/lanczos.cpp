@@ -21,10 +21,18 @@ constexpr int32_t kTaps = 7;
 constexpr int32_t kMiddle = 3;
 constexpr int32_t kBandRows = 32;
 
-// The filter at distances of i / 4000 samples. Sines take long, so it is made once.
-const float* filter_table() {
-    static const std::unique_ptr<float, decltype(&free)> table(create_lanczos_lookup(), free);
+using FilterTable = std::unique_ptr<float, decltype(&free)>;
+
+FilterTable new_filter_table() {
+    FilterTable table(create_lanczos_lookup(), free);
     if (table == nullptr) throw std::bad_alloc();
+    return table;
+}
+
+// The filter at distances of i / 4000 samples. Sines take long, so it is made once; where there was
+// no memory for it, the next call tries again.
+const float* filter_table() {
+    static const FilterTable table = new_filter_table();
     return table.get();
 }
 

@@ -133,9 +133,10 @@ void OutputFile::open() {
     if (exists) static_cast<void>(fchmod(descriptor, existing.st_mode & 07777));
     stream_ = fdopen(descriptor, "wb");
     if (stream_ == nullptr) {
+        const int failure = errno;
         close(descriptor);
         discard();
-        throw Error(strerror(errno));
+        throw Error(strerror(failure));
     }
 }
 

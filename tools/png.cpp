@@ -117,8 +117,9 @@ bool read_header(Decoder* decoder) {
 bool read_rows(Decoder* decoder, uint8_t* rgba, const Listener& listener) {
     if (setjmp(decoder->errors.jump) != 0) return false;  // NOLINT(cert-err52-cpp)
     png_structp png = decoder->png;
-    png_fixed_point gamma = 0;
-    if (is_converted(*decoder) && png_get_gAMA_fixed(png, decoder->info, &gamma) != 0) {
+    if (is_converted(*decoder)) {
+        png_fixed_point gamma = 0;
+        png_get_gAMA_fixed(png, decoder->info, &gamma);
         png_set_gamma_fixed(png, PNG_DEFAULT_sRGB, gamma);
     }
     png_set_expand(png);
@@ -176,8 +177,7 @@ PngColors read_colors(const Decoder& decoder) {
     if (!is_converted(decoder)) return colors;
     colors.has_gamma = true;
     std::array<int32_t, 8> xy = {};
-    if (has_chunk(decoder, PNG_INFO_cHRM) &&
-        png_get_cHRM_fixed(decoder.png, decoder.info, &xy[0], &xy[1], &xy[2], &xy[3], &xy[4],
+    if (png_get_cHRM_fixed(decoder.png, decoder.info, &xy[0], &xy[1], &xy[2], &xy[3], &xy[4],
                            &xy[5], &xy[6], &xy[7]) != 0) {
         colors.chromaticities = xy;
     }

@@ -108,7 +108,7 @@ bool selftest(const Options& options) {
     for (const Outcome& outcome : outcomes) {
         json.push_back(as_json(outcome));
         if (!options.json) std::cout << in_words(outcome);
-        all_are_right = all_are_right && outcome.different.empty();
+        if (!outcome.different.empty()) all_are_right = false;
     }
     if (options.json) std::cout << json_line(json);
     return all_are_right;

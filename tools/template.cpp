@@ -31,7 +31,7 @@ std::vector<fs::path> images_below(const fs::path& folder) {
                 images.push_back(entry.path());
         }
     } catch (const fs::filesystem_error& error) {
-        throw Error(error.path1().string() + ": " + error.code().message());
+        throw Error(folder.string() + ": " + error.code().message());
     }
     std::sort(images.begin(), images.end());
     return images;

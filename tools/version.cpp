@@ -12,7 +12,7 @@ namespace {
 const char* kernels() {
     ovrin::NamedKernels sets[ovrin::kMaxSets];
     int32_t number = ovrin::available_kernels(sets) - 1;
-    while (number > 0 && sets[number].kernels != &ovrin::kernels()) --number;
+    while (sets[number].kernels != &ovrin::kernels()) --number;
     return sets[number].name;
 }
 

@@ -93,8 +93,8 @@ printf 'P6 1 1 70000\nabcdef' >deep.ppm
 fails 1 'deep.ppm: damaged PNM' deep.ppm no.png --size 3x3
 printf 'P6 99999999999999999999 1 255\nabc' >overflow.ppm
 fails 1 'overflow.ppm: damaged PNM' overflow.ppm no.png --size 3x3
-# A message is one line even when it quotes a name that is not.
-fails 1 'No such file' "$(printf 'two\nlines')" no.png --size 3x3
+# A message is one line even when it quotes a name that is not, and keeps control characters to itself.
+fails 1 'two lines ?: No such file' "$(printf 'two\nlines\177?')" no.png --size 3x3
 
 # ---- Files that cannot be written ----
 
@@ -108,15 +108,32 @@ mkdir locked
 chmod a-w locked
 # The superuser writes anyway.
 [ "$(id -u)" = 0 ] || fails 1 'cannot be written' in.ppm locked/no.png --size 3x3
-# A full disk, played by a limit on the size of files.
+# A full disk, played by a limit on the size of files that what coverage counts fits into.
+{
+    printf 'P6\n1000 1000\n255\n'
+    head -c 3000000 /dev/urandom
+} >noise.ppm
 for type in png jpg ppm; do
     (
-        ulimit -f 4
-        fails 1 "no.$type: .*\(Write Error\|disk space?\|File too large\)" in.ppm "no.$type" -s 999x999! -q 100
+        ulimit -f 1024
+        fails 1 "no.$type: .*\(Write Error\|disk space?\|File too large\)" noise.ppm "no.$type" -s 1000x1000! -q 100
         exit "$failures"
     ) || failures=$((failures + 1))
 done
 fails 1 'at most 65500\|65500 pixels' in.ppm no.jpg --size 65501x1!
+
+# ---- Folders that cannot be read to their end ----
+
+# Each level takes a descriptor.
+deep=deep/$(seq -s / 30)
+mkdir -p "$deep"
+cp in.ppm "$deep"
+(
+    ulimit -n 20
+    fails 1 'deep: Too many open files' deep -r -s 3 -o '%s.png'
+    exit "$failures"
+) || failures=$((failures + 1))
+"$tool" deep -r -s 3 -o '%s.png' --quiet || complain "exit code $? of a deep folder"
 
 # ---- Standard input and output ----
 
@@ -125,8 +142,15 @@ works in.ppm expected.ppm --size 24x20
 cmp -s expected.ppm piped.ppm || complain "standard input and output give another picture"
 "$tool" in.png - -s 24x20 >piped.png || complain "exit code $? of: in.png -"
 has_size piped.png 24x20
-"$tool" in.ppm - -s 300x300! >/dev/full 2>stderr && complain "success with a full standard output"
-grep -q '^ovrinresize: -: ' stderr || complain "full standard output gives: $(cat stderr)"
+# A full device: what is written at once, and what is written at the end.
+for type in ppm pam rgb nv21 jpg png; do
+    for size in 300x300! 3x3!; do
+        "$tool" in.ppm - -s $size -t $type -e nearest >/dev/full 2>stderr &&
+            complain "success with a full standard output: $type, $size"
+        grep -q '^ovrinresize: -: .*\(No space left\|Write Error\|disk space?\)' stderr ||
+            complain "full standard output gives: $(cat stderr)"
+    done
+done
 
 # ---- What was done ----
 

@@ -49,6 +49,7 @@ make_coloured() {
     exiftool -q -q -n -SRGBRendering=1 -o srgb.png plain.png
     exiftool -q -q -n -ColorSpace=1 -o exif_srgb.jpg plain.jpg
     exiftool -q -q -n -ColorSpace=65535 -o exif_uncalibrated.jpg plain.jpg
+    exiftool -q -q -n -ColorSpace=1 -o exif_and_profile.jpg wide.jpg
     exiftool -q -Gamma=1 -o linear.png plain.png
     convert plain.png -density 300 -units PixelsPerInch 300dpi.png
     convert plain.png -density 300 -units PixelsPerInch 300dpi.jpg
@@ -69,6 +70,7 @@ make_transparent() {
     convert -size 20x20 xc:'gray(200)' xc:'graya(90,0)' +append -colorspace Gray gray_halo.png
     convert -size 40x20 xc:'rgba(100,50,200,0.5)' PNG32:half.png
     convert -size 40x20 xc:'rgba(100,50,200,0)' PNG32:nothing.png
+    convert half.png -alpha off PNG24:shown.png
     convert halo.png -channel A -threshold 50% +channel -colors 4 PNG8:palette_halo.png
     exiftool -q -q "-ICC_Profile<=$profiles/Gray.icc" -o gray_halo_profile.png gray_halo.png
 }
@@ -142,6 +144,7 @@ make_videos() {
     done
     # Samples of 0, 2, 1022 and 65535, of 10 bits.
     printf 'YUV4MPEG2 W4 H1 Cmono10\nFRAME\n\x00\x00\x02\x00\xfe\x03\xff\xff' >steps.y4m
+    head -c 30 steps.y4m >no_samples.y4m
     head -c 100000 in_yuv420p10le.y4m >cut.y4m
 }
 
@@ -184,8 +187,19 @@ make_frames() {
     } >three.y4m
     sed '2,$!d' three.y4m >headless
     { head -n 1 three.y4m; head -c $((2 * (6 + 96))) headless; } >two.y4m
+    head -n 1 three.y4m >no_frame.y4m
+    { cat no_frame.y4m; head -c $((6 + 96)) headless; } >one.y4m
+    convert -size 8x8 xc:'gray(64)' gray64.png
+    { echo 'YUV4MPEG2 W8 H8 C422'; echo FRAME; head -c 128 /dev/zero; } >in_8x8_422.y4m
     tr '\100' '\103' <three.y4m >brighter.y4m
     tail -c 96 three.y4m >gray.i420
+}
+
+# What info and compare only look at.
+make_others() {
+    convert plain.png -resize 60x41! tall.png
+    { printf 'P6 4 2 255\n'; head -c 24 sample.rgb; } >in_4x2.ppm
+    { printf 'P7\nWIDTH 4\nHEIGHT 2\nDEPTH 4\nMAXVAL 255\nTUPLTYPE RGB_ALPHA\nENDHDR\n'; head -c 32 sample.rgb; } >in_4x2.pam
 }
 
 make_fixtures() {
@@ -196,6 +210,7 @@ make_fixtures() {
     make_announcement
     make_frames
     make_album
+    make_others
 }
 
 # tag NAME FILE: what exiftool says; nothing where there is none.

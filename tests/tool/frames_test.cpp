@@ -264,6 +264,12 @@ TEST(Y4mHeaders, AreReadAndWritten) {
     EXPECT_EQ(y4m_header_line(parse_y4m_header("YUV4MPEG2 H1 W2")), "YUV4MPEG2 W2 H1 A0:0\n");
 }
 
+TEST(Y4mHeaders, OfOtherFilesAreRefused) {
+    EXPECT_THROW(tool::parse_y4m_header(""), tool::Error);
+    EXPECT_THROW(tool::parse_y4m_header("YUV4MPEG W1 H1"), tool::Error);
+    EXPECT_NO_THROW(tool::parse_y4m_header("YUV4MPEG2 W1 H1"));
+}
+
 TEST(Y4mHeaders, WithBadNumbersAreRefused) {
     for (const char* tags : {"W", "Wx", "W2x", "W-1", "W2147483648", "W99999999999999999999"}) {
         EXPECT_THROW(parse_y4m_header(std::string("YUV4MPEG2 H2 ") + tags), Error) << tags;

@@ -27,6 +27,20 @@ done
 cp picture.ppm other.ppm
 alone picture.ppm other.ppm -s 10 -o "%s.png" --threads 1 || complain "exit code $? of two pictures with one thread"
 
+# Threads that the system does not have cost time, nothing else.
+cp picture.ppm third.ppm
+for engine in quarter thumbnail lanczos bilinear; do
+    "$tool" high.rgba with.rgba --format rgba --input-size 40x1200 -s 15x400! -e $engine ||
+        complain "exit code $? of $engine"
+    THREADS=refused alone high.rgba without.rgba --format rgba --input-size 40x1200 -s 15x400! -e $engine ||
+        complain "exit code $? of $engine without threads: $(cat stderr)"
+    cmp -s with.rgba without.rgba || complain "$engine gives other bytes without threads"
+done
+mkdir many
+THREADS=refused alone picture.ppm other.ppm third.ppm -s 10 -o "many/%s.png" --jobs 3 ||
+    complain "exit code $? of three pictures without threads: $(cat stderr)"
+[ "$(find many -name '*.png' | wc -l)" = 3 ] || complain "without threads only: $(ls many)"
+
 # That can fail.
 alone high.rgba out.rgba --format rgba --input-size 40x1200 -s 20x600 -e quarter --threads 5 &&
     complain "no thread was started where five are allowed"
