@@ -16,7 +16,7 @@ rm -rf ./*
 mkdir -p apt/lists/partial apt/archives/partial
 : >apt/status
 apt=(apt-get -qq -o APT::Architecture=arm64 -o APT::Architectures=arm64 -o Dir::State="$PWD/apt"
-    -o Dir::State::status="$PWD/apt/status" -o Dir::Cache="$PWD/apt" -o APT::Sandbox::User=root)
+    -o Dir::State::status="$PWD/apt/status" -o Dir::Cache="$PWD/apt" -o APT::Sandbox::User=root -o Acquire::Retries=5)
 "${apt[@]}" update
 "${apt[@]}" download "$package"
 dpkg-deb -x "$package"_*_arm64.deb .

@@ -25,8 +25,13 @@ const FLAGS = [
     '--use-fake-ui-for-media-stream',
 ];
 
+// On a busy machine everything takes long; what never comes is given up then.
+export const PATIENCE_MS = 180000;
+
 export function startBrowser() {
-    return chromium.launch({ executablePath: '/usr/bin/chromium', chromiumSandbox: false, args: FLAGS });
+    return chromium.launch({
+        executablePath: '/usr/bin/chromium', chromiumSandbox: false, args: FLAGS, timeout: PATIENCE_MS,
+    });
 }
 
 /** Serves the folder of the project, and an empty page at its root; gives { url, close }. */
@@ -49,6 +54,7 @@ export async function serve() {
 /** A page that fails the test when it complains, or asks for anything but itself. */
 export async function watchedPage(context, address) {
     const page = await context.newPage();
+    page.setDefaultTimeout(PATIENCE_MS);
     page.complaints = [];
     page.on('console', (message) => {
         if (message.type() === 'error' || message.type() === 'warning') page.complaints.push(message.text());

@@ -5,7 +5,7 @@ import { readFileSync } from 'node:fs';
 import { join } from 'node:path';
 import { after, before, test } from 'node:test';
 
-import { serve, startBrowser } from './browser.mjs';
+import { PATIENCE_MS, serve, startBrowser } from './browser.mjs';
 import { differences } from './golden.mjs';
 import { assertSame, nativeFrame, noise, root } from './native.mjs';
 
@@ -17,6 +17,7 @@ before(async () => {
     browser = await startBrowser();
     server = await serve();
     page = await browser.newPage();
+    page.setDefaultTimeout(PATIENCE_MS);
     await page.goto(server.url);
 });
 

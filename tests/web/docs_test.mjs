@@ -3,7 +3,7 @@
 import assert from 'node:assert/strict';
 import { after, before, test } from 'node:test';
 
-import { serve, startBrowser } from './browser.mjs';
+import { PATIENCE_MS, serve, startBrowser } from './browser.mjs';
 
 const PAGES = ['index', 'group__c3', 'md_docs_functions', 'md_docs_coming_from', 'md_docs_performance',
     'md_docs_resamplers', 'namespaceovrin_1_1v1'];
@@ -21,6 +21,7 @@ after(async () => {
 
 async function open(name, width, colorScheme) {
     const page = await browser.newPage({ viewport: { width, height: 800 }, colorScheme });
+    page.setDefaultTimeout(PATIENCE_MS);
     page.complaints = [];
     page.on('console', (message) => {
         const ours = !message.location().url.endsWith('/favicon.ico'); // the browser's own wish

@@ -12,7 +12,7 @@ if ! cmp -s "$here/package-lock.json" "$folder/fetched.json"; then
     rm -rf "$folder"
     mkdir -p "$folder"
     cp "$here/package.json" "$here/package-lock.json" "$folder"
-    npm ci --prefix "$folder" --ignore-scripts --no-audit --no-fund
+    npm ci --prefix "$folder" --ignore-scripts --no-audit --no-fund --fetch-retries 5
     cp "$here/package-lock.json" "$folder/fetched.json"
 fi
 cp "$here"/*.mjs "$here"/*.ts "$folder"

@@ -10,7 +10,7 @@ fetch_compiler() {
     rm -rf "$folder"
     mkdir -p "$folder"
     cp "$here/package.json" "$here/package-lock.json" "$folder"
-    npm ci --prefix "$folder" --ignore-scripts --no-audit --no-fund
+    npm ci --prefix "$folder" --ignore-scripts --no-audit --no-fund --fetch-retries 5
     cp "$here/package-lock.json" "$folder/fetched.json"
 }
 

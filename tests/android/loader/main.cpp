@@ -41,7 +41,7 @@ bool pool_works(const Pool& pool, int32_t sync) {
     int queued = 0;
     for (int i = 0; i < kTasks; ++i) queued += pool.add_task(made, count, &done, 1);
     pool.free(made, sync);
-    for (int i = 0; i < 10000 && done != kTasks; ++i) pool.sleep(1000);
+    for (int i = 0; i < 100000 && done != kTasks; ++i) pool.sleep(1000);
     printf("thread pool, %s: %d of %d tasks done\n",
            sync != 0 ? "ended by its caller" : "ended in the background", done.load(), kTasks);
     return queued == kTasks && done == kTasks;
