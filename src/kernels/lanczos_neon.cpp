@@ -80,10 +80,16 @@ public:
     }
 
     uint64_t add_block(uint8_t* dst, int32_t first) const {
-        // A byte of ones for each uncertain one, then a bit.
+        // A byte of ones for each uncertain one. Unrolled, compilers mix the groups up and run out
+        // of registers.
+        uint8_t marks[kBlock * kPixel];
+#pragma GCC unroll 1
+        for (int32_t i = 0; i < kBlock * kPixel; i += kVectorBytes) {
+            vst1q_u8(marks + i, add_group(dst + i, first + i));
+        }
         const uint8x16_t bit = vreinterpretq_u8_u64(vdupq_n_u64(0x8040201008040201));
         const auto bits = [&](int32_t i) {
-            return vandq_u8(add_group(dst + i * kVectorBytes, first + i * kVectorBytes), bit);
+            return vandq_u8(vld1q_u8(marks + i * kVectorBytes), bit);
         };
         const uint8x16_t low = vpaddq_u8(bits(0), bits(1));
         const uint8x16_t high = vpaddq_u8(bits(2), bits(3));
@@ -212,7 +218,10 @@ struct Neon {
 
     static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,
                           int32_t first) {
-        const auto tap = [&](int32_t k) { return span + (plan.index[x + k] - first) * kPixel; };
+        // As pixels, which loads can count in: compilers would multiply four indices in a vector
+        // and move them back one by one.
+        const auto* pixels = reinterpret_cast<const float(*)[kPixel]>(span);
+        const auto tap = [&](int32_t k) { return pixels[plan.index[x + k] - first]; };
         const auto weights = [&](int32_t k, int32_t i) {
             return vld1q_f32(plan.weights[x + k] + i);
         };
@@ -237,7 +246,10 @@ struct Neon {
 
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
                            const uint16_t* bytes, int32_t count) {
-        run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
+        // One after the other takes less time than eight side by side.
+        constexpr int32_t kFew = 2;
+        if (count > kFew) return run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
+        for (int32_t i = 0; i < count; ++i) run_chain(columns, row, bytes[i]);
     }
 };
 
