@@ -10,13 +10,13 @@
 // How far the two lie apart, with u = 2^-24, and V and H the sums of the absolute row and column
 // weights. Each term of a sum is off by u of its size for every rounding that it goes through. In a
 // source row these are the rounding of the weight to single precision and at most five operations,
-// however a set arranges them: such a sum lies within 6 u * 255 H of the exact one. The seven row
-// sums are added to 0.5 by seven fused operations, with rounded weights: at most 8 u * 255 V H more
-// from the terms, and 7 u * 0.5 from the 0.5. Together 14 u * 255 V H + 3.5 u. A set may begin with
-// 0 instead and measure from whole numbers: then 0.5 less the distance is off by u / 2, and nothing
-// else by more. Calling it 14.5 u * (255 V H + 1) leaves 0.5 u * 255 V H for products of errors and
-// for the rounding of the chain and of this bound itself, which take less than a thousandth of
-// that.
+// however a set arranges them; bytes of the same weight may be added before, which is exact. Such a
+// sum lies within 6 u * 255 H of the exact one. The seven row sums are added to 0.5 by seven fused
+// operations, with rounded weights: at most 8 u * 255 V H more from the terms, and 7 u * 0.5 from
+// the 0.5. Together 14 u * 255 V H + 3.5 u. A set may begin with 0 instead and measure from whole
+// numbers: then 0.5 less the distance is off by u / 2, and nothing else by more. Calling it
+// 14.5 u * (255 V H + 1) leaves 0.5 u * 255 V H for products of errors and for the rounding of the
+// chain and of this bound itself, which take less than a thousandth of that.
 #pragma once
 
 #include <string.h>
@@ -169,17 +169,18 @@ void sum_pixel_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src
     }
 }
 
+// What filters source rows of so many components.
 template <class Set>
-void sum_source_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src) {
-    switch (plan.columns->src_components) {
+SumLanczosRow* row_sums(int32_t components) {
+    switch (components) {
         case 1:
-            return sum_narrow_row<1>(sums, plan, src);
+            return sum_narrow_row<1>;
         case 2:
-            return sum_narrow_row<2>(sums, plan, src);
+            return sum_narrow_row<2>;
         case 3:
-            return sum_narrow_row<3>(sums, plan, src);
+            return sum_narrow_row<3>;
         default:
-            return sum_pixel_row<Set>(sums, plan, src);
+            return sum_pixel_row<Set>;
     }
 }
 
@@ -275,7 +276,7 @@ void filter_row(const LanczosRow& row, const LanczosStripPlan& plan, LanczosSums
         const int32_t source_row = row.source_rows[r];
         const int32_t slot = source_row % kLanczosTaps;
         if (sums.rows[slot] != source_row) {
-            sum_source_row<Set>(sums.values[slot], plan, row.taps[r]);
+            plan.sum_row(sums.values[slot], plan, row.taps[r]);
             sums.rows[slot] = source_row;
         }
         rows[r] = sums.values[slot];
@@ -294,7 +295,9 @@ void filter_row(const LanczosRow& row, const LanczosStripPlan& plan, LanczosSums
 
 template <class Set>
 FilterLanczos* plan_filter(LanczosStripPlan& plan, const LanczosColumns& columns) {
-    return plan_approximation(plan, columns) ? filter_row<Set> : filter_by_chains;
+    if (!plan_approximation(plan, columns)) return filter_by_chains;
+    plan.sum_row = row_sums<Set>(columns.src_components);
+    return filter_row<Set>;
 }
 
 }  // namespace

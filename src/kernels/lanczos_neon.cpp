@@ -3,6 +3,7 @@
 #include <arm_neon.h>
 #include <string.h>
 
+#include "kernels/inline.h"
 #include "kernels/lanczos_approximation_inl.h"
 #include "kernels/sets.h"
 
@@ -26,6 +27,10 @@ constexpr uint8_t kAsWholes[4][kVectorBytes] = {
     {8, k0, k0, kTop, 9, k0, k0, kTop, 10, k0, k0, kTop, 11, k0, k0, kTop},
     {12, k0, k0, kTop, 13, k0, k0, kTop, 14, k0, k0, kTop, 15, k0, k0, kTop},
 };
+
+// Three pixels, the last one first, and a fourth one of zeros.
+constexpr uint8_t kMirror[kVectorBytes] = {12, 13, 14, 15, 8,  9,  10, 11,
+                                           4,  5,  6,  7,  k0, k0, k0, k0};
 
 // What follows goes through four pixels in step: processors that work in order would wait for each
 // sum to be ready before they add to it.
@@ -80,10 +85,16 @@ public:
     }
 
     uint64_t add_block(uint8_t* dst, int32_t first) const {
-        // A byte of ones for each uncertain one, then a bit.
+        // A byte of ones for each uncertain one. Unrolled, compilers mix the groups up and run out
+        // of registers.
+        uint8_t marks[kBlock * kPixel];
+#pragma GCC unroll 1
+        for (int32_t i = 0; i < kBlock * kPixel; i += kVectorBytes) {
+            vst1q_u8(marks + i, add_group(dst + i, first + i));
+        }
         const uint8x16_t bit = vreinterpretq_u8_u64(vdupq_n_u64(0x8040201008040201));
         const auto bits = [&](int32_t i) {
-            return vandq_u8(add_group(dst + i * kVectorBytes, first + i * kVectorBytes), bit);
+            return vandq_u8(vld1q_u8(marks + i * kVectorBytes), bit);
         };
         const uint8x16_t low = vpaddq_u8(bits(0), bits(1));
         const uint8x16_t high = vpaddq_u8(bits(2), bits(3));
@@ -212,7 +223,10 @@ struct Neon {
 
     static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,
                           int32_t first) {
-        const auto tap = [&](int32_t k) { return span + (plan.index[x + k] - first) * kPixel; };
+        // As pixels, which loads can count in: compilers would multiply four indices in a vector
+        // and move them back one by one.
+        const auto* pixels = reinterpret_cast<const float(*)[kPixel]>(span);
+        const auto tap = [&](int32_t k) { return pixels[plan.index[x + k] - first]; };
         const auto weights = [&](int32_t k, int32_t i) {
             return vld1q_f32(plan.weights[x + k] + i);
         };
@@ -237,14 +251,101 @@ struct Neon {
 
     static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
                            const uint16_t* bytes, int32_t count) {
-        run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
+        // One after the other takes less time than eight side by side.
+        constexpr int32_t kFew = 2;
+        if (count > kFew) return run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
+        for (int32_t i = 0; i < count; ++i) run_chain(columns, row, bytes[i]);
     }
 };
+
+// Whether the weights of every column are the same from either end: those of whole ratios are,
+// whose taps lie around a source pixel.
+bool is_mirrored(const LanczosStripPlan& plan) {
+    for (int32_t x = 0; x < plan.columns->count; ++x) {
+        const float* weights = plan.weights[x];
+        for (int32_t i = 0; i < kLanczosTaps / 2; ++i) {
+            if (weights[i] != weights[kLanczosTaps - 1 - i]) return false;
+        }
+    }
+    return true;
+}
+
+// In such a plan the weights of the second half make room for what a whole number's base adds to
+// the first product, below 0: a fused operation takes it off for nothing, and rounds once, as a
+// product is rounded.
+constexpr int32_t kBase = 4;
+void plan_bases(LanczosStripPlan& plan) {
+    for (int32_t x = 0; x < padded_count(plan); ++x) {
+        float* weights = plan.weights[x];
+        for (int32_t i = 0; i < kPixel; ++i) weights[kBase + i] = -kWholes * weights[0];
+    }
+}
+
+// The sums of taps that have the same weight, of two pairs each: what is left to be converted and
+// weighed is half as much.
+struct TapPairs {
+    uint16x8_t outer;  // the first and the last tap, then the second and the last but one
+    uint16x8_t inner;  // the third and the last but two, then the middle one alone
+};
+
+OVRIN_ALWAYS_INLINE TapPairs add_mirrored_taps(const uint8_t* taps) {
+    const uint8x16_t left = vld1q_u8(taps);
+    const uint8x16_t right = vqtbl1q_u8(vld1q_u8(taps + 3 * kPixel), vld1q_u8(kMirror));
+    return {vaddl_u8(vget_low_u8(left), vget_low_u8(right)), vaddl_high_u8(left, right)};
+}
+
+// Numbers as floats, kWholes more than they are.
+float32x4_t low_wholes(uint16x8_t numbers) {
+    return vreinterpretq_f32_u16(vzip1q_u16(numbers, vdupq_n_u16(kTopOfWholes << 8)));
+}
+
+float32x4_t high_wholes(uint16x8_t numbers) {
+    return vreinterpretq_f32_u16(vzip2q_u16(numbers, vdupq_n_u16(kTopOfWholes << 8)));
+}
+
+void sum_mirrored_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src) {
+    const auto* pixels = reinterpret_cast<const uint8_t(*)[kPixel]>(src);
+    const float32x4_t base = vdupq_n_f32(kWholes);
+    const int32_t padded = padded_count(plan);
+    for (int32_t x = 0; x < padded; x += kGroup) {
+        const auto add_taps = [&](int32_t k) {
+            return add_mirrored_taps(pixels[plan.index[x + k]]);
+        };
+        const auto floats = [&](int32_t k, int32_t i) {
+            return vld1q_f32(plan.weights[x + k] + i);
+        };
+        const TapPairs pairs[kGroup] = {add_taps(0), add_taps(1), add_taps(2), add_taps(3)};
+        const float32x4_t weights[kGroup] = {floats(0, 0), floats(1, 0), floats(2, 0),
+                                             floats(3, 0)};
+        float32x4_t values[kGroup] = {floats(0, kBase), floats(1, kBase), floats(2, kBase),
+                                      floats(3, kBase)};
+        for (int32_t k = 0; k < kGroup; ++k) {
+            values[k] = vfmaq_laneq_f32(values[k], low_wholes(pairs[k].outer), weights[k], 0);
+        }
+        for (int32_t k = 0; k < kGroup; ++k) {
+            const float32x4_t pair = vsubq_f32(high_wholes(pairs[k].outer), base);
+            values[k] = vfmaq_laneq_f32(values[k], pair, weights[k], 1);
+        }
+        for (int32_t k = 0; k < kGroup; ++k) {
+            const float32x4_t pair = vsubq_f32(low_wholes(pairs[k].inner), base);
+            values[k] = vfmaq_laneq_f32(values[k], pair, weights[k], 2);
+        }
+        for (int32_t k = 0; k < kGroup; ++k) {
+            const float32x4_t middle = vsubq_f32(high_wholes(pairs[k].inner), base);
+            vst1q_f32(sums + (x + k) * kPixel, vfmaq_laneq_f32(values[k], middle, weights[k], 3));
+        }
+    }
+}
 
 }  // namespace
 
 FilterLanczos* plan_lanczos_neon(LanczosStripPlan& plan, const LanczosColumns& columns) {
-    return plan_filter<Neon>(plan, columns);
+    FilterLanczos* filter = plan_filter<Neon>(plan, columns);
+    if (filter == filter_row<Neon> && columns.src_components == kPixel && is_mirrored(plan)) {
+        plan.sum_row = sum_mirrored_row;
+        plan_bases(plan);
+    }
+    return filter;
 }
 
 }  // namespace ovrin

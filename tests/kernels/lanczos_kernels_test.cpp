@@ -48,6 +48,19 @@ void replace_weights(reference::LanczosAxis& axis, double limit, Random& random)
     }
 }
 
+// The same from either end, as those of whole ratios are; or all but one of them.
+void mirror_weights(reference::LanczosAxis& axis, Random& random) {
+    for (reference::LanczosTaps& taps : axis.taps) {
+        std::reverse_copy(taps.begin(), taps.begin() + kLanczosTaps / 2,
+                          taps.end() - kLanczosTaps / 2);
+    }
+    if (random.between(0, 1) == 0) return;
+    const int32_t last = static_cast<int32_t>(axis.taps.size()) - 1;
+    const int32_t column = random.pick({0, last, random.between(0, last)});
+    const int32_t tap = random.between(0, kLanczosTaps - 1);
+    axis.taps[static_cast<size_t>(column)][static_cast<size_t>(tap)] += 0.0625;
+}
+
 void fill_columns(LanczosColumns& columns, const Strip& s) {
     columns.weights = s.across.taps[0].data();
     columns.src_components = s.src_components;
@@ -106,6 +119,7 @@ TEST_F(LanczosKernelsTest, FilterEqualsTheScalarOne) {
             const double limit = random.pick({0.0, 0.0, 0.0, 0.3, 3.0, 1e6});
             if (limit > 0 && random.between(0, 1) == 0) replace_weights(s.down, limit, random);
             if (limit > 0) replace_weights(s.across, limit, random);
+            if (random.between(0, 2) == 0) mirror_weights(s.across, random);
             fill_columns(*columns, s);
             const auto rows = source_rows(s, random);
             FilterLanczos* scalar = scalar_kernels.plan_lanczos(*scalar_plan, *columns);
