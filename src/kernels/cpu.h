@@ -17,8 +17,7 @@ struct CpuWords {
     unsigned basic_ecx;     // of CPUID's leaf 1
     unsigned extended_ebx;  // of leaf 7, 0 where the processor has none
     unsigned extended_ecx;
-    unsigned
-        saved_state;  // register state that the operating system saves when it switches threads
+    unsigned saved_state;  // registers that the system keeps when it switches threads
 };
 
 CpuFeatures features_of(const CpuWords& words);
