@@ -80,7 +80,7 @@ corpus_of() {
 run_libfuzzer() {
     # shellcheck disable=SC2046 # a list
     "${emulator[@]}" "build/$build/fuzz/fuzz_$1" -max_len="${longest[$1]:-96}" -len_control=0 -timeout=60 \
-        -print_final_stats=1 -verbosity=1 -artifact_prefix="$work/crashes/$1-" $(limits "$1") \
+        -reload=0 -print_final_stats=1 -verbosity=1 -artifact_prefix="$work/crashes/$1-" $(limits "$1") \
         "$2" "fuzz/corpus/$1" >"$3" 2>&1 || return 1
     runs=$(statistic number_of_executed_units "$3")
     rate=$(statistic average_exec_per_sec "$3")
@@ -93,10 +93,11 @@ run_afl() {
     rm -rf "$folder"
     mkdir -p "$folder/in"
     find "$2" "fuzz/corpus/$1" -type f -exec cp -t "$folder/in" {} +
-    # Neither the processor's clock nor the kernel's handling of crashes is to be changed for it.
+    # It hands over each input and waits: on one processor that takes half as long. Neither the
+    # processor's clock nor the kernel's handling of crashes is to be changed for it.
     # shellcheck disable=SC2086 # a list
     env -u ASAN_OPTIONS -u UBSAN_OPTIONS \
-        AFL_NO_UI=1 AFL_NO_AFFINITY=1 AFL_SKIP_CPUFREQ=1 AFL_I_DONT_CARE_ABOUT_MISSING_CRASHES=1 \
+        AFL_NO_UI=1 AFL_TRY_AFFINITY=1 AFL_SKIP_CPUFREQ=1 AFL_I_DONT_CARE_ABOUT_MISSING_CRASHES=1 \
         AFL_BENCH_UNTIL_CRASH=1 \
         afl-fuzz -i "$folder/in" -o "$folder" -G "${longest[$1]:-96}" -t 60000 $limit \
         -- "build/$build/fuzz/fuzz_$1" >"$3" 2>&1 || return 1
