@@ -88,8 +88,11 @@ int replace(const std::string& from, const std::string& hidden, const std::strin
         _exit(failure);
     }
     int status = 0;
-    while (waitpid(child, &status, 0) < 0 && errno == EINTR) {
-    }
+    pid_t waited = -1;
+    do {
+        waited = waitpid(child, &status, 0);
+    } while (waited < 0 && errno == EINTR);
+    if (waited < 0) return errno;
     return WIFEXITED(status) ? WEXITSTATUS(status) : EINTR;
 }
 

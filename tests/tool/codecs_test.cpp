@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 #include <png.h>
 
+#include <algorithm>
 #include <array>
 #include <cstdio>
 #include <cstdlib>
@@ -17,6 +18,7 @@
 #include "codecs.h"
 #include "convert.h"
 #include "error.h"
+#include "exif.h"
 #include "support/random.h"
 
 using ovrin_test::Random;
@@ -135,7 +137,7 @@ Bytes jpeg_of(
         jpeg_start_compress(&codec, TRUE);
         Bytes samples(static_cast<size_t>(8 * channels), 200);
         JSAMPROW row = samples.data();
-        jpeg_write_scanlines(&codec, &row, 1);
+        while (codec.next_scanline < codec.image_height) jpeg_write_scanlines(&codec, &row, 1);
         jpeg_finish_compress(&codec);
         jpeg_destroy_compress(&codec);
     });
@@ -408,6 +410,140 @@ TEST(Codecs, PngWithADamagedCommentIsRead) {
               (Bytes{7, 7, 7, 255, 250, 250, 250, 255}));
 }
 
+// What stands behind the pixels is missing altogether: nothing of the picture is.
+TEST(Codecs, PngWithoutAnEndIsRead) {
+    Bytes file = png_of(8, PNG_COLOR_TYPE_GRAY, {7, 250});
+    file.resize(file.size() - 12);
+    EXPECT_EQ(pixels_of(decode_png(file.data(), file.size())),
+              (Bytes{7, 7, 7, 255, 250, 250, 250, 255}));
+}
+
+TEST(Codecs, PngDensitiesThatAreNone) {
+    const auto density_of = [](uint8_t x, uint8_t y) {
+        // A pHYs chunk, the two numbers in the unit of the shape, with a sum that libpng works out.
+        const Bytes file = written([&](FILE* out) {
+            png_structp png =
+                png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
+            png_infop info = png_create_info_struct(png);
+            png_init_io(png, out);
+            png_set_IHDR(png, info, 1, 1, 8, PNG_COLOR_TYPE_GRAY, PNG_INTERLACE_NONE,
+                         PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
+            png_set_pHYs(png, info, x, y, PNG_RESOLUTION_UNKNOWN);
+            png_write_info(png, info);
+            png_write_row(png, Bytes{1}.data());
+            png_write_end(png, info);
+            png_destroy_write_struct(&png, &info);
+        });
+        tool::Metadata metadata;
+        tool::decode_png(file.data(), file.size(), &metadata);
+        return metadata.density;
+    };
+    EXPECT_TRUE(density_of(3, 2));
+    EXPECT_FALSE(density_of(0, 2));
+    EXPECT_FALSE(density_of(3, 0));
+}
+
+// Restart markers in another order, and pixels of a table that is not there.
+TEST(Codecs, JpegWithoutItsMarkersIsDamaged) {
+    const auto failure_of = [](const Bytes& file) -> std::string {
+        try {
+            tool::JpegReader(file).read({});
+        } catch (const tool::Error& error) {
+            return error.what();
+        }
+        return "";
+    };
+    const auto find_marker = [](const Bytes& file, uint8_t marker) {
+        const Bytes bytes = {0xFF, marker};
+        return std::search(file.begin(), file.end(), bytes.begin(), bytes.end());
+    };
+    const auto restarts = [](jpeg_compress_struct* codec) {
+        codec->restart_interval = 1;
+        codec->image_height = 200;
+    };
+    Bytes file = jpeg_of(JCS_GRAYSCALE, 1, restarts);
+    ASSERT_EQ(failure_of(file), "");
+    const auto restart = find_marker(file, 0xD1) - file.begin();
+    ASSERT_LT(restart, static_cast<ptrdiff_t>(file.size()));
+    file[static_cast<size_t>(restart) + 1] = 0xD5;
+    EXPECT_EQ(failure_of(file).substr(0, 14), "damaged JPEG: ");
+
+    file = jpeg_of(JCS_GRAYSCALE, 1);
+    const auto table = find_marker(file, 0xDB);
+    ASSERT_NE(table, file.end());
+    file.erase(table, table + 2 + 67);
+    EXPECT_EQ(failure_of(file), "damaged JPEG: Quantization table 0x00 was not defined");
+}
+
+// A second beginning in place of the end, which the codec meets when all pixels are there.
+TEST(Codecs, JpegThatBeginsAgainIsDamaged) {
+    Bytes file = encoded(kCodecs[1], gradient({40, 40}));
+    file.back() = 0xD8;
+    EXPECT_THROW(tool::JpegReader(file).read({false, 1}), tool::Error);
+    EXPECT_THROW(tool::JpegReader(file).read({true, 1}), tool::Error);
+}
+
+// EXIF whose numbers take two bytes or four, or are none at all.
+TEST(Codecs, ExifNumbersAreThoseOfTheirTypes) {
+    struct Entry {
+        uint16_t tag;
+        uint16_t type;
+        uint32_t count;
+        uint32_t value;
+    };
+    constexpr uint16_t kOrientation = 0x0112;
+    constexpr uint16_t kWidth = 0x0100;
+    constexpr uint16_t kByte = 1;
+    constexpr uint16_t kShort = 3;
+    constexpr uint16_t kLong = 4;
+    const auto exif_of = [](const std::vector<Entry>& entries) {
+        Bytes bytes(tool::kExifHead, tool::kExifHead + tool::kExifHeadBytes);
+        const auto put = [&](uint32_t number, int count) {
+            for (int i = 0; i < count; ++i) bytes.push_back(static_cast<uint8_t>(number >> 8 * i));
+        };
+        put(0x002A4949, 4);  // little end first
+        put(8, 4);
+        put(static_cast<uint32_t>(entries.size()), 2);
+        for (const Entry& entry : entries) {
+            put(entry.tag, 2);
+            put(entry.type, 2);
+            put(entry.count, 4);
+            put(entry.value, 4);
+        }
+        put(0, 4);
+        return bytes;
+    };
+    EXPECT_EQ(tool::exif_orientation(exif_of({{kOrientation, kShort, 1, 6}})), 6);
+    EXPECT_EQ(tool::exif_orientation(exif_of({{kOrientation, kLong, 1, 6}})), 6);
+    EXPECT_EQ(tool::exif_orientation(exif_of({{kOrientation, kByte, 1, 6}})), 0);
+    EXPECT_EQ(tool::exif_orientation(exif_of({{kOrientation, kShort, 2, 0x00070006}})), 0);
+    EXPECT_EQ(tool::exif_orientation(exif_of({{kWidth, kShort, 1, 6}})), 0);
+
+    const auto resized = [&](const Entry& width) {
+        const Bytes exif =
+            tool::resized_exif(exif_of({width, {kOrientation, kShort, 1, 6}}), {77, 55}, true);
+        EXPECT_EQ(tool::exif_orientation(exif), 1);
+        // The first entry's value.
+        const size_t at = tool::kExifHeadBytes + 8 + 2 + 8;
+        return exif.at(at) | exif.at(at + 1) << 8;
+    };
+    EXPECT_EQ(resized({kWidth, kShort, 1, 400}), 77);
+    EXPECT_EQ(resized({kWidth, kLong, 1, 400}), 77);
+    EXPECT_EQ(resized({kWidth, kByte, 1, 40}), 40);
+    EXPECT_EQ(resized({kWidth, kShort, 2, 0x00070028}), 40);
+}
+
+// Too short to say what it is for.
+TEST(Codecs, AStumpOfAProfileIsNotOneForGreys) {
+    tool::Metadata metadata;
+    EXPECT_TRUE(tool::fits_gray(metadata));
+    metadata.icc = Bytes(128, 0);
+    memcpy(metadata.icc.data() + 16, "GRAY", 4);
+    EXPECT_TRUE(tool::fits_gray(metadata));
+    metadata.icc.resize(19);
+    EXPECT_FALSE(tool::fits_gray(metadata));
+}
+
 TEST(Codecs, FirstBytesTellTypes) {
     const auto is = [](bool (*recognise)(const uint8_t*, size_t), const char* bytes) {
         return recognise(reinterpret_cast<const uint8_t*>(bytes), strlen(bytes));
@@ -553,16 +689,17 @@ TEST(Codecs, DamageEndsInAnErrorAtWorst) {
 }
 
 TEST(Codecs, UnwritableStreamsAreReported) {
+    Random random(3);
+    SCOPED_TRACE(random.trace());
+    // More than a buffer of it.
+    const Picture noise = random_picture(&random, {300, 300}, true);
     for (const Codec& codec : kCodecs) {
-        FILE* const full = fopen("/dev/full", "wb");
-        ASSERT_NE(full, nullptr);
-        EXPECT_THROW(
-            {
-                codec.encode(gradient({300, 300}), full);
-                if (fflush(full) != 0) throw tool::Error("flush");
-            },
-            tool::Error)
-            << codec.name;
-        static_cast<void>(fclose(full));
+        for (const int buffering : {_IOFBF, _IONBF}) {
+            FILE* const full = fopen("/dev/full", "wb");
+            ASSERT_NE(full, nullptr);
+            setvbuf(full, nullptr, buffering, BUFSIZ);
+            EXPECT_THROW(codec.encode(noise, full), tool::Error) << codec.name << buffering;
+            static_cast<void>(fclose(full));
+        }
     }
 }
