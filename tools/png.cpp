@@ -50,7 +50,9 @@ struct Decoder {
     Decoder(const uint8_t* data, size_t size) : errors(), unread{data, size} {
         png = png_create_read_struct(PNG_LIBPNG_VER_STRING, &errors, on_error, on_warning);
         if (png != nullptr) info = png_create_info_struct(png);
-        if (info == nullptr) throw std::bad_alloc();
+        if (info != nullptr) return;
+        png_destroy_read_struct(&png, nullptr, nullptr);
+        throw std::bad_alloc();
     }
     ~Decoder() { png_destroy_read_struct(&png, &info, nullptr); }
     Decoder(const Decoder&) = delete;
@@ -66,7 +68,9 @@ struct Encoder {
     Encoder() : errors() {
         png = png_create_write_struct(PNG_LIBPNG_VER_STRING, &errors, on_error, on_warning);
         if (png != nullptr) info = png_create_info_struct(png);
-        if (info == nullptr) throw std::bad_alloc();
+        if (info != nullptr) return;
+        png_destroy_write_struct(&png, nullptr);
+        throw std::bad_alloc();
     }
     ~Encoder() { png_destroy_write_struct(&png, &info); }
     Encoder(const Encoder&) = delete;
