@@ -93,11 +93,7 @@ private:
     std::atomic<int> wrong_{0};
 };
 
-#if defined(OVRIN_EMULATED)
-constexpr bool kChildHasThreads = false;
-#else
-constexpr bool kChildHasThreads = !kInstrumented;
-#endif
+constexpr bool kChildHasThreads = !kInstrumented && !kEmulated;
 constexpr const char* kWhyNot =
     "a child of fork with threads hangs or ends in the sanitizers' libraries and in qemu-user";
 

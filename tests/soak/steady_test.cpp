@@ -51,9 +51,7 @@ void print(int64_t calls, const State& state) {
 }  // namespace
 
 TEST(Steady, CallsLeaveNothingBehind) {
-#if defined(OVRIN_EMULATED)
-    GTEST_SKIP() << "qemu-user keeps 256 KB for every thread that there has been";
-#endif
+    if (kEmulated) GTEST_SKIP() << "qemu-user keeps 256 KB for every thread that there has been";
 #if defined(__GLIBC__)
     // Or a thread would get a heap of its own, of 64 MB, when it happens to need one.
     mallopt(M_ARENA_MAX, 1);

@@ -27,9 +27,9 @@ inline bool only_threads(int expected) {
     return thread_count() <= expected;
 }
 
-// The thread sanitizer has a thread of its own.
+// The thread sanitizer and qemu-user have a thread of their own.
 inline bool only_this_thread() {
-    return only_threads(kInstrumented ? 2 : 1);
+    return only_threads(kInstrumented || kEmulated ? 2 : 1);
 }
 
 }  // namespace ovrin_test

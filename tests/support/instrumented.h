@@ -10,4 +10,11 @@ constexpr bool kInstrumented = true;
 constexpr bool kInstrumented = false;
 #endif
 
+// Run by qemu-user.
+#if defined(OVRIN_EMULATED)
+constexpr bool kEmulated = true;
+#else
+constexpr bool kEmulated = false;
+#endif
+
 }  // namespace ovrin_test
