@@ -28,10 +28,10 @@ using SumLanczosRow = void(float* sums, const LanczosStripPlan& plan, const uint
 // that it was made for must stay as they are. The rest is the vector kernels' own.
 struct LanczosStripPlan {
     const LanczosColumns* columns;
-    SumLanczosRow* sum_row;
     double max_weights;  // of any column, the sum of its absolute weights
     int32_t index[kLanczosColumns];
     alignas(64) float weights[kLanczosColumns][kLanczosTaps + 1];
+    SumLanczosRow* sum_row;  // of pixels of four components
 };
 
 // Source rows filtered across, which kernels keep from one destination row of a strip to the next.

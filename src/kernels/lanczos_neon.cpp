@@ -208,6 +208,10 @@ private:
     double weights_[kLanczosTaps][kLanes];
 };
 
+struct Neon;
+template <>
+constexpr bool kPlansRows<Neon> = true;
+
 struct Neon {
     using WeightedRows = NeonRows;
 
@@ -341,6 +345,7 @@ void sum_mirrored_row(float* sums, const LanczosStripPlan& plan, const uint8_t* 
 
 FilterLanczos* plan_lanczos_neon(LanczosStripPlan& plan, const LanczosColumns& columns) {
     FilterLanczos* filter = plan_filter<Neon>(plan, columns);
+    plan.sum_row = sum_pixel_row<Neon>;
     if (filter == filter_row<Neon> && columns.src_components == kPixel && is_mirrored(plan)) {
         plan.sum_row = sum_mirrored_row;
         plan_bases(plan);
