@@ -19,11 +19,6 @@ struct LanczosColumns {
     int32_t index[kLanczosColumns];  // of every column, the pixel of its first tap
 };
 
-struct LanczosStripPlan;
-
-// Filters a source row across.
-using SumLanczosRow = void(float* sums, const LanczosStripPlan& plan, const uint8_t* src);
-
 // How kernels filter a strip of columns: made once, used for every row of the strip. The columns
 // that it was made for must stay as they are. The rest is the vector kernels' own.
 struct LanczosStripPlan {
@@ -31,7 +26,7 @@ struct LanczosStripPlan {
     double max_weights;  // of any column, the sum of its absolute weights
     int32_t index[kLanczosColumns];
     alignas(64) float weights[kLanczosColumns][kLanczosTaps + 1];
-    SumLanczosRow* sum_row;  // of pixels of four components
+    bool mirrored;  // every column's weights are the same from either end
 };
 
 // Source rows filtered across, which kernels keep from one destination row of a strip to the next.

@@ -169,11 +169,6 @@ void sum_pixel_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src
     }
 }
 
-// Whether a set has more than one way to sum pixels of four components, and its plans say which.
-// A single one is inlined, and takes 2 KB less of the stack.
-template <class Set>
-constexpr bool kPlansRows = false;
-
 template <class Set>
 void sum_source_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src) {
     switch (plan.columns->src_components) {
@@ -184,7 +179,9 @@ void sum_source_row(float* sums, const LanczosStripPlan& plan, const uint8_t* sr
         case 3:
             return sum_narrow_row<3>(sums, plan, src);
         default:
-            if constexpr (kPlansRows<Set>) return plan.sum_row(sums, plan, src);
+            if constexpr (Set::kMirrors) {
+                if (plan.mirrored) return Set::sum_mirrored_row(sums, plan, src);
+            }
             return sum_pixel_row<Set>(sums, plan, src);
     }
 }
@@ -268,6 +265,7 @@ void add_rows(const LanczosColumns& columns, const LanczosRow& row, const Rows& 
 // A set supplies:
 //   convert       kConverted bytes as floats
 //   sum_group     a group's pixels: their taps, weighed by column
+//   kMirrors      whether it sums pixels of mirrored columns in another way, by sum_mirrored_row
 //   WeightedRows  the sums of all source rows, and their weights
 //     add_block     a block's bytes, and a bit for each, set if it lies within the distance of
 //                   another byte

@@ -52,6 +52,7 @@ __m128i pack(__m256 low, __m256 high) {
 struct Avx2 {
     using Vector = __m256;
     using WeightedRows = WeightedRowsX86<Avx2>;
+    static constexpr bool kMirrors = false;
 
     static constexpr int32_t kConverted = kVectorFloats;
     static void convert(float* floats, const uint8_t* bytes) {

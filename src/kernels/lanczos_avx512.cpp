@@ -34,6 +34,7 @@ __m512 add_quarters(__m512 a, __m512 b) {
 struct Avx512 {
     using Vector = __m512;
     using WeightedRows = WeightedRowsX86<Avx512>;
+    static constexpr bool kMirrors = false;
 
     static constexpr int32_t kConverted = kVectorFloats;
     static void convert(float* floats, const uint8_t* bytes) {

@@ -208,60 +208,6 @@ private:
     double weights_[kLanczosTaps][kLanes];
 };
 
-struct Neon;
-template <>
-constexpr bool kPlansRows<Neon> = true;
-
-struct Neon {
-    using WeightedRows = NeonRows;
-
-    static constexpr int32_t kConverted = kVectorBytes;
-    static void convert(float* floats, const uint8_t* bytes) {
-        const uint8x16x2_t table = {{vld1q_u8(bytes), vdupq_n_u8(kTopOfWholes)}};
-        const float32x4_t base = vdupq_n_f32(kWholes);
-        for (int32_t k = 0; k < 4; ++k) {
-            const uint8x16_t whole = vqtbl2q_u8(table, vld1q_u8(kAsWholes[k]));
-            vst1q_f32(floats + 4 * k, vsubq_f32(vreinterpretq_f32_u8(whole), base));
-        }
-    }
-
-    static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,
-                          int32_t first) {
-        // As pixels, which loads can count in: compilers would multiply four indices in a vector
-        // and move them back one by one.
-        const auto* pixels = reinterpret_cast<const float(*)[kPixel]>(span);
-        const auto tap = [&](int32_t k) { return pixels[plan.index[x + k] - first]; };
-        const auto weights = [&](int32_t k, int32_t i) {
-            return vld1q_f32(plan.weights[x + k] + i);
-        };
-        const float* const taps[kGroup] = {tap(0), tap(1), tap(2), tap(3)};
-        const float32x4_t low[kGroup] = {weights(0, 0), weights(1, 0), weights(2, 0),
-                                         weights(3, 0)};
-        const float32x4_t high[kGroup] = {weights(0, 4), weights(1, 4), weights(2, 4),
-                                          weights(3, 4)};
-        float32x4_t even[kGroup];
-        float32x4_t odd[kGroup];
-        weigh_tap<0>(even, taps, low);
-        weigh_tap<1>(odd, taps, low);
-        add_tap<2>(even, taps, low);
-        add_tap<3>(odd, taps, low);
-        add_tap<4>(even, taps, high);
-        add_tap<5>(odd, taps, high);
-        add_tap<6>(even, taps, high);
-        for (int32_t k = 0; k < kGroup; ++k) {
-            vst1q_f32(sums + k * kPixel, vaddq_f32(even[k], odd[k]));
-        }
-    }
-
-    static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
-                           const uint16_t* bytes, int32_t count) {
-        // One after the other takes less time than eight side by side.
-        constexpr int32_t kFew = 2;
-        if (count > kFew) return run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
-        for (int32_t i = 0; i < count; ++i) run_chain(columns, row, bytes[i]);
-    }
-};
-
 // Whether the weights of every column are the same from either end: those of whole ratios are,
 // whose taps lie around a source pixel.
 bool is_mirrored(const LanczosStripPlan& plan) {
@@ -307,49 +253,99 @@ float32x4_t high_wholes(uint16x8_t numbers) {
     return vreinterpretq_f32_u16(vzip2q_u16(numbers, vdupq_n_u16(kTopOfWholes << 8)));
 }
 
-void sum_mirrored_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src) {
-    const auto* pixels = reinterpret_cast<const uint8_t(*)[kPixel]>(src);
-    const float32x4_t base = vdupq_n_f32(kWholes);
-    const int32_t padded = padded_count(plan);
-    for (int32_t x = 0; x < padded; x += kGroup) {
-        const auto add_taps = [&](int32_t k) {
-            return add_mirrored_taps(pixels[plan.index[x + k]]);
-        };
-        const auto floats = [&](int32_t k, int32_t i) {
-            return vld1q_f32(plan.weights[x + k] + i);
-        };
-        const TapPairs pairs[kGroup] = {add_taps(0), add_taps(1), add_taps(2), add_taps(3)};
-        const float32x4_t weights[kGroup] = {floats(0, 0), floats(1, 0), floats(2, 0),
-                                             floats(3, 0)};
-        float32x4_t values[kGroup] = {floats(0, kBase), floats(1, kBase), floats(2, kBase),
-                                      floats(3, kBase)};
-        for (int32_t k = 0; k < kGroup; ++k) {
-            values[k] = vfmaq_laneq_f32(values[k], low_wholes(pairs[k].outer), weights[k], 0);
-        }
-        for (int32_t k = 0; k < kGroup; ++k) {
-            const float32x4_t pair = vsubq_f32(high_wholes(pairs[k].outer), base);
-            values[k] = vfmaq_laneq_f32(values[k], pair, weights[k], 1);
-        }
-        for (int32_t k = 0; k < kGroup; ++k) {
-            const float32x4_t pair = vsubq_f32(low_wholes(pairs[k].inner), base);
-            values[k] = vfmaq_laneq_f32(values[k], pair, weights[k], 2);
-        }
-        for (int32_t k = 0; k < kGroup; ++k) {
-            const float32x4_t middle = vsubq_f32(high_wholes(pairs[k].inner), base);
-            vst1q_f32(sums + (x + k) * kPixel, vfmaq_laneq_f32(values[k], middle, weights[k], 3));
+struct Neon {
+    using WeightedRows = NeonRows;
+    static constexpr bool kMirrors = true;
+
+    static constexpr int32_t kConverted = kVectorBytes;
+    static void convert(float* floats, const uint8_t* bytes) {
+        const uint8x16x2_t table = {{vld1q_u8(bytes), vdupq_n_u8(kTopOfWholes)}};
+        const float32x4_t base = vdupq_n_f32(kWholes);
+        for (int32_t k = 0; k < 4; ++k) {
+            const uint8x16_t whole = vqtbl2q_u8(table, vld1q_u8(kAsWholes[k]));
+            vst1q_f32(floats + 4 * k, vsubq_f32(vreinterpretq_f32_u8(whole), base));
         }
     }
-}
+
+    static void sum_group(float* sums, const float* span, const LanczosStripPlan& plan, int32_t x,
+                          int32_t first) {
+        // As pixels, which loads can count in: compilers would multiply four indices in a vector
+        // and move them back one by one.
+        const auto* pixels = reinterpret_cast<const float(*)[kPixel]>(span);
+        const auto tap = [&](int32_t k) { return pixels[plan.index[x + k] - first]; };
+        const auto weights = [&](int32_t k, int32_t i) {
+            return vld1q_f32(plan.weights[x + k] + i);
+        };
+        const float* const taps[kGroup] = {tap(0), tap(1), tap(2), tap(3)};
+        const float32x4_t low[kGroup] = {weights(0, 0), weights(1, 0), weights(2, 0),
+                                         weights(3, 0)};
+        const float32x4_t high[kGroup] = {weights(0, 4), weights(1, 4), weights(2, 4),
+                                          weights(3, 4)};
+        float32x4_t even[kGroup];
+        float32x4_t odd[kGroup];
+        weigh_tap<0>(even, taps, low);
+        weigh_tap<1>(odd, taps, low);
+        add_tap<2>(even, taps, low);
+        add_tap<3>(odd, taps, low);
+        add_tap<4>(even, taps, high);
+        add_tap<5>(odd, taps, high);
+        add_tap<6>(even, taps, high);
+        for (int32_t k = 0; k < kGroup; ++k) {
+            vst1q_f32(sums + k * kPixel, vaddq_f32(even[k], odd[k]));
+        }
+    }
+
+    static void sum_mirrored_row(float* sums, const LanczosStripPlan& plan, const uint8_t* src) {
+        const auto* pixels = reinterpret_cast<const uint8_t(*)[kPixel]>(src);
+        const float32x4_t base = vdupq_n_f32(kWholes);
+        const int32_t padded = padded_count(plan);
+        for (int32_t x = 0; x < padded; x += kGroup) {
+            const auto add_taps = [&](int32_t k) {
+                return add_mirrored_taps(pixels[plan.index[x + k]]);
+            };
+            const auto floats = [&](int32_t k, int32_t i) {
+                return vld1q_f32(plan.weights[x + k] + i);
+            };
+            const TapPairs pairs[kGroup] = {add_taps(0), add_taps(1), add_taps(2), add_taps(3)};
+            const float32x4_t weights[kGroup] = {floats(0, 0), floats(1, 0), floats(2, 0),
+                                                 floats(3, 0)};
+            float32x4_t values[kGroup] = {floats(0, kBase), floats(1, kBase), floats(2, kBase),
+                                          floats(3, kBase)};
+            for (int32_t k = 0; k < kGroup; ++k) {
+                values[k] = vfmaq_laneq_f32(values[k], low_wholes(pairs[k].outer), weights[k], 0);
+            }
+            for (int32_t k = 0; k < kGroup; ++k) {
+                const float32x4_t pair = vsubq_f32(high_wholes(pairs[k].outer), base);
+                values[k] = vfmaq_laneq_f32(values[k], pair, weights[k], 1);
+            }
+            for (int32_t k = 0; k < kGroup; ++k) {
+                const float32x4_t pair = vsubq_f32(low_wholes(pairs[k].inner), base);
+                values[k] = vfmaq_laneq_f32(values[k], pair, weights[k], 2);
+            }
+            for (int32_t k = 0; k < kGroup; ++k) {
+                const float32x4_t middle = vsubq_f32(high_wholes(pairs[k].inner), base);
+                vst1q_f32(sums + (x + k) * kPixel,
+                          vfmaq_laneq_f32(values[k], middle, weights[k], 3));
+            }
+        }
+    }
+
+    static void run_chains(const LanczosColumns& columns, const LanczosRow& row,
+                           const uint16_t* bytes, int32_t count) {
+        // One after the other takes less time than eight side by side.
+        constexpr int32_t kFew = 2;
+        if (count > kFew) return run_chains_of_four<ChainsOfFour>(columns, row, bytes, count);
+        for (int32_t i = 0; i < count; ++i) run_chain(columns, row, bytes[i]);
+    }
+};
 
 }  // namespace
 
 FilterLanczos* plan_lanczos_neon(LanczosStripPlan& plan, const LanczosColumns& columns) {
     FilterLanczos* filter = plan_filter<Neon>(plan, columns);
-    plan.sum_row = sum_pixel_row<Neon>;
-    if (filter == filter_row<Neon> && columns.src_components == kPixel && is_mirrored(plan)) {
-        plan.sum_row = sum_mirrored_row;
-        plan_bases(plan);
-    }
+    plan.mirrored =
+        filter == filter_row<Neon> && columns.src_components == kPixel && is_mirrored(plan);
+    if (plan.mirrored) plan_bases(plan);
     return filter;
 }
 

@@ -82,6 +82,7 @@ private:
 
 struct Wasm {
     using WeightedRows = WasmRows;
+    static constexpr bool kMirrors = false;
 
     static constexpr int32_t kConverted = 16;
     static void convert(float* floats, const uint8_t* bytes) {

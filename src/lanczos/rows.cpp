@@ -59,9 +59,10 @@ void LanczosCache::copy_row(const LanczosPicture& picture, int32_t slot, int32_t
     const int64_t row_end = kLanczosMargin + int64_t{picture.src_w};
     const int64_t first = first_ < kLanczosMargin ? kLanczosMargin : first_;
     const int64_t end = end_ < row_end ? end_ : row_end;
-    // The middle one of a column's taps lies in the row, so that there is something to copy.
-    memcpy(dst + first * pixel, src + (first - kLanczosMargin) * pixel,
-           static_cast<size_t>((end - first) * pixel));
+    if (first < end) {
+        memcpy(dst + first * pixel, src + (first - kLanczosMargin) * pixel,
+               static_cast<size_t>((end - first) * pixel));
+    }
     const auto repeat = [&](int64_t column, int64_t source_column) {
         memcpy(dst + column * pixel, src + source_column * pixel, static_cast<size_t>(pixel));
     };
