@@ -6,7 +6,7 @@ import { after, before, test } from 'node:test';
 import { PATIENCE_MS, serve, startBrowser } from './browser.mjs';
 
 const PAGES = ['index', 'group__c3', 'md_docs_functions', 'md_docs_coming_from', 'md_docs_performance',
-    'md_docs_resamplers', 'namespaceovrin_1_1v1'];
+    'md_docs_kernels', 'md_docs_neon', 'md_docs_resamplers', 'namespaceovrin_1_1v1'];
 let browser;
 let server;
 
