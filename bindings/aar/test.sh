@@ -159,7 +159,7 @@ check_json() {
 check_library() {
     local dynamic needed
     dynamic=$(readelf -dW "$1")
-    readelf -hW "$1" | grep -q 'Machine: *AArch64' || fail "$1 is not for AArch64"
+    grep -q 'Machine: *AArch64' <<<"$(readelf -hW "$1")" || fail "$1 is not for AArch64"
     grep -q "SONAME.*\[$(basename "$1")\]" <<<"$dynamic" || fail "$1 has another SONAME"
     needed=$(sed -n 's/.*(NEEDED).*\[\(.*\)\].*/\1/p' <<<"$dynamic" | sort | xargs)
     [[ $needed == "$2" ]] || fail "$1 needs $needed"
@@ -193,7 +193,7 @@ check_manifest() {
 check_classes() {
     diff <(unzip -Z1 classes.jar) <(cd "$classes" && find . -type f | sed 's,^\./,,' | LC_ALL=C sort) ||
         fail "classes.jar does not hold the classes"
-    javap -classpath classes.jar ovrin.resize.Resizer | grep -q 'static final void rgba(' ||
+    grep -q 'static final void rgba(' <<<"$(javap -classpath classes.jar ovrin.resize.Resizer)" ||
         fail "classes.jar cannot be read"
     ! unzip -Z1 classes.jar | grep -v '^ovrin/resize/\|^META-INF/' || fail "classes.jar holds others' classes"
     local native

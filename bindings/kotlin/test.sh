@@ -82,7 +82,7 @@ make_faults() {
 run_sanitized() {
     local runtime
     runtime=$(g++ -print-file-name=libasan.so):$(g++ -print-file-name=libubsan.so)
-    nm -D "$sanitized/libovrinresize_jni.so" | grep -q __asan_report || fail "no sanitizer in $sanitized"
+    grep -q __asan_report <<<"$(nm -D "$sanitized/libovrinresize_jni.so")" || fail "no sanitizer in $sanitized"
     LD_PRELOAD=$runtime ASAN_OPTIONS=handle_segv=0:detect_leaks=0:halt_on_error=1 \
         UBSAN_OPTIONS=halt_on_error=1:print_stacktrace=1 run_tests sanitized "$sanitized" "$sanitized_calls" "$@"
 }

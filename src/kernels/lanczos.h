@@ -24,9 +24,9 @@ struct LanczosColumns {
 struct LanczosStripPlan {
     const LanczosColumns* columns;
     double max_weights;  // of any column, the sum of its absolute weights
+    bool mirrored;       // every column's weights are the same from either end
     int32_t index[kLanczosColumns];
     alignas(64) float weights[kLanczosColumns][kLanczosTaps + 1];
-    bool mirrored;  // every column's weights are the same from either end
 };
 
 // Source rows filtered across, which kernels keep from one destination row of a strip to the next.

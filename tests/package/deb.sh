@@ -55,7 +55,7 @@ flags=$(PKG_CONFIG_SYSROOT_DIR=$root PKG_CONFIG_LIBDIR=$LD_LIBRARY_PATH/pkgconfi
     pkg-config --cflags --libs ovrinresize)
 # shellcheck disable=SC2086 # a list of flags
 gcc -Wall -Wextra -Werror "$here/consumer/consumer.c" -o "$packages/consumer" $flags
-ldd "$packages/consumer" | grep -q "$root" || fail "the program takes another library"
+grep -q "$root" <<<"$(ldd "$packages/consumer")" || fail "the program takes another library"
 "$packages/consumer"
 "$root/usr/bin/ovrinresize" --version
 PYTHONDONTWRITEBYTECODE=1 PYTHONPATH=$root/usr/lib/python3/dist-packages /usr/bin/python3 -c "

@@ -76,7 +76,7 @@ by_loader() {
     run "$tree/load" "$1/$libdir/libovrinresize.so" $names
 }
 
-needs_library() { "$READELF" -dW "$1" | grep -q 'NEEDED.*libovrinresize'; }
+needs_library() { grep -q 'NEEDED.*libovrinresize' <<<"$("$READELF" -dW "$1")"; }
 needs_none() { ! "$READELF" -dW "$1" | grep -E 'NEEDED.*(libovrinresize|libstdc)'; }
 
 # Cross builds have no tool.
