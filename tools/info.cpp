@@ -29,6 +29,7 @@ struct Info {
 const char* name_of(Container container) {
     // In the order of the enumeration.
     constexpr const char* kNames[] = {"PNG", "JPEG", "PNM", "PPM", "PGM", "PAM", "Y4M", "raw"};
+    static_assert(sizeof kNames / sizeof *kNames == static_cast<size_t>(Container::kRaw) + 1);
     return kNames[static_cast<size_t>(container)];
 }
 

@@ -153,6 +153,7 @@ void plan_vectors(QuarterPlan& plan, const QuarterRowShape& shape, QuarterColumn
             plan.samples += period_samples;
             room -= (period - 1) * kEntryBytes;
             vectors += period;
+            // From the first one on: where a period once did not fit, no later one does.
             plan.repeating = vectors;
             continue;
         }
