@@ -109,6 +109,7 @@ mapfile -t tests < <(test_classes | grep -v '\.Memory')
 run_tests tests "$build" "$calls" "${tests[@]}"
 run_sanitized "${tests[@]}"
 mapfile -t memory_tests < <(test_classes | grep '\.Memory')
-LD_PRELOAD=$build/libfaults.so run_tests memory "$build" "$calls" "${memory_tests[@]}"
+# Found by its folder, since the name in LD_PRELOAD would end at a space.
+LD_LIBRARY_PATH=$build LD_PRELOAD=libfaults.so run_tests memory "$build" "$calls" "${memory_tests[@]}"
 run example "$build" "$calls" ExampleKt
 diff "$build/example.expected" "$build/example.out" || fail "the example prints something else"

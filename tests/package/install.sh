@@ -32,13 +32,12 @@ through_cmake() {
 through_pkg_config() {
     local prefix=$1 program=$tree/pkg-config-consumer flags
     export PKG_CONFIG_LIBDIR=$prefix/$libdir/pkgconfig
-    flags=$(pkg-config --cflags --libs ovrinresize)
-    # shellcheck disable=SC2086 # a list of flags
-    "${compile[@]}" "$here/consumer/consumer.c" -o "$program" $flags -Wl,-rpath,"$prefix/$libdir"
+    # It puts a backslash before a space, as a shell would read it.
+    eval "flags=($(pkg-config --cflags --libs ovrinresize))"
+    "${compile[@]}" "$here/consumer/consumer.c" -o "$program" "${flags[@]}" -Wl,-rpath,"$prefix/$libdir"
     run "$program"
-    flags=$(pkg-config --static --cflags --libs ovrinresize)
-    # shellcheck disable=SC2086 # a list of flags
-    "${compile[@]}" -static "$here/consumer/consumer.c" -o "$program" $flags
+    eval "flags=($(pkg-config --static --cflags --libs ovrinresize))"
+    "${compile[@]}" -static "$here/consumer/consumer.c" -o "$program" "${flags[@]}"
     run "$program"
     needs_none "$program"
 }

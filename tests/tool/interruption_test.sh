@@ -4,7 +4,7 @@
 # what it was before.
 # Usage: interruption_test.sh PATH_OF_OVRINRESIZE PATH_OF_no_nameless_files.so
 source "$(dirname "${BASH_SOURCE[0]}")/support.sh"
-no_nameless_files=$2
+no_nameless_files=$(preloadable "$2")
 # A child that a signal ends before it has become the tool would act on the trap too.
 trap - EXIT
 

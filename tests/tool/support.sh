@@ -38,6 +38,12 @@ fails() {
     rm -f "$folder.stdout" "$folder.stderr"
 }
 
+# preloadable FILE: a name of it for LD_PRELOAD, which takes a space for the end of a name.
+preloadable() {
+    ln -s "$1" "$folder"
+    echo "$folder/${1##*/}"
+}
+
 hex() {
     od -An -v -tx1 "$1" | tr -d ' \n'
 }

@@ -4,6 +4,7 @@
 # Usage: threads_test.sh PATH_OF_OVRINRESIZE IGNORED IGNORED PATH_OF_NO_THREADS
 no_threads=$(realpath "$4")
 source "$(dirname "${BASH_SOURCE[0]}")/support.sh"
+no_threads=$(preloadable "$no_threads")
 
 # alone ARGUMENT...: the tool, which ends when it starts a thread.
 alone() {
