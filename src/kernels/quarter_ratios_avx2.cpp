@@ -252,7 +252,9 @@ struct RgbTwoToThree {
     template <bool kPair>
     static OVRIN_ALWAYS_INLINE __m256i sums(const uint8_t* top, const uint8_t* bottom,
                                             ptrdiff_t offset) {
-        if (kPair && top == bottom) return load_cleared(top + offset);
+        if constexpr (kPair) {
+            if (top == bottom) return load_cleared(top + offset);
+        }
         return twice<kPair>(top, bottom, offset);
     }
 
@@ -360,25 +362,31 @@ struct Gathered {
     static OVRIN_ALWAYS_INLINE void store_vectors(uint8_t* dst, const uint8_t* top,
                                                   const uint8_t* bottom,
                                                   std::integer_sequence<int32_t, kVector...>) {
-        (store_one<kPair, kVector>(dst + kVector * 2 * kLaneBytes, top, bottom), ...);
+        (store_one<kPair, kVector>(dst + kVector * 2 * kLaneBytes, top, bottom,
+                                   std::make_integer_sequence<int32_t, kWindows>()),
+         ...);
     }
 
-    template <bool kPair, int32_t kVector>
+    template <bool kPair, int32_t kVector, int32_t... kWindow>
     static OVRIN_ALWAYS_INLINE void store_one(uint8_t* dst, const uint8_t* top,
-                                              const uint8_t* bottom) {
+                                              const uint8_t* bottom,
+                                              std::integer_sequence<int32_t, kWindow...>) {
         constexpr auto& kBases = Shape::kBases[kVector];
-        __m256i windows[kWindows];
-        for (int32_t w = 0; w < kWindows; ++w) {
-            const bool is_one = kBases[1][w] == kBases[0][w] + 16;
-            windows[w] = is_one ? twice<kPair>(top, bottom, kBases[0][w])
-                                : twice<kPair>(top, bottom, kBases[0][w], kBases[1][w]);
-        }
+        const __m256i windows[] = {
+            load_window<kPair, kBases[0][kWindow], kBases[1][kWindow]>(top, bottom)...};
         const __m256i samples =
             _mm256_avg_epu8(gather<kVector, false>(windows), gather<kVector, true>(windows));
-        if (kLaneBytes == 16) return store_vector(dst, samples);
+        if constexpr (kLaneBytes == 16) return store_vector(dst, samples);
         _mm_storeu_si128(reinterpret_cast<__m128i*>(dst), _mm256_castsi256_si128(samples));
         _mm_storeu_si128(reinterpret_cast<__m128i*>(dst + kLaneBytes),
                          _mm256_extracti128_si256(samples, 1));
+    }
+
+    // Two lanes that lie one behind the other are one load.
+    template <bool kPair, int32_t kBase, int32_t kSecondBase>
+    static OVRIN_ALWAYS_INLINE __m256i load_window(const uint8_t* top, const uint8_t* bottom) {
+        if constexpr (kSecondBase == kBase + 16) return twice<kPair>(top, bottom, kBase);
+        return twice<kPair>(top, bottom, kBase, kSecondBase);
     }
 
     template <int32_t kVector, bool kRight>
@@ -386,9 +394,12 @@ struct Gathered {
         static constexpr Gathering<kWindows> kGathering =
             gathering_of<Shape>(Shape::kBases[kVector], kVector, kRight);
         static_assert(kGathering.fits);
-        __m256i taps = windows[kGathering.only < 0 ? 0 : kGathering.only];
-        for (int32_t w = 1; kGathering.only < 0 && w < kWindows; ++w) {
-            taps = _mm256_blendv_epi8(taps, windows[w], load_mask(kGathering.from[w]));
+        constexpr bool kBlends = kGathering.only < 0;
+        __m256i taps = windows[kBlends ? 0 : kGathering.only];
+        if constexpr (kBlends) {
+            for (int32_t w = 1; w < kWindows; ++w) {
+                taps = _mm256_blendv_epi8(taps, windows[w], load_mask(kGathering.from[w]));
+            }
         }
         return _mm256_shuffle_epi8(taps, load_mask(kGathering.order));
     }
