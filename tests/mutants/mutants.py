@@ -11,8 +11,9 @@ in a copy below FOLDER, which may be kept: it remembers what has been built and 
   mutants.py again FOLDER LOG...   those that these runs left alive
   mutants.py sum LOG...            all outcomes of these runs, the last where a mutant has several
 
-With --aarch64 the NEON kernels are changed, and tested under qemu-user. With --sanitize all is built with
-these sanitizers, which kill what is undefined and does no harm otherwise.
+With --aarch64 the NEON kernels are changed, and tested under qemu-user; with --wasm what the WebAssembly
+modules compile and x86-64 does not, and tested in Node. With --sanitize all is built with these sanitizers,
+which kill what is undefined and does no harm otherwise.
 """
 
 import argparse
@@ -32,16 +33,53 @@ import time
 
 PROJECT = pathlib.Path(__file__).resolve().parents[2]
 COPIED = ["CMakeLists.txt", "CMakePresets.json", "LICENSE", "README.md", "bindings", "cmake", "docs",
-          "examples", "include", "src", "tests"]
+          "examples", "include", "src", "tests", "tools"]
 # What a program says for instructions that the processor does not have.
 SKIPPED = 77
-# What x86-64 does not compile, and what is changed for aarch64.
-FOREIGN = re.compile(r"_neon\.|_wasm\.|pool_without_threads|exact_fma")
-NEON = re.compile(r"_neon\.")
-# The programs that reach kernels; an emulator is slow.
-NEON_TESTS = ["kernel_plans", "quarter_kernels", "bilinear_kernels", "lanczos_kernels", "copy_kernels",
-              "engine_kernels", "golden_sets", "rgba8888", "rgb888", "keep_ratio_rgba", "yuv420",
-              "bilinear", "bilinear_ex", "lanczos"]
+
+
+@dataclasses.dataclass(frozen=True)
+class Target:
+    """What is changed for one kind of processor, how it is built, and what tests it."""
+    files: str  # those of src/ that are changed, as a regular expression
+    needs: tuple  # programs
+    builds: dict  # by folder: arguments for CMake, and what is built there before anything is changed
+    changed: tuple  # the folders where a mutant gives other code...
+    code: str  # ... and in which files
+    scripts: dict = dataclasses.field(default_factory=dict)  # in Node: names of tests, and which they are
+    divisors: tuple = (20, 1)  # of the rounds of random tests, one after the other
+    most_memory: int = 20 << 30
+
+
+OBJECTS = "CMakeFiles/ovrinresize_objects.dir/**/*.o"
+TARGETS = {
+    "native": Target(
+        files=r"^(?!.*(_neon\.|_wasm\.|pool_without_threads|exact_fma))",
+        needs=("ccache",),
+        builds={"native": ([], ["all"])},
+        changed=("native",), code=OBJECTS),
+    # The programs that reach kernels; an emulator is slow.
+    "aarch64": Target(
+        files=r"_neon\.",
+        needs=("ccache", "aarch64-linux-gnu-g++", "qemu-aarch64"),
+        builds={"aarch64": (["-DCMAKE_TOOLCHAIN_FILE=cmake/aarch64-linux-gnu.cmake"],
+                            ["kernel_plans", "quarter_kernels", "bilinear_kernels", "lanczos_kernels",
+                             "copy_kernels", "engine_kernels", "golden_sets", "rgba8888", "rgb888",
+                             "keep_ratio_rgba", "yuv420", "bilinear", "bilinear_ex", "lanczos"])},
+        changed=("aarch64",), code=OBJECTS),
+    # Objects have still to be optimized when modules are linked, so those are compared. The package's
+    # tests ask the tool for what the native library does; Node reserves more memory than it uses.
+    "wasm": Target(
+        files=r"_wasm\.|pool_without_threads|exact_fma|/(bilinear|quarter)_neon\.",
+        needs=("ccache", "clang++-19", "wasm-ld-19", "node"),
+        builds={"wasm": (["-DCMAKE_TOOLCHAIN_FILE=cmake/wasm32.cmake"], ["ovrinresize", "golden"]),
+                "wasm-scalar": (["-DCMAKE_TOOLCHAIN_FILE=cmake/wasm32.cmake", "-DOVRINRESIZE_SIMD128=OFF"],
+                                ["ovrinresize"]),
+                "release": (["-DOVRINRESIZE_BUILD_TOOLS=ON"], ["exact_fma", "ovrinresize_tool"])},
+        changed=("wasm", "wasm-scalar"), code="ovrinresize",
+        scripts={"golden": "golden bytes", "pictures": "native library"},
+        divisors=(1,), most_memory=resource.RLIM_INFINITY),
+}
 
 # ---- Mutations -------------------------------------------------------------------------------
 
@@ -176,26 +214,30 @@ def summary(outcomes):
 
 class Build:
     def __init__(self, folder, options):
+        self.target = TARGETS[options.target]
         self.tree = folder / "tree"
-        self.build = folder / "build"
+        self.builds = self.tree / "build"
         self.log = open(folder / "build.log", "w", encoding="utf-8")
+        temporary = folder / "temporary"
+        temporary.mkdir(exist_ok=True)
         self.environment = {**os.environ, "CCACHE_DIR": str(folder / "ccache"),
                             "CCACHE_NOHASHDIR": "1", "GTEST_FAIL_FAST": "1",
-                            "QEMU_CPU": "cortex-a53"}
+                            "QEMU_CPU": "cortex-a53", "OVRIN_ROOT": str(self.tree),
+                            "TMPDIR": str(temporary)}
         for name in COPIED:
             copy(PROJECT / name, self.tree / name)
-        self.run(["cmake", "-G", "Ninja", "-S", self.tree, "-B", self.build,
-                  f"-DCMAKE_BUILD_TYPE={'RelWithDebInfo' if options.sanitize else 'Release'}",
-                  f"-DCMAKE_CXX_FLAGS={sanitizer_flags(options.sanitize)}",
-                  "-DOVRINRESIZE_BUILD_TESTS=ON",
-                  "-DCMAKE_CXX_COMPILER_LAUNCHER=ccache", "-DCMAKE_LINK_DEPENDS_NO_SHARED=ON",
-                  *([f"-DCMAKE_TOOLCHAIN_FILE={self.tree}/cmake/aarch64-linux-gnu.cmake"]
-                    if options.aarch64 else [])], check=True)
-        self.ninja(NEON_TESTS if options.aarch64 else [], check=True)
+        for name, (arguments, targets) in self.target.builds.items():
+            self.run(["cmake", "-G", "Ninja", "-S", self.tree, "-B", self.builds / name,
+                      f"-DCMAKE_BUILD_TYPE={'RelWithDebInfo' if options.sanitize else 'Release'}",
+                      f"-DCMAKE_CXX_FLAGS={sanitizer_flags(options.sanitize)}",
+                      "-DOVRINRESIZE_BUILD_TESTS=ON", "-DCMAKE_CXX_COMPILER_LAUNCHER=ccache",
+                      "-DCMAKE_LINK_DEPENDS_NO_SHARED=ON", *arguments], check=True)
+            self.ninja(name, targets, check=True)
         self.original_code = self.code()
-        self.tests = self.find_tests()
+        self.tests = {**self.find_tests(), **self.find_scripts()}
         # The address sanitizer maps far more than this.
-        self.most_memory = resource.RLIM_INFINITY if options.sanitize else 20 << 30
+        self.most_memory = resource.RLIM_INFINITY if options.sanitize else self.target.most_memory
+        self.divisors = self.target.divisors[:1] if options.quick else self.target.divisors
         self.seconds = {}
         self.kills_file = folder / "kills.json"
         self.kills = json.loads(self.kills_file.read_text()) if self.kills_file.exists() else {}
@@ -204,30 +246,47 @@ class Build:
         return subprocess.run([str(part) for part in command], env=self.environment, check=check,
                               stdin=subprocess.DEVNULL, stdout=self.log, stderr=self.log).returncode == 0
 
-    def ninja(self, targets, check=False):
-        return self.run(["ninja", "-C", self.build, "-j", str(os.cpu_count() or 2), *targets], check)
+    def ninja(self, name, targets, check=False):
+        return self.run(["ninja", "-C", self.builds / name, "-j", str(os.cpu_count() or 2), *targets],
+                        check)
 
     def code(self):
-        """The object files of the library, by their contents."""
-        objects = self.build / "CMakeFiles" / "ovrinresize_objects.dir"
-        return {path: hashlib.sha256(path.read_bytes()).digest() for path in objects.rglob("*.o")}
+        """What the library is compiled to, by its contents."""
+        return {path: hashlib.sha256(path.read_bytes()).digest()
+                for name in self.target.changed for path in (self.builds / name).glob(self.target.code)}
 
     def find_tests(self):
-        """Program and command by name, each program whole."""
-        listing = subprocess.run(["ctest", "--test-dir", self.build, "--show-only=json-v1"],
-                                 check=True, capture_output=True, env=self.environment).stdout
+        """By name: the folder of the build, the program there and the command. Each program is one test."""
         tests = {}
-        for test in json.loads(listing)["tests"]:
-            command = [part for part in test.get("command", []) if not part.startswith("--gtest")]
-            own = [n for n, part in enumerate(command) if self.build in pathlib.Path(part).parents]
-            # An emulator may stand in front of the program; a script's arguments are not programs.
-            if not own or "qemu" not in command[0] and own[0] != 0:
-                continue
-            program = pathlib.Path(command[own[0]])
-            if program.exists():
-                words = [pathlib.Path(part).name for part in command[own[0]:]]
-                tests[" ".join(words)] = (program, command)
+        for name in self.target.builds:
+            build = self.builds / name
+            listing = subprocess.run(["ctest", "--test-dir", build, "--show-only=json-v1"],
+                                     check=True, capture_output=True, env=self.environment).stdout
+            for test in json.loads(listing)["tests"]:
+                command = [part for part in test.get("command", []) if not part.startswith("--gtest")]
+                own = [n for n, part in enumerate(command) if build in pathlib.Path(part).parents]
+                # An emulator may stand in front of the program; a script's arguments are not programs.
+                if not own or "qemu" not in command[0] and own[0] != 0:
+                    continue
+                program = pathlib.Path(command[own[0]])
+                if program.exists():
+                    words = [pathlib.Path(part).name for part in command[own[0]:]]
+                    tests[" ".join(words)] = (name, program.relative_to(build), command)
         return tests
+
+    def find_scripts(self):
+        """Those of the package, which is made of links to the modules. Nothing is to be built for them."""
+        if not self.target.scripts:
+            return {}
+        package = self.builds / "js"
+        for name in ("index.js", "resizer.js", "package.json"):
+            copy(PROJECT / "bindings/js" / name, package / name)
+        for name, file in (("wasm", "ovrinresize.wasm"), ("wasm-scalar", "ovrinresize-scalar.wasm")):
+            if not (package / file).is_symlink():
+                (package / file).symlink_to(self.builds / name / "ovrinresize")
+        script = self.tree / "tests/web/package_test.mjs"
+        return {name: ("js", None, ["node", f"--test-name-pattern={pattern}", str(script)])
+                for name, pattern in self.target.scripts.items()}
 
     def passes(self, name, divisor):
         """Limits count what the program and we ourselves were given of the processor, not the clock:
@@ -239,14 +298,15 @@ class Build:
 
     def run_test(self, name, divisor):
         environment = {**self.environment, "OVRIN_TEST_DIVISOR": str(divisor)}
-        usual = self.seconds.get((name, divisor), 20 * self.seconds.get((name, 20), 30))
+        usual = self.seconds.get((name, divisor),
+                                 20 * self.seconds.get((name, self.divisors[0]), 30))
         begin = time.monotonic()
         spent = processor_seconds()
-        test = subprocess.Popen(self.tests[name][1], env=environment, cwd=self.build,
+        folder, _, command = self.tests[name]
+        test = subprocess.Popen(command, env=environment, cwd=self.builds / folder,
                                 stdin=subprocess.DEVNULL, stdout=self.log, stderr=self.log,
                                 start_new_session=True,
-                                preexec_fn=lambda: set_limits(int(10 + 10 * usual),
-                                                                      self.most_memory))
+                                preexec_fn=lambda: set_limits(int(10 + 10 * usual), self.most_memory))
         outcome = None
         patience = 60 + 10 * usual
         while outcome is None:
@@ -265,7 +325,7 @@ class Build:
         """Those that have killed mutants of this file or folder come first, then quick ones."""
         def rank(name):
             return (*(-self.kills.get(place, {}).get(name, 0) for place in (path, os.path.dirname(path))),
-                    self.seconds.get((name, 20), 0))
+                    self.seconds.get((name, self.divisors[0]), 0))
         return sorted(self.tests, key=rank)
 
     def remember(self, name, path):
@@ -274,28 +334,26 @@ class Build:
             counts[name] = counts.get(name, 0) + 1
         self.kills_file.write_text(json.dumps(self.kills, indent=1), encoding="utf-8")
 
-    def killer(self, mutant, divisors):
+    def killer(self, mutant):
         """The test that kills it, or None; "no code" and "same code" are no mutants."""
-        if not self.ninja(["ovrinresize_objects"]):
+        # Programs load the shared library when they start; they need not be linked again for it.
+        if not all(self.ninja(name, ["ovrinresize"]) for name in self.target.changed):
             return "no code"
         if self.code() == self.original_code:
             return "same code"
-        # Programs load the shared library when they start; they need not be linked again for it.
-        if not self.ninja(["ovrinresize"]):
-            return "no code"
-        for divisor in divisors:
+        for divisor in self.divisors:
             for name in self.order(mutant.path):
-                target = self.tests[name][0].relative_to(self.build)
-                if not self.ninja([target]) or not self.passes(name, divisor):
+                folder, program, _ = self.tests[name]
+                if program and not self.ninja(folder, [program]) or not self.passes(name, divisor):
                     self.remember(name, mutant.path)
                     return name
         return None
 
-    def judge(self, mutant, source, divisors):
+    def judge(self, mutant, source):
         file = self.tree / mutant.path
         file.write_text(mutant.apply(source), encoding="utf-8")
         try:
-            return self.killer(mutant, divisors)
+            return self.killer(mutant)
         finally:
             file.write_text(source, encoding="utf-8")
 
@@ -329,10 +387,10 @@ def copy(source, target):
         os.utime(target)
 
 
-def read_sources(aarch64):
-    files = [path for suffix in ("*.cpp", "*.h") for path in (PROJECT / "src").rglob(suffix)]
-    return {str(path.relative_to(PROJECT)): path.read_text(encoding="utf-8") for path in files
-            if (NEON.search(path.name) if aarch64 else not FOREIGN.search(path.name))}
+def read_sources(files):
+    paths = [path for suffix in ("*.cpp", "*.h") for path in (PROJECT / "src").rglob(suffix)]
+    sources = {str(path.relative_to(PROJECT)): path.read_text(encoding="utf-8") for path in paths}
+    return {path: source for path, source in sources.items() if re.search(files, path)}
 
 
 def read_options():
@@ -342,7 +400,11 @@ def read_options():
     for kind in ("random", "listed", "again"):
         options = kinds.add_parser(kind)
         options.add_argument("folder", type=pathlib.Path)
-        options.add_argument("--aarch64", action="store_true", help="the NEON kernels, under qemu-user")
+        target = options.add_mutually_exclusive_group()
+        for flag, words in (("aarch64", "the NEON kernels, under qemu-user"),
+                            ("wasm", "what only the WebAssembly modules compile, in Node")):
+            target.add_argument(f"--{flag}", dest="target", action="store_const", const=flag,
+                                default="native", help=words)
         options.add_argument("--sanitize", default="", metavar="NAMES",
                              help="such as address,undefined or thread")
         options.add_argument("--quick", action="store_true",
@@ -355,7 +417,10 @@ def read_options():
         else:
             options.add_argument("files", nargs="+" if kind == "again" else 1)
     kinds.add_parser("sum").add_argument("files", nargs="+")
-    return parser.parse_args()
+    options = parser.parse_args()
+    if options.kind != "sum" and options.target == "wasm" and options.sanitize:
+        parser.error("the sanitizers are not for WebAssembly")
+    return options
 
 
 def chosen_mutants(options, sources):
@@ -374,20 +439,25 @@ def main():
         print(summary(list(outcomes_of(options.files).values())))
         return
 
+    target = TARGETS[options.target]
+    missing = [program for program in target.needs if not shutil.which(program)]
+    if missing:
+        print(f"skipped: there is no {' or '.join(missing)}")
+        sys.exit(SKIPPED)
     folder = options.folder.resolve()
     folder.mkdir(parents=True, exist_ok=True)
-    sources = read_sources(options.aarch64)
+    sources = read_sources(target.files)
     mutants = chosen_mutants(options, sources)
     print(f"{len(mutants)} mutants; building what they are made of", flush=True)
     build = Build(folder, options)
     for name in build.tests:
-        if not build.passes(name, 20):
+        if not build.passes(name, build.divisors[0]):
             sys.exit(f"{name} fails without any change")
 
     outcomes = []
     for mutant in mutants:
         spent = processor_seconds()
-        killer = build.judge(mutant, sources[mutant.path], [20] if options.quick else [20, 1])
+        killer = build.judge(mutant, sources[mutant.path])
         outcome = killer if killer in ("no code", "same code") else "killed" if killer else "alive"
         outcomes.append(outcome)
         by = f" by {killer}" if outcome == "killed" else ""
