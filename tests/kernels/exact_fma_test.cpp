@@ -12,6 +12,19 @@
 
 namespace {
 
+int calls_of_fma = 0;
+
+}  // namespace
+
+// The linker sends all calls of fma here.
+extern "C" double __real_fma(double a, double b, double c);
+extern "C" double __wrap_fma(double a, double b, double c) {
+    ++calls_of_fma;
+    return __real_fma(a, b, c);
+}
+
+namespace {
+
 using ovrin::bits_of;
 using ovrin::double_of;
 using ovrin_test::Random;
@@ -49,8 +62,9 @@ TEST(ExactFma, RoundsTiesAndWhatLiesNextToThem) {
         const double weight = ldexp(random.between(1, 1023), random.between(-80, -40));
         const double acc = number(random, 12);
         const double half = ldexp(1.0, ilogb(acc) - 53);
-        for (const double near : {half / byte, nextafter(half / byte, 0.0), weight,
-                                  nextafter(half / byte, 1.0), half + weight * 0x1p-30}) {
+        const double tie = half * (2 * random.between(0, 7) + 1);
+        for (const double near : {half / byte, tie / byte, nextafter(tie / byte, 0.0), weight,
+                                  nextafter(tie / byte, 1.0), tie + weight * 0x1p-30}) {
             expect_fused(near, byte, acc);
             expect_fused(-near, byte, acc);
             if (HasFatalFailure()) FAIL() << random.trace();
@@ -89,6 +103,27 @@ TEST(ExactFma, TakesAnyOperands) {
         expect_fused(number(random, 1022), random.between(0, 255), number(random, 1022));
         if (HasFatalFailure()) FAIL() << random.trace();
     }
+}
+
+// The C library's takes more than twice as long.
+TEST(ExactFma, AsksTheLibraryForUnusualOperandsOnly) {
+    const int before = calls_of_fma;
+    const double usual[] = {0.0, 0x1p-896, -0x1p-896, 1.0, nextafter(0x1p896, 0.0)};
+    double sum = 0.0;
+    for (const double weight : usual) {
+        for (const double acc : usual) sum += ovrin::exact_fma(weight, 3, acc);
+    }
+    Random random(5);
+    for (int i = rounds(100000); i > 0; --i) {
+        const auto byte = static_cast<uint8_t>(random.between(0, 255));
+        sum += ovrin::exact_fma(number(random, 400), byte, number(random, 400));
+    }
+    EXPECT_EQ(calls_of_fma, before) << sum;
+#if !defined(__FP_FAST_FMA)
+    const volatile double unusual = 0x1p896;  // not known while compiling
+    EXPECT_GT(ovrin::exact_fma(unusual, 3, 1.0), 0.0);
+    EXPECT_EQ(calls_of_fma, before + 1) << "calls are not counted";
+#endif
 }
 
 }  // namespace
