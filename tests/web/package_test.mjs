@@ -35,6 +35,44 @@ for (const name of MODULES) {
         assert.ok(lines.split('\n').length > 1000);
         assert.deepEqual(differences(lines, golden, text('tests/golden/without_threads.txt')), []);
     });
+
+    // What lies behind the end of the memory cannot be read or written.
+    test(`${name} keeps to its pictures`, async () => {
+        const { instance } = await WebAssembly.instantiate(moduleBytes(name), {});
+        const lib = instance.exports;
+        lib._initialize();
+        const [other, room] = [lib.malloc(1 << 20), lib.malloc(1 << 20)];
+        lib.free(room); // for the engines, so that the memory does not grow
+        lib.memory.grow(1);
+        const memory = new Uint8Array(lib.memory.buffer);
+        const pixels = (n) => (w, h) => n * w * h;
+        const lanczos = (n) => [pixels(n), (...call) => lib.ovrin_resize_lanczos(...call, n)];
+        const bilinear = (bytes, format) => [bytes, (...call) => lib.ov_bilinear_sg(...call, format, 0), true];
+        const engines = [
+            [pixels(4), lib.ovrin_resize_rgba8888], [pixels(3), lib.ovrin_resize_rgb888],
+            [bytesOf420, lib.ovrin_resize_yuv420], [bytesOf420, lib.ovrin_resize_nv21],
+            [pixels(4), lib.ovrin_resize_nearest_rgba8888], lanczos(1), lanczos(2), lanczos(3), lanczos(4),
+            bilinear(pixels(4), 7), bilinear(bytesOf420, 2), bilinear(bytesOf420, 18),
+        ];
+        for (const [i, [bytes, resize, readsBehind]] of engines.entries()) {
+            for (let w = 1; w <= 70; ++w) {
+                const sizes = [w, 1 + (7 * w) % 23, 1 + (11 * w) % 71, 1 + (5 * w) % 19];
+                const source = noise(bytes(sizes[0], sizes[1]), w);
+                const length = bytes(sizes[2], sizes[3]);
+                const padded = source.length + (readsBehind ? 8 * (w + 4) : 0);
+                const run = (src, dst) => {
+                    memory.fill(0, src, src + padded);
+                    memory.fill(0, dst, dst + length);
+                    memory.set(source, src);
+                    assert.doesNotThrow(() => resize(src, dst, ...sizes), `${i}: ${sizes}`);
+                    return memory.slice(dst, dst + length);
+                };
+                const wanted = run(other, memory.length - length);
+                assertSame(run(memory.length - padded, other), wanted, `${i}: ${sizes}`);
+            }
+        }
+        assert.equal(lib.memory.buffer.byteLength, memory.length);
+    });
 }
 
 for (const simd of [true, false]) {
