@@ -77,7 +77,7 @@ TARGETS = {
                                 ["ovrinresize"]),
                 "release": (["-DOVRINRESIZE_BUILD_TOOLS=ON"], ["exact_fma", "ovrinresize_tool"])},
         changed=("wasm", "wasm-scalar"), code="ovrinresize",
-        scripts={"golden": "golden bytes", "bounds": "keeps to its pictures", "pictures": "native library"},
+        scripts={"golden": "golden bytes", "both": "both modules", "pictures": "native library"},
         divisors=(1,), most_memory=resource.RLIM_INFINITY),
 }
 
