@@ -15,8 +15,7 @@ if [[ $(uname -m) != x86_64 ]]; then
 fi
 
 # describe SOURCE_DIR NAME: builds the library with debug information and describes its interface.
-# Neither the folder nor the compiler's optimisation shows in the description. (A compiler's option
-# that leaves the folder out would not survive a space in its name.)
+# Neither the folder nor the compiler's optimisation shows in the description.
 describe() {
     local folder=$build/$2
     cmake -S "$1" -B "$folder" -G Ninja -DCMAKE_CXX_COMPILER=g++ -DCMAKE_BUILD_TYPE=Debug >"$folder.log"
@@ -24,6 +23,7 @@ describe() {
     abidw --headers-dir "$1/include" --drop-private-types --exported-interfaces-only \
         --no-show-locs --no-comp-dir-path --no-corpus-path --no-architecture --no-elf-needed \
         --type-id-style hash --out-file "$build/$2.abi" "$folder/libovrinresize.so"
+    # -ffile-prefix-map among CMake's flags would leave the folder out, too, but ends at a space.
     sed -i "s|path='$(cd "$1" && pwd)/|path='|" "$build/$2.abi"
 }
 

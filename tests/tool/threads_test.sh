@@ -2,9 +2,8 @@
 # SPDX-License-Identifier: Apache-2.0
 # --threads keeps what it promises: no thread is started where it allows too few.
 # Usage: threads_test.sh PATH_OF_OVRINRESIZE IGNORED IGNORED PATH_OF_NO_THREADS
-no_threads=$(realpath "$4")
 source "$(dirname "${BASH_SOURCE[0]}")/support.sh"
-no_threads=$(preloadable "$no_threads")
+no_threads=$(preloadable "$4")
 
 # alone ARGUMENT...: the tool, which ends when it starts a thread.
 alone() {
